@@ -1,0 +1,25 @@
+# Native (Linux) build: the portable core against fakes, the Linux platform pieces, benchmarks.
+find_package(GTest REQUIRED)
+include(GoogleTest)
+
+add_library(vantorel_native STATIC
+    src/platform/std/files_std.cpp
+)
+target_link_libraries(vantorel_native PUBLIC vantorel_core)
+
+add_executable(vantorel_tests
+    tests/definitions_test.cpp
+    tests/read_definitions_test.cpp
+    tests/registry_routines_test.cpp
+    tests/contract/registry_contract.cpp
+    tests/contract/registry_contract_fake.cpp
+)
+target_link_libraries(vantorel_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)
+gtest_discover_tests(vantorel_tests DISCOVERY_TIMEOUT 60)
+
+# Benchmarks are not run by the tests; the sanitizer build leaves them out.
+if(NOT VANTOREL_SANITIZE)
+    find_package(benchmark REQUIRED)
+    add_executable(definitions_bench bench/definitions_bench.cpp)
+    target_link_libraries(definitions_bench PRIVATE vantorel_native benchmark::benchmark)
+endif()

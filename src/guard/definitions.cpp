@@ -1,0 +1,320 @@
+#include "guard/definitions.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+
+namespace vantorel {
+
+DefinitionList Definitions;
+
+namespace {
+
+bool IsSkippedBlank(char c) { return c == ' ' || c == '\t' || c == '\n'; }
+bool IsDigit(char c) { return c >= '0' && c <= '9'; }
+
+int DigitValue(char c, int base) {
+    int v = -1;
+    if (c >= '0' && c <= '9') v = c - '0';
+    else if (c >= 'a' && c <= 'f') v = c - 'a' + 10;
+    else if (c >= 'A' && c <= 'F') v = c - 'A' + 10;
+    return v < base ? v : -1;
+}
+
+// Strips leading zeros from a run of decimal digits, keeping at least one digit.
+std::string WithoutLeadingZeros(const std::string& digits) {
+    std::size_t first = digits.find_first_not_of('0');
+    return first == std::string::npos ? std::string("0") : digits.substr(first);
+}
+
+// Writes a double in plain decimal form, without an exponent.
+std::string PlainDecimal(double value) {
+    if (value == 0 || !std::isfinite(value)) return "0";
+    char buffer[400];
+    if (std::fabs(value) < 1e15 && value == std::floor(value)) {
+        std::snprintf(buffer, sizeof buffer, "%.0f", value);
+        return buffer;
+    }
+    std::snprintf(buffer, sizeof buffer, "%.15g", value);
+    if (std::strchr(buffer, 'e') == nullptr) return buffer;
+    // Large or tiny magnitudes: 15 significant digits written out in full.
+    std::snprintf(buffer, sizeof buffer, std::fabs(value) >= 1 ? "%.0f" : "%.17f", value);
+    std::string text = buffer;
+    if (text.find('.') != std::string::npos) {
+        while (text.back() == '0') text.pop_back();
+        if (text.back() == '.') text.pop_back();
+    }
+    return text;
+}
+
+}  // namespace
+
+std::optional<std::string> ReadLeadingNumber(std::string_view text) {
+    // Blanks, tabs and line feeds anywhere are skipped: collect the characters that matter.
+    std::string chars;
+    chars.reserve(std::min<std::size_t>(text.size(), 64));
+    std::size_t i = 0;
+    auto next = [&]() -> char {
+        while (i < text.size() && IsSkippedBlank(text[i])) ++i;
+        return i < text.size() ? text[i] : '\0';
+    };
+
+    char c = next();
+    if (c == '&') {
+        ++i;
+        char kind = next();
+        int base = (kind == 'H' || kind == 'h') ? 16 : (kind == 'O' || kind == 'o') ? 8 : 0;
+        if (base == 0) return std::nullopt;
+        ++i;
+        std::uint64_t value = 0;
+        bool any = false;
+        for (c = next(); DigitValue(c, base) >= 0; ++i, c = next()) {
+            any = true;
+            std::uint64_t digit = static_cast<std::uint64_t>(DigitValue(c, base));
+            if (value > (UINT64_MAX - digit) / static_cast<std::uint64_t>(base)) break;  // stays bounded
+            value = value * static_cast<std::uint64_t>(base) + digit;
+        }
+        if (!any) return std::nullopt;
+        return std::to_string(value);
+    }
+
+    bool negative = false;
+    if (c == '-' || c == '+') {
+        negative = c == '-';
+        ++i;
+        c = next();
+    }
+    std::string whole;
+    for (; IsDigit(c); ++i, c = next()) whole.push_back(c);
+    std::string fraction;
+    bool point = false;
+    if (c == '.') {
+        point = true;
+        ++i;
+        for (c = next(); IsDigit(c); ++i, c = next()) fraction.push_back(c);
+    }
+    if (whole.empty() && fraction.empty()) return std::nullopt;
+
+    std::string exponent;
+    if (c == 'e' || c == 'E' || c == 'd' || c == 'D') {
+        std::size_t save = i;
+        ++i;
+        std::string digits;
+        c = next();
+        if (c == '-' || c == '+') {
+            digits.push_back(c);
+            ++i;
+            c = next();
+        }
+        std::size_t signLength = digits.size();
+        for (; IsDigit(c); ++i, c = next()) digits.push_back(c);
+        if (digits.size() > signLength) exponent = digits;
+        else i = save;
+    }
+
+    if (!point && exponent.empty()) {
+        // A plain integer keeps every digit, however long.
+        std::string digits = WithoutLeadingZeros(whole);
+        if (digits == "0") return std::string("0");
+        return negative ? "-" + digits : digits;
+    }
+    std::string number = (negative ? "-" : "") + (whole.empty() ? std::string("0") : whole) + "." + fraction;
+    if (!exponent.empty()) {
+        // Exponents far outside a double's range are clamped before they reach strtod.
+        long e = std::strtol(exponent.c_str(), nullptr, 10);
+        e = std::clamp(e, -400L, 400L);
+        number += "e" + std::to_string(e);
+    }
+    return PlainDecimal(std::strtod(number.c_str(), nullptr));
+}
+
+std::int32_t FastSplit(const std::string& expression, std::vector<std::string>& resultSplit,
+                       const std::string& delimiter) {
+    std::size_t count = 1;
+    if (!expression.empty() && !delimiter.empty()) {
+        for (std::size_t p = expression.find(delimiter); p != std::string::npos; p = expression.find(delimiter, p + 1))
+            ++count;
+    }
+    resultSplit.clear();
+    resultSplit.reserve(count);
+    SplitPieces(expression, delimiter, [&](std::string_view piece, bool last) {
+        if (!last) {
+            resultSplit.emplace_back(piece);
+        } else if (resultSplit.empty()) {
+            resultSplit.emplace_back(piece);  // no separator: the whole text, as it stands
+        } else if (auto number = ReadLeadingNumber(piece)) {
+            resultSplit.push_back(std::move(*number));
+        }
+    });
+    return 0;
+}
+
+std::string_view ChooseSeparator(std::string_view text) {
+    return text.find('\r') != std::string_view::npos ? std::string_view("\r\n") : std::string_view("\n");
+}
+
+bool ParseCanonicalKey(std::string_view text, std::int32_t& key) {
+    std::size_t i = 0;
+    bool negative = false;
+    if (!text.empty() && text[0] == '-') {
+        negative = true;
+        i = 1;
+    }
+    std::size_t digits = text.size() - i;
+    if (digits == 0 || digits > 10) return false;
+    if (text[i] == '0' && (digits > 1 || negative)) return false;
+    std::int64_t value = 0;
+    for (; i < text.size(); ++i) {
+        if (!IsDigit(text[i])) return false;
+        value = value * 10 + (text[i] - '0');
+    }
+    if (negative) value = -value;
+    if (value < INT32_MIN || value > INT32_MAX) return false;
+    key = static_cast<std::int32_t>(value);
+    return true;
+}
+
+std::string_view FormatKey(std::int32_t key, char* buffer) {
+    char digits[11];
+    std::uint32_t magnitude = key < 0 ? 0u - static_cast<std::uint32_t>(key) : static_cast<std::uint32_t>(key);
+    int n = 0;
+    do {
+        digits[n++] = static_cast<char>('0' + magnitude % 10);
+        magnitude /= 10;
+    } while (magnitude != 0);
+    std::size_t length = 0;
+    if (key < 0) buffer[length++] = '-';
+    while (n > 0) buffer[length++] = digits[--n];
+    return std::string_view(buffer, length);
+}
+
+DefinitionList DefinitionList::FromText(std::string_view text) {
+    DefinitionList list;
+    std::string_view separator = ChooseSeparator(text);
+    std::size_t lines = 1;
+    if (!text.empty()) {
+        for (std::size_t p = text.find(separator); p != std::string_view::npos; p = text.find(separator, p + 1))
+            ++lines;
+    }
+    list.values_.reserve(lines);
+
+    std::string_view previousView;  // the previous line, for the order check
+    bool havePrevious = false;
+    auto add = [&](std::string_view line) {
+        std::int32_t key = 0;
+        if (!ParseCanonicalKey(line, key)) {
+            list.odd_.emplace_back(static_cast<std::uint32_t>(list.values_.size()), std::string(line));
+            key = 0;
+        }
+        list.values_.push_back(key);
+        if (havePrevious && previousView.compare(line) > 0) list.sorted_ = false;
+        previousView = line;
+        havePrevious = true;
+    };
+    SplitPieces(text, separator, [&](std::string_view piece, bool last) {
+        if (!last) {
+            add(piece);
+        } else if (!havePrevious) {
+            add(piece);
+        } else if (auto number = ReadLeadingNumber(piece)) {
+            add(*number);
+        }
+    });
+    list.values_.shrink_to_fit();
+    list.odd_.shrink_to_fit();
+    list.BuildIndex();
+    return list;
+}
+
+std::string_view DefinitionList::TextAt(std::size_t position, char* buffer) const {
+    if (!odd_.empty()) {
+        auto it = std::lower_bound(odd_.begin(), odd_.end(), position,
+                                   [](const auto& entry, std::size_t p) { return entry.first < p; });
+        if (it != odd_.end() && it->first == position) return it->second;
+    }
+    return FormatKey(values_[position], buffer);
+}
+
+std::string DefinitionList::at(std::size_t position) const {
+    char buffer[12];
+    return std::string(TextAt(position, buffer));
+}
+
+std::int32_t DefinitionList::FindText(std::string_view key) const {
+    if (values_.empty()) return kNoDefinition;
+    std::int64_t lo = 0;
+    std::int64_t hi = static_cast<std::int64_t>(values_.size()) - 1;
+    char buffer[12];
+    while (lo <= hi) {
+        std::int64_t mid = (lo + hi) / 2;
+        int order = TextAt(static_cast<std::size_t>(mid), buffer).compare(key);
+        if (order < 0) lo = mid + 1;
+        else if (order == 0) return static_cast<std::int32_t>(mid);
+        else hi = mid - 1;
+    }
+    return kNoDefinition;
+}
+
+std::size_t DefinitionList::SlotFor(std::int32_t key) const {
+    // Multiplicative hash, mapped onto the table by its high bits (no power-of-two size needed).
+    std::uint64_t h = static_cast<std::uint64_t>(static_cast<std::uint32_t>(key)) * 0x9E3779B97F4A7C15ull;
+    return static_cast<std::size_t>((static_cast<unsigned __int128>(h) * slots_.size()) >> 64);
+}
+
+void DefinitionList::BuildIndex() {
+    std::size_t keys = values_.size() - odd_.size();
+    slots_.assign(keys + keys / 3 + 1, Slot{0, 0});
+    std::vector<std::int32_t> repeated;
+    auto oddIt = odd_.begin();
+    for (std::size_t i = 0; i < values_.size(); ++i) {
+        if (oddIt != odd_.end() && oddIt->first == i) {
+            ++oddIt;
+            continue;
+        }
+        std::int32_t key = values_[i];
+        std::size_t s = SlotFor(key);
+        while (slots_[s].positionPlusOne != 0 && slots_[s].key != key) s = s + 1 == slots_.size() ? 0 : s + 1;
+        if (slots_[s].positionPlusOne == 0) slots_[s] = Slot{key, static_cast<std::uint32_t>(i + 1)};
+        else repeated.push_back(key);
+    }
+    if (sorted_ && !repeated.empty()) {
+        // A key listed on several lines: the halving search stops on one of them, not always the
+        // first. Record where it stops so both searches answer alike.
+        char buffer[12];
+        for (std::int32_t key : repeated) {
+            std::size_t s = SlotFor(key);
+            while (slots_[s].key != key) s = s + 1 == slots_.size() ? 0 : s + 1;
+            slots_[s].positionPlusOne = static_cast<std::uint32_t>(FindText(FormatKey(key, buffer)) + 1);
+        }
+    }
+}
+
+std::int32_t DefinitionList::FindKey(std::int32_t key) const {
+    if (slots_.empty()) return kNoDefinition;
+    std::size_t s = SlotFor(key);
+    for (;;) {
+        const Slot& slot = slots_[s];
+        if (slot.positionPlusOne == 0) return kNoDefinition;
+        if (slot.key == key) return static_cast<std::int32_t>(slot.positionPlusOne - 1);
+        s = s + 1 == slots_.size() ? 0 : s + 1;
+    }
+}
+
+std::size_t DefinitionList::MemoryBytes() const {
+    std::size_t bytes = values_.capacity() * sizeof(std::int32_t) + slots_.capacity() * sizeof(Slot) +
+                        odd_.capacity() * sizeof(odd_[0]);
+    for (const auto& entry : odd_) bytes += entry.second.capacity() > 15 ? entry.second.capacity() + 1 : 0;
+    return bytes;
+}
+
+std::int32_t FindDefinition(const DefinitionList& list, std::string_view key) {
+    std::int32_t rowKey = 0;
+    if (ParseCanonicalKey(key, rowKey)) return list.FindKey(rowKey);
+    return list.FindText(key);
+}
+
+std::int32_t FindDefinition(const DefinitionList& list, std::int32_t key) { return list.FindKey(key); }
+
+}  // namespace vantorel

@@ -1,0 +1,19 @@
+// Whole-file reads and the existence test through the Windows API.
+#pragma once
+
+#include <string>
+
+#include "platform/files.h"
+
+namespace vantorel::win32 {
+
+class Win32Files final : public platform::Files {
+public:
+    bool Exists(const std::string& path) override;
+    bool ReadAll(const std::string& path, std::string& content) override;
+};
+
+// The folder of the running executable, without a trailing backslash.
+std::string ProgramFolder();
+
+}  // namespace vantorel::win32

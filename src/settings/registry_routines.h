@@ -1,0 +1,87 @@
+// RegistryRoutines: the program's only way to the registry, where every setting lives.
+//
+// An object holds a root key and a key path; every operation opens what it needs and closes it
+// before returning, so no handle outlives a call. Failures never raise: each operation reports them
+// in its result (False, an empty text, the default value, a status code). Callers make their own
+// object for each setting they touch and drop it when they return.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "platform/registry.h"
+#include "settings/collection.h"
+#include "settings/variant.h"
+
+namespace vantorel {
+
+struct RegistryItem {
+    std::string name;
+    Variant value;
+};
+
+class RegistryRoutines {
+public:
+    explicit RegistryRoutines(platform::Registry& registry) : registry_(registry) {}
+
+    std::int32_t hkey() const { return hkey_; }
+    void hkey(std::int32_t vData) { hkey_ = vData; }
+    const std::string& KeyRoot() const { return keyRoot_; }
+    void KeyRoot(const std::string& vData) { keyRoot_ = vData; }
+    const std::string& Subkey() const { return subkey_; }
+    void Subkey(const std::string& vData) { subkey_ = vData; }
+
+    // True when the object path opens for reading.
+    bool KeyExists();
+
+    // Creates (or opens) KeyRoot + "\" + the key name (`KeyName`, else Subkey): "0" on success,
+    // the empty text on failure.
+    std::string CreateKey(const std::optional<std::string>& KeyName = std::nullopt);
+
+    // Deletes KeyRoot + "\" + KeyName; the registry's status code.
+    std::int32_t DeleteKey(const std::string& KeyName);
+
+    // Deletes a value of the object path; the status code of the open or of the deletion.
+    std::int32_t DeleteValue(const std::string& ValueName);
+
+    // The subkeys of `KeyName` below `hkey` (of `hkey` itself when `KeyName` is empty).
+    Collection<std::string> EnumRegistryKeys(std::int32_t hkey, const std::string& KeyName);
+
+    // The values of `KeyName` below `hkey`, converted for display (binary as hex pairs, multi-strings
+    // comma-separated).
+    Collection<RegistryItem> EnumRegistryValues(std::int32_t hkey, const std::string& KeyName);
+
+    // One value of the object path, converted by its type; `DefaultValue` (or empty) when the key or
+    // the value is missing or the type is not converted.
+    Variant GetRegistryValue(const std::string& ValueName, const Variant& DefaultValue = Variant());
+
+    // Writes one value of the object path as type `DType`. True when written, and when a type that
+    // is not converted left nothing to write; False when the key does not open, the write fails or
+    // the value cannot take the type.
+    bool SetRegistryValue(const std::string& ValueName, const Variant& Value, std::int32_t DType);
+
+    // The same on another computer's registry; "Error!" when it cannot be reached.
+    Variant ReadRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey,
+                                    const std::string& ValueName,
+                                    const std::optional<std::string>& KeyPath = std::nullopt);
+    bool WriteRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey, const std::string& ValueName,
+                                  const Variant& Value, std::int32_t DType,
+                                  const std::optional<std::string>& KeyPath = std::nullopt);
+
+    // Cuts `item` at its first NUL and returns it.
+    static std::string TrimNull(std::string& item);
+
+private:
+    std::string ObjectPath() const { return keyRoot_ + "\\" + subkey_; }
+    Variant ReadValue(platform::RegKey key, const std::string& name, Variant result);
+    bool WriteValue(platform::RegKey key, const std::string& name, const Variant& value, std::int32_t type);
+    std::string ExpandText(const std::string& text);
+
+    platform::Registry& registry_;
+    std::int32_t hkey_ = 0;
+    std::string keyRoot_;
+    std::string subkey_;
+};
+
+}  // namespace vantorel

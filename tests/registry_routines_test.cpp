@@ -1,0 +1,109 @@
+// Registry routines against the fake: what the real registry cannot be made to hold through the
+// ANSI calls (odd stored data), handle hygiene, and the text helpers.
+#include "settings/registry_routines.h"
+
+#include <gtest/gtest.h>
+
+#include "fakes/fake_registry.h"
+
+namespace vantorel {
+namespace {
+
+using testing::FakeRegistry;
+using platform::kHkeyCurrentUser;
+
+RegistryRoutines Vantorel(FakeRegistry& registry) {
+    RegistryRoutines reg(registry);
+    reg.hkey(kHkeyCurrentUser);
+    reg.KeyRoot("SOFTWARE\\Vantorel\\");
+    return reg;
+}
+
+TEST(RegistryRoutines, FieldsStartEmptyAndOnlyStore) {
+    FakeRegistry registry;
+    RegistryRoutines reg(registry);
+    EXPECT_EQ(reg.hkey(), 0);
+    EXPECT_EQ(reg.KeyRoot(), "");
+    EXPECT_EQ(reg.Subkey(), "");
+    EXPECT_FALSE(reg.KeyExists()) << "root 0 is no key";
+    reg.Subkey("Sub");
+    EXPECT_EQ(reg.Subkey(), "Sub");
+}
+
+TEST(RegistryRoutines, TrimNullCutsAtTheFirstNul) {
+    std::string item("abc\0def", 7);
+    EXPECT_EQ(RegistryRoutines::TrimNull(item), "abc");
+    EXPECT_EQ(item, "abc");
+    std::string plain = "abc";
+    EXPECT_EQ(RegistryRoutines::TrimNull(plain), "abc");
+    std::string leading("\0x", 2);
+    EXPECT_EQ(RegistryRoutines::TrimNull(leading), "");
+}
+
+TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
+    FakeRegistry registry;
+    const std::string key = "SOFTWARE\\Vantorel";
+    registry.PutRaw(kHkeyCurrentUser, key, "ShortDword", 4, {0x01, 0x02});
+    registry.PutRaw(kHkeyCurrentUser, key, "EmptyDword", 4, {});
+    registry.PutRaw(kHkeyCurrentUser, key, "EmptyText", 1, {});
+    registry.PutRaw(kHkeyCurrentUser, key, "Unterminated", 1, {'a', 'b', 'c'});
+    registry.PutRaw(kHkeyCurrentUser, key, "TinyMulti", 7, {'a'});
+    registry.PutRaw(kHkeyCurrentUser, key, "EmptyMulti", 7, {});
+    registry.PutRaw(kHkeyCurrentUser, key, "EmptyBinary", 3, {});
+    registry.PutRaw(kHkeyCurrentUser, key, "None", 0, {1, 2});
+
+    RegistryRoutines reg = Vantorel(registry);
+    const Variant fallback = std::string("default");
+    EXPECT_EQ(reg.GetRegistryValue("ShortDword", fallback), Variant(std::int32_t{0x0201}));
+    EXPECT_EQ(reg.GetRegistryValue("EmptyDword", fallback), Variant(std::int32_t{0}));
+    EXPECT_EQ(reg.GetRegistryValue("EmptyText", fallback), fallback);
+    EXPECT_EQ(reg.GetRegistryValue("Unterminated", fallback), Variant(std::string("abc")))
+        << "a string stored without terminator keeps its last character";
+    EXPECT_EQ(reg.GetRegistryValue("TinyMulti", fallback), fallback);
+    EXPECT_EQ(reg.GetRegistryValue("EmptyMulti", fallback), fallback);
+    EXPECT_EQ(reg.GetRegistryValue("EmptyBinary", fallback), Variant(Bytes{}));
+    EXPECT_EQ(reg.GetRegistryValue("None", fallback), fallback);
+
+    auto values = reg.EnumRegistryValues(kHkeyCurrentUser, key);
+    ASSERT_EQ(values.size(), 8u);
+    EXPECT_EQ(values.Find("ShortDword")->value, Variant(std::int32_t{0x0201}));
+    EXPECT_EQ(values.Find("EmptyText")->value, Variant(std::string()));
+    EXPECT_EQ(values.Find("Unterminated")->value, Variant(std::string("abc")));
+    EXPECT_EQ(values.Find("TinyMulti")->value, Variant(std::string()));
+    EXPECT_EQ(values.Find("EmptyBinary")->value, Variant(std::string()));
+    EXPECT_TRUE(IsEmpty(values.Find("None")->value));
+    EXPECT_EQ(registry.OpenHandles(), 0u);
+}
+
+TEST(RegistryRoutines, EveryOperationClosesWhatItOpened) {
+    FakeRegistry registry;
+    RegistryRoutines reg = Vantorel(registry);
+    ASSERT_EQ(reg.CreateKey(), "0");
+    reg.KeyExists();
+    reg.SetRegistryValue("State", std::string("1"), 1);
+    reg.SetRegistryValue("State", std::string("x"), 4);
+    reg.GetRegistryValue("State");
+    reg.GetRegistryValue("Missing");
+    reg.EnumRegistryKeys(kHkeyCurrentUser, "SOFTWARE");
+    reg.EnumRegistryKeys(kHkeyCurrentUser, "");
+    reg.EnumRegistryValues(kHkeyCurrentUser, "SOFTWARE\\Vantorel");
+    reg.ReadRemoteRegistryValue("", kHkeyCurrentUser, "State");
+    reg.WriteRemoteRegistryValue("", kHkeyCurrentUser, "State", std::string("0"), 1);
+    reg.ReadRemoteRegistryValue("\\\\far", kHkeyCurrentUser, "State");
+    reg.DeleteValue("State");
+    reg.DeleteValue("State");
+    EXPECT_EQ(registry.OpenHandles(), 0u);
+}
+
+TEST(RegistryRoutines, EnumeratingTheRootItselfLeavesItOpen) {
+    FakeRegistry registry;
+    RegistryRoutines reg = Vantorel(registry);
+    ASSERT_EQ(reg.CreateKey(), "0");
+    auto keys = reg.EnumRegistryKeys(kHkeyCurrentUser, "");
+    ASSERT_EQ(keys.size(), 1u);
+    EXPECT_EQ(keys[0], "SOFTWARE");
+    EXPECT_TRUE(reg.KeyExists()) << "the predefined root was not closed";
+}
+
+}  // namespace
+}  // namespace vantorel
