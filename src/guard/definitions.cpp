@@ -257,15 +257,22 @@ std::int32_t DefinitionList::FindText(std::string_view key) const {
     return kNoDefinition;
 }
 
-std::size_t DefinitionList::SlotFor(std::int32_t key) const {
-    // Multiplicative hash, mapped onto the table by its high bits (no power-of-two size needed).
+std::size_t DefinitionList::BucketFor(std::int32_t key) const {
+    // Multiplicative hash; its high bits pick the bucket (no power-of-two size needed).
     std::uint64_t h = static_cast<std::uint64_t>(static_cast<std::uint32_t>(key)) * 0x9E3779B97F4A7C15ull;
-    return static_cast<std::size_t>((static_cast<unsigned __int128>(h) * slots_.size()) >> 64);
+    return static_cast<std::size_t>((static_cast<unsigned __int128>(h) * buckets_.size()) >> 64);
+}
+
+DefinitionList::Slot& DefinitionList::SlotOf(std::int32_t key) {
+    for (std::size_t b = BucketFor(key);; b = b + 1 == buckets_.size() ? 0 : b + 1) {
+        for (Slot& slot : buckets_[b].slots)
+            if (slot.positionPlusOne == 0 || slot.key == key) return slot;
+    }
 }
 
 void DefinitionList::BuildIndex() {
     std::size_t keys = values_.size() - odd_.size();
-    slots_.assign(keys + keys / 3 + 1, Slot{0, 0});
+    buckets_.assign(keys / 6 + 1, Bucket{});  // at most 6 of 8 slots filled on average
     std::vector<std::int32_t> repeated;
     auto oddIt = odd_.begin();
     for (std::size_t i = 0; i < values_.size(); ++i) {
@@ -273,37 +280,31 @@ void DefinitionList::BuildIndex() {
             ++oddIt;
             continue;
         }
-        std::int32_t key = values_[i];
-        std::size_t s = SlotFor(key);
-        while (slots_[s].positionPlusOne != 0 && slots_[s].key != key) s = s + 1 == slots_.size() ? 0 : s + 1;
-        if (slots_[s].positionPlusOne == 0) slots_[s] = Slot{key, static_cast<std::uint32_t>(i + 1)};
-        else repeated.push_back(key);
+        Slot& slot = SlotOf(values_[i]);
+        if (slot.positionPlusOne == 0) slot = Slot{values_[i], static_cast<std::uint32_t>(i + 1)};
+        else repeated.push_back(values_[i]);
     }
     if (sorted_ && !repeated.empty()) {
         // A key listed on several lines: the halving search stops on one of them, not always the
         // first. Record where it stops so both searches answer alike.
         char buffer[12];
-        for (std::int32_t key : repeated) {
-            std::size_t s = SlotFor(key);
-            while (slots_[s].key != key) s = s + 1 == slots_.size() ? 0 : s + 1;
-            slots_[s].positionPlusOne = static_cast<std::uint32_t>(FindText(FormatKey(key, buffer)) + 1);
-        }
+        for (std::int32_t key : repeated)
+            SlotOf(key).positionPlusOne = static_cast<std::uint32_t>(FindText(FormatKey(key, buffer)) + 1);
     }
 }
 
 std::int32_t DefinitionList::FindKey(std::int32_t key) const {
-    if (slots_.empty()) return kNoDefinition;
-    std::size_t s = SlotFor(key);
-    for (;;) {
-        const Slot& slot = slots_[s];
-        if (slot.positionPlusOne == 0) return kNoDefinition;
-        if (slot.key == key) return static_cast<std::int32_t>(slot.positionPlusOne - 1);
-        s = s + 1 == slots_.size() ? 0 : s + 1;
+    if (buckets_.empty()) return kNoDefinition;
+    for (std::size_t b = BucketFor(key);; b = b + 1 == buckets_.size() ? 0 : b + 1) {
+        for (const Slot& slot : buckets_[b].slots) {
+            if (slot.positionPlusOne == 0) return kNoDefinition;
+            if (slot.key == key) return static_cast<std::int32_t>(slot.positionPlusOne - 1);
+        }
     }
 }
 
 std::size_t DefinitionList::MemoryBytes() const {
-    std::size_t bytes = values_.capacity() * sizeof(std::int32_t) + slots_.capacity() * sizeof(Slot) +
+    std::size_t bytes = values_.capacity() * sizeof(std::int32_t) + buckets_.capacity() * sizeof(Bucket) +
                         odd_.capacity() * sizeof(odd_[0]);
     for (const auto& entry : odd_) bytes += entry.second.capacity() > 15 ? entry.second.capacity() + 1 : 0;
     return bytes;
