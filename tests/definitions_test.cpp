@@ -183,7 +183,7 @@ TEST(DefinitionList, BadInputGivesHarmlessKeys) {
     EXPECT_EQ(FindDefinition(overflow, "2147483648"), 0) << "the text search still sees the line";
 
     // One giant line (no separator) and a giant line before a real key.
-    std::string giant(20u << 20, '7');
+    std::string giant(100u << 20, '7');  // 100 MB, one line
     DefinitionList big = DefinitionList::FromText(giant);
     EXPECT_EQ(big.size(), 1u);
     EXPECT_EQ(FindDefinition(big, std::int32_t{7}), kNoDefinition);
