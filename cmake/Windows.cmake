@@ -1,17 +1,31 @@
 # Windows build (mingw-w64, static): vantorel.exe and the tests that need the real system, run
 # under Wine through CTest.
 set(VANTOREL_WINEPREFIX ${CMAKE_BINARY_DIR}/wineprefix)
-set(CMAKE_CROSSCOMPILING_EMULATOR
-    env WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml= /usr/bin/wine)
+# Test programs run in the build's scratch prefix, on the build's virtual display.
+set(CMAKE_CROSSCOMPILING_EMULATOR sh ${CMAKE_SOURCE_DIR}/tests/win32/wine-exec ${CMAKE_BINARY_DIR})
 
 add_library(vantorel_win32 STATIC
+    src/platform/win32/controls_win32.cpp
     src/platform/win32/files_win32.cpp
     src/platform/win32/registry_win32.cpp
 )
-target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi)
+target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi user32 gdi32)
 target_compile_definitions(vantorel_win32 PUBLIC WIN32_LEAN_AND_MEAN NOMINMAX)
 
-add_executable(vantorel WIN32 src/platform/win32/main_win32.cpp)
+# Icons drawn at build time, the manifest and the version resource.
+enable_language(RC)
+set(VANTOREL_ICONS ${CMAKE_BINARY_DIR}/icons/padlock.ico ${CMAKE_BINARY_DIR}/icons/bulb-dark.ico
+    ${CMAKE_BINARY_DIR}/icons/bulb-lit.ico)
+add_custom_command(OUTPUT ${VANTOREL_ICONS}
+    COMMAND /usr/bin/python3 ${CMAKE_SOURCE_DIR}/scripts/make-icons ${CMAKE_BINARY_DIR}/icons
+    DEPENDS ${CMAKE_SOURCE_DIR}/scripts/make-icons
+    COMMENT "Drawing the icons")
+configure_file(resources/vantorel.rc.in ${CMAKE_BINARY_DIR}/vantorel.rc @ONLY)
+set_source_files_properties(${CMAKE_BINARY_DIR}/vantorel.rc PROPERTIES
+    OBJECT_DEPENDS "${VANTOREL_ICONS};${CMAKE_SOURCE_DIR}/resources/vantorel.manifest")
+set(CMAKE_RC_FLAGS "${CMAKE_RC_FLAGS} -I${CMAKE_BINARY_DIR}/icons -I${CMAKE_SOURCE_DIR}/src")
+
+add_executable(vantorel WIN32 src/platform/win32/main_win32.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
 target_link_libraries(vantorel PRIVATE vantorel_win32)
 
 # GoogleTest built for the target.
@@ -19,13 +33,14 @@ set(BUILD_GMOCK OFF CACHE BOOL "" FORCE)
 set(INSTALL_GTEST OFF CACHE BOOL "" FORCE)
 add_subdirectory(/usr/src/googletest ${CMAKE_BINARY_DIR}/_gtest EXCLUDE_FROM_ALL)
 
-# Wine services inherit ctest's output pipe and stall it: a fixture starts a persistent wineserver
-# (and the prefix) once, quietly, and stops it at the end.
+# Wine services inherit ctest's output pipe and stall it: a fixture starts a virtual display and a
+# persistent wineserver (and the prefix) once, quietly, and stops both at the end.
 set(WINE_ENV WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=)
 add_test(NAME wine_start COMMAND sh -c
-    "mkdir -p '${VANTOREL_WINEPREFIX}' && env ${WINE_ENV} wineserver -p </dev/null >/dev/null 2>&1 && env ${WINE_ENV} wine wineboot </dev/null >/dev/null 2>&1")
+    "sh '${CMAKE_SOURCE_DIR}/tests/win32/xvfb-fixture' start '${CMAKE_BINARY_DIR}' && . '${CMAKE_BINARY_DIR}/xvfb.env' && mkdir -p '${VANTOREL_WINEPREFIX}' && env ${WINE_ENV} wineserver -p </dev/null >/dev/null 2>&1 && env ${WINE_ENV} wine wineboot </dev/null >/dev/null 2>&1")
 set_tests_properties(wine_start PROPERTIES FIXTURES_SETUP wine)
-add_test(NAME wine_stop COMMAND sh -c "env ${WINE_ENV} wineserver -k </dev/null >/dev/null 2>&1; exit 0")
+add_test(NAME wine_stop COMMAND sh -c
+    "env ${WINE_ENV} wineserver -k </dev/null >/dev/null 2>&1; sh '${CMAKE_SOURCE_DIR}/tests/win32/xvfb-fixture' stop '${CMAKE_BINARY_DIR}'")
 set_tests_properties(wine_stop PROPERTIES FIXTURES_CLEANUP wine)
 
 function(vantorel_wine_test name)
@@ -36,6 +51,7 @@ function(vantorel_wine_test name)
 endfunction()
 
 vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
+vantorel_wine_test(controls_win32_tests tests/win32/controls_win32_test.cpp)
 
 vantorel_wine_test(registry_win32_tests
     tests/contract/registry_contract.cpp

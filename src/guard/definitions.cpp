@@ -118,14 +118,16 @@ std::optional<std::string> ReadLeadingNumber(std::string_view text) {
         // A plain integer keeps every digit, however long.
         std::string digits = WithoutLeadingZeros(whole);
         if (digits == "0") return std::string("0");
-        return negative ? "-" + digits : digits;
+        if (negative) digits.insert(digits.begin(), '-');
+        return digits;
     }
-    std::string number = (negative ? "-" : "") + (whole.empty() ? std::string("0") : whole) + "." + fraction;
+    std::string number(negative ? "-" : "");
+    number.append(whole.empty() ? "0" : whole).append(".").append(fraction);
     if (!exponent.empty()) {
         // Exponents far outside a double's range are clamped before they reach strtod.
         long e = std::strtol(exponent.c_str(), nullptr, 10);
         e = std::clamp(e, -400L, 400L);
-        number += "e" + std::to_string(e);
+        number.append("e").append(std::to_string(e));
     }
     return PlainDecimal(std::strtod(number.c_str(), nullptr));
 }
