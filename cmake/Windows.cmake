@@ -7,6 +7,7 @@ set(CMAKE_CROSSCOMPILING_EMULATOR sh ${CMAKE_SOURCE_DIR}/tests/win32/wine-exec $
 add_library(vantorel_win32 STATIC
     src/platform/win32/controls_win32.cpp
     src/platform/win32/files_win32.cpp
+    src/platform/win32/options_window_win32.cpp
     src/platform/win32/registry_win32.cpp
 )
 target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi user32 gdi32)
@@ -52,6 +53,7 @@ endfunction()
 
 vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
 vantorel_wine_test(controls_win32_tests tests/win32/controls_win32_test.cpp)
+vantorel_wine_test(options_window_tests tests/win32/options_window_test.cpp)
 
 vantorel_wine_test(registry_win32_tests
     tests/contract/registry_contract.cpp
