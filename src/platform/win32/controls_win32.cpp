@@ -100,19 +100,19 @@ LRESULT CALLBACK FrameProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam
     return ::DefWindowProcA(hwnd, message, wParam, lParam);
 }
 
-void RegisterFrameClass(HINSTANCE instance) {
+}  // namespace
+
+void RegisterWindowClass(HINSTANCE instance, const char* name, WNDPROC proc) {
     WNDCLASSA existing{};
-    if (::GetClassInfoA(instance, kFrameClass, &existing)) return;
+    if (::GetClassInfoA(instance, name, &existing)) return;
     WNDCLASSA wc{};
-    wc.lpfnWndProc = FrameProc;
+    wc.lpfnWndProc = proc;
     wc.hInstance = instance;
     wc.hCursor = ::LoadCursorA(nullptr, reinterpret_cast<LPCSTR>(IDC_ARROW));
     wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
-    wc.lpszClassName = kFrameClass;
+    wc.lpszClassName = name;
     ::RegisterClassA(&wc);
 }
-
-}  // namespace
 
 int TwipsToPixels(int twips, UINT dpi) { return ::MulDiv(twips, static_cast<int>(dpi), 1440); }
 
@@ -163,7 +163,7 @@ std::string Win32Label::Caption() const { return TextOf(hwnd_); }
 Win32Frame::Win32Frame(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font,
                        bool visible) {
     auto instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(parent, GWLP_HINSTANCE));
-    RegisterFrameClass(instance);
+    RegisterWindowClass(instance, kFrameClass, FrameProc);
     RECT r = ToPixels(rect, dpi);
     hwnd_ = ::CreateWindowExA(WS_EX_CONTROLPARENT, kFrameClass, caption.c_str(),
                               WS_CHILD | WS_CLIPCHILDREN | (visible ? WS_VISIBLE : 0), r.left, r.top,

@@ -23,6 +23,9 @@ RECT ToPixels(const TwipsRect& rect, UINT dpi);
 // The design font, Verdana 8.25 pt, for `dpi`. The caller owns it.
 HFONT CreateDesignFont(UINT dpi);
 
+// Registers a window class with the dialog colour and the arrow cursor, once per process.
+void RegisterWindowClass(HINSTANCE instance, const char* name, WNDPROC proc);
+
 // Raises the click of the wrapper that sent this WM_COMMAND. True when one of ours handled it.
 bool RouteCommand(WPARAM wParam, LPARAM lParam);
 

@@ -42,16 +42,7 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
                              const std::string& executablePath)
     : owner_(owner) {
     HINSTANCE instance = ::GetModuleHandleA(nullptr);
-    WNDCLASSA existing{};
-    if (!::GetClassInfoA(instance, kOptionsClass, &existing)) {
-        WNDCLASSA wc{};
-        wc.lpfnWndProc = Proc;
-        wc.hInstance = instance;
-        wc.hCursor = ::LoadCursorA(nullptr, reinterpret_cast<LPCSTR>(IDC_ARROW));
-        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
-        wc.lpszClassName = kOptionsClass;
-        ::RegisterClassA(&wc);
-    }
+    RegisterWindowClass(instance, kOptionsClass, Proc);
     const DWORD style = WS_CAPTION | WS_SYSMENU | WS_POPUP | WS_CLIPCHILDREN;
     hwnd_ = ::CreateWindowExA(WS_EX_DLGMODALFRAME | WS_EX_CONTROLPARENT, kOptionsClass, "Options", style,
                               CW_USEDEFAULT, CW_USEDEFAULT, 100, 100, owner, nullptr, instance, this);
