@@ -29,6 +29,10 @@ set(CMAKE_RC_FLAGS "${CMAKE_RC_FLAGS} -I${CMAKE_BINARY_DIR}/icons -I${CMAKE_SOUR
 add_executable(vantorel WIN32 src/platform/win32/main_win32.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
 target_link_libraries(vantorel PRIVATE vantorel_win32)
 
+# Reads windows from inside a Wine desktop for the end-to-end tests.
+add_executable(vtprobe tests/e2e/vtprobe.cpp)
+target_link_libraries(vtprobe PRIVATE user32)
+
 # GoogleTest built for the target.
 set(BUILD_GMOCK OFF CACHE BOOL "" FORCE)
 set(INSTALL_GTEST OFF CACHE BOOL "" FORCE)
@@ -59,3 +63,7 @@ vantorel_wine_test(registry_win32_tests
     tests/contract/registry_contract.cpp
     tests/win32/registry_win32_test.cpp
 )
+
+# End-to-end: the real vantorel.exe driven under Wine on a virtual display of its own.
+add_test(NAME e2e COMMAND /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/e2e/e2e_tests.py ${CMAKE_BINARY_DIR})
+set_tests_properties(e2e PROPERTIES TIMEOUT 900)
