@@ -372,7 +372,11 @@ void KirelXPButton::Refresh() {
 
 void KirelXPButton::CaptureBackground() {
     capturing_ = true;
-    hasBackground_ = host_.CaptureParentPixels(w_, h_, background_) || hasBackground_;
+    if (host_.CaptureParentPixels(w_, h_, background_)) {
+        hasBackground_ = true;
+        backgroundW_ = w_;
+        backgroundH_ = h_;
+    }
     capturing_ = false;
 }
 

@@ -260,6 +260,8 @@ private:
     bool hasShape_ = false;
     std::vector<std::uint8_t> background_;
     bool hasBackground_ = false;
+    std::int32_t backgroundW_ = 0;
+    std::int32_t backgroundH_ = 0;
     bool capturing_ = false;
     std::int32_t lastState_ = 0;
     std::string lastCaption_;

@@ -215,7 +215,7 @@ void KirelXPButton::Paint(std::int32_t state, bool force) {
         ComputePalette();
     }
     canvas_.FillBox(0, 0, w_, h_, palette_.FaceColor);
-    if (buttonType_ == 11 && hasBackground_) canvas_.WritePixels(0, 0, w_, h_, background_);
+    if (buttonType_ == 11 && hasBackground_) canvas_.WritePixels(0, 0, backgroundW_, backgroundH_, background_);
     if (!enabled_) {
         DrawDisabled();
         DrawPicture(2);
