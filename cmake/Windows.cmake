@@ -21,10 +21,20 @@ add_subdirectory(/usr/src/googletest ${CMAKE_BINARY_DIR}/_gtest EXCLUDE_FROM_ALL
 
 # Wine services inherit ctest's output pipe and stall it: a fixture starts a persistent wineserver
 # (and the prefix) once, quietly, and stops it at the end.
-set(WINE_ENV WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=)
+# One shell word list (a CMake list would put ";" between the words and split the sh -c command,
+# leaving wineserver on the default prefix).
+set(WINE_ENV "WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=")
+# Wine's desktop process belongs to the wineserver, so the wineserver starts on a private Xvfb
+# for the tests that need real windows.
+set(VANTOREL_XVFB_STATE ${CMAKE_BINARY_DIR}/xvfb.state)
+add_test(NAME xvfb_start COMMAND ${CMAKE_SOURCE_DIR}/scripts/xvfb-fixture start ${VANTOREL_XVFB_STATE})
+set_tests_properties(xvfb_start PROPERTIES FIXTURES_SETUP xvfb)
+add_test(NAME xvfb_stop COMMAND ${CMAKE_SOURCE_DIR}/scripts/xvfb-fixture stop ${VANTOREL_XVFB_STATE})
+set_tests_properties(xvfb_stop PROPERTIES FIXTURES_CLEANUP xvfb DEPENDS wine_stop)
+set(WINE_DISPLAY "DISPLAY=$(cut -d' ' -f1 '${VANTOREL_XVFB_STATE}')")
 add_test(NAME wine_start COMMAND sh -c
-    "mkdir -p '${VANTOREL_WINEPREFIX}' && env ${WINE_ENV} wineserver -p </dev/null >/dev/null 2>&1 && env ${WINE_ENV} wine wineboot </dev/null >/dev/null 2>&1")
-set_tests_properties(wine_start PROPERTIES FIXTURES_SETUP wine)
+    "mkdir -p '${VANTOREL_WINEPREFIX}' && export ${WINE_DISPLAY} && env ${WINE_ENV} wineserver -p </dev/null >/dev/null 2>&1 && env ${WINE_ENV} wine wineboot </dev/null >/dev/null 2>&1")
+set_tests_properties(wine_start PROPERTIES FIXTURES_SETUP wine FIXTURES_REQUIRED xvfb)
 add_test(NAME wine_stop COMMAND sh -c "env ${WINE_ENV} wineserver -k </dev/null >/dev/null 2>&1; exit 0")
 set_tests_properties(wine_stop PROPERTIES FIXTURES_CLEANUP wine)
 
@@ -39,3 +49,17 @@ vantorel_wine_test(registry_win32_tests
     tests/contract/registry_contract.cpp
     tests/win32/registry_win32_test.cpp
 )
+
+# The push button: the GDI canvas and window class.
+target_sources(vantorel_win32 PRIVATE
+    src/platform/win32/gdi_canvas.cpp
+    src/platform/win32/gdi_picture.cpp
+    src/platform/win32/xpbutton_window.cpp
+)
+target_link_libraries(vantorel_win32 PUBLIC gdi32 user32)
+
+add_executable(xpbutton_win32_tests tests/win32/xpbutton_win32_test.cpp)
+target_link_libraries(xpbutton_win32_tests PRIVATE vantorel_win32 vantorel_fakes gtest_main)
+add_test(NAME xpbutton_win32_tests COMMAND sh -c
+    "export ${WINE_DISPLAY} && exec env ${WINE_ENV} wine '$<TARGET_FILE:xpbutton_win32_tests>' --gtest_brief=1")
+set_tests_properties(xpbutton_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;xvfb" TIMEOUT 300)

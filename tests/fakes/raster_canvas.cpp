@@ -80,7 +80,7 @@ void RasterCanvas::DrawLine(std::int32_t x1, std::int32_t y1, std::int32_t x2, s
         std::int32_t x = x1;
         for (std::int32_t y = y1, n = 0; n < dy; ++n, y += sy) {
             Set(x, y, c);
-            if (err > 0 || (err == 0 && sy < 0)) {
+            if (err > 0) {
                 x += sx;
                 err -= 2 * dy;
             }

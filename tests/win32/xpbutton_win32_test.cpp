@@ -1,0 +1,216 @@
+// The push button on real GDI and in a real window, under Wine on a private Xvfb.
+// - The GDI canvas and the raster canvas draw the same pixels for every look's solid parts in
+//   every state and two colour schemes (the captions are empty so no text is drawn; the oval look
+//   is left out since ellipse pixels are the platform's).
+// - The window class turns real mouse and key messages into the control's events: one Click per
+//   click, none for the right button, one for a double click, one for the access key.
+#include <windows.h>
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <sstream>
+
+#include "controls/xpbutton/kirel_xp_button.h"
+#include "fakes/fake_button_host.h"
+#include "fakes/raster_canvas.h"
+#include "platform/win32/gdi_canvas.h"
+#include "platform/win32/xpbutton_window.h"
+
+namespace vantorel {
+namespace {
+
+using testing::FakeButtonHost;
+using testing::MemoryPicture;
+using testing::RasterCanvas;
+using xpbutton::KirelXPButton;
+using xpbutton::Rgb;
+
+struct Pair {
+    FakeButtonHost rasterHost, gdiHost;
+    RasterCanvas raster;
+    win32::GdiCanvas gdi;
+    KirelXPButton a{rasterHost, raster};
+    KirelXPButton b{gdiHost, gdi};
+
+    Pair(int type, int scheme, int w, int h) {
+        for (FakeButtonHost* host : {&rasterHost, &gdiHost}) {
+            host->width = w;
+            host->height = h;
+            host->name = "";
+        }
+        for (KirelXPButton* k : {&a, &b}) {
+            k->InitNewControl();
+            k->OnResize();
+            k->SetColorScheme(scheme);
+            k->SetBackColor(0x3080C0);
+            k->SetBackOver(0x30C080);
+            k->OnShow();
+            k->SetButtonType(type);
+        }
+    }
+    template <typename F>
+    void Both(F f) {
+        f(a, rasterHost);
+        f(b, gdiHost);
+    }
+    // Describes the first few differing pixels, empty when the surfaces agree.
+    std::string Differences() const {
+        std::ostringstream out;
+        int count = 0;
+        for (int y = 0; y < raster.height(); ++y)
+            for (int x = 0; x < raster.width(); ++x) {
+                const Rgb want = raster.At(x, y);
+                const Rgb got = gdi.At(x, y);
+                if (want != got && count++ < 6) out << "(" << x << "," << y << ") raster " << std::hex << want
+                                                    << " gdi " << got << std::dec << "; ";
+            }
+        if (count) out << count << " pixels differ";
+        return out.str();
+    }
+};
+
+TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
+    auto picture = std::make_shared<MemoryPicture>(
+        platform::PictureKind::kBitmap, 3, 3,
+        std::vector<Rgb>{0xC0C0C0, 0x000000, 0x0000FF, 0x404040, 0xFFFFFF, 0x00FF00, 0x808081, 0x123456, 0xC0C0C0});
+    for (int scheme : {2, 3}) {
+        for (int type = 1; type <= 14; ++type) {
+            if (type == 13) continue;
+            for (int state = 0; state < 5; ++state) {
+                for (bool withPicture : {false, true}) {
+                    Pair p(type, scheme, 37, 23);
+                    if (withPicture) {
+                        p.Both([&](KirelXPButton& k, FakeButtonHost&) {
+                            k.SetPictureNormal(picture);
+                            k.SetSpecialEffect(1);
+                        });
+                    }
+                    p.Both([&](KirelXPButton& k, FakeButtonHost& host) {
+                        switch (state) {
+                            case 0: k.Paint(0, true); break;
+                            case 1:
+                                host.pointerOver = true;
+                                k.OnMouseMove(0, 0, 1, 1);
+                                break;
+                            case 2: k.OnMouseDown(1, 0, 1, 1); break;
+                            case 3: k.SetEnabled(false); break;
+                            case 4:
+                                host.isDefault = true;
+                                k.Paint(0, true);
+                                break;
+                        }
+                    });
+                    EXPECT_EQ(p.Differences(), "") << "type " << type << " scheme " << scheme << " state " << state
+                                                   << (withPicture ? " with picture" : "");
+                }
+            }
+        }
+    }
+}
+
+// A top-level window holding one button, on the private display.
+struct Hosted {
+    HWND parent = nullptr;
+    win32::XPButtonWindow button;
+    std::vector<std::string> log;
+
+    Hosted() {
+        WNDCLASSA wc{};
+        wc.lpfnWndProc = ::DefWindowProcA;
+        wc.hInstance = ::GetModuleHandleA(nullptr);
+        wc.lpszClassName = "XPButtonTestParent";
+        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
+        ::RegisterClassA(&wc);
+        parent = ::CreateWindowA("XPButtonTestParent", "XPButton test", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 10, 10, 300,
+                                 200, nullptr, nullptr, wc.hInstance, nullptr);
+        if (!parent || !button.Create(parent, 1, 20, 20, 120, 40, "BtnOnOff")) return;
+        button.events().Click = [this] { log.push_back("Click"); };
+        button.events().MouseDown = [this](std::int16_t& b, std::int16_t&, float&, float&) {
+            log.push_back("MouseDown " + std::to_string(b));
+        };
+        button.events().MouseUp = [this](std::int16_t& b, std::int16_t&, float&, float&) {
+            log.push_back("MouseUp " + std::to_string(b));
+        };
+        button.Show();
+        Pump();
+    }
+    ~Hosted() {
+        button.Destroy();
+        if (parent) ::DestroyWindow(parent);
+    }
+    static void Pump() {
+        MSG msg;
+        while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            ::TranslateMessage(&msg);
+            ::DispatchMessageA(&msg);
+        }
+    }
+    void Send(UINT message, WPARAM wParam = 0, LPARAM lParam = MAKELPARAM(10, 10)) {
+        ::SendMessageA(button.hwnd(), message, wParam, lParam);
+    }
+};
+
+TEST(XPButtonWindow, MessagesBecomeEvents) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr) << "no display";
+    ASSERT_NE(h.button.hwnd(), nullptr);
+    // Shown: the back buffer holds the new control's look (ButtonType 3, blue border).
+    EXPECT_EQ(h.button.canvas().At(0, 10), 0x733C00u);
+    // The window shape has the rounded corners: (0, 0) is outside, (2, 0) inside.
+    HRGN region = ::CreateRectRgn(0, 0, 0, 0);
+    ASSERT_NE(::GetWindowRgn(h.button.hwnd(), region), ERROR);
+    EXPECT_FALSE(::PtInRegion(region, 0, 0));
+    EXPECT_TRUE(::PtInRegion(region, 2, 0));
+    ::DeleteObject(region);
+
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    EXPECT_EQ(h.button.button().lastState(), 2);
+    h.Send(WM_LBUTTONUP);
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click"}));
+
+    h.log.clear();
+    h.Send(WM_RBUTTONDOWN, MK_RBUTTON);
+    h.Send(WM_RBUTTONUP);
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 2", "MouseUp 2"}));
+
+    // A double click: down, up, double-click, up gives one Click.
+    h.log.clear();
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    h.Send(WM_LBUTTONUP);
+    h.Send(WM_LBUTTONDBLCLK, MK_LBUTTON);
+    h.Send(WM_LBUTTONUP);
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}));
+
+    // A release outside the control raises MouseUp but no Click.
+    h.log.clear();
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    h.Send(WM_LBUTTONUP, 0, MAKELPARAM(500, 10));
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1"}));
+
+    // The two-state switch: space toggles Value before Click; BM_CLICK is the access key path.
+    h.button.button().SetCheckBoxBehaviour(true);
+    h.log.clear();
+    h.Send(WM_KEYDOWN, VK_SPACE);
+    h.Send(WM_KEYUP, VK_SPACE);
+    EXPECT_TRUE(h.button.button().Value());
+    h.Send(BM_CLICK);
+    EXPECT_FALSE(h.button.button().Value());
+    EXPECT_EQ(h.log, (std::vector<std::string>{"Click", "Click"}));
+
+    // The caption becomes the window text (for IsDialogMessage's access keys).
+    h.button.button().SetCaption("&On");
+    char text[32] = {};
+    ::GetWindowTextA(h.button.hwnd(), text, sizeof text);
+    EXPECT_STREQ(text, "&On");
+
+    // Disabled: the window is disabled and a reported click raises nothing.
+    h.button.button().SetEnabled(false);
+    EXPECT_FALSE(::IsWindowEnabled(h.button.hwnd()));
+    h.log.clear();
+    h.Send(BM_CLICK);
+    EXPECT_TRUE(h.log.empty());
+}
+
+}  // namespace
+}  // namespace vantorel
