@@ -63,3 +63,12 @@ target_link_libraries(xpbutton_win32_tests PRIVATE vantorel_win32 vantorel_fakes
 add_test(NAME xpbutton_win32_tests COMMAND sh -c
     "export ${WINE_DISPLAY} && exec env ${WINE_ENV} wine '$<TARGET_FILE:xpbutton_win32_tests>' --gtest_brief=1")
 set_tests_properties(xpbutton_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;xvfb" TIMEOUT 300)
+
+# The push button's visual test bench. A test runs it on the private Xvfb, saves the gallery as an
+# image and a screenshot of the display under build/ (CI artifacts).
+add_executable(xpbutton-gallery src/platform/win32/xpbutton_gallery_main.cpp)
+target_link_libraries(xpbutton-gallery PRIVATE vantorel_win32)
+set(VANTOREL_ARTIFACTS ${CMAKE_SOURCE_DIR}/build)
+add_test(NAME xpbutton_gallery COMMAND sh -c
+    "export ${WINE_DISPLAY} && env ${WINE_ENV} wine '$<TARGET_FILE:xpbutton-gallery>' --save '${VANTOREL_ARTIFACTS}/xpbutton-gallery.bmp' && convert '${VANTOREL_ARTIFACTS}/xpbutton-gallery.bmp' '${VANTOREL_ARTIFACTS}/xpbutton-gallery.png'")
+set_tests_properties(xpbutton_gallery PROPERTIES FIXTURES_REQUIRED "wine;xvfb" TIMEOUT 300)
