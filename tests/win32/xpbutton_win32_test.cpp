@@ -9,12 +9,14 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <algorithm>
 #include <sstream>
 
 #include "controls/xpbutton/kirel_xp_button.h"
 #include "fakes/fake_button_host.h"
 #include "fakes/raster_canvas.h"
 #include "platform/win32/gdi_canvas.h"
+#include "platform/win32/gdi_picture.h"
 #include "platform/win32/xpbutton_window.h"
 
 namespace vantorel {
@@ -210,6 +212,122 @@ TEST(XPButtonWindow, MessagesBecomeEvents) {
     h.log.clear();
     h.Send(BM_CLICK);
     EXPECT_TRUE(h.log.empty());
+}
+
+// A parent that paints vertical stripes whose red channel is the column number, so copied pixels
+// tell where they were copied from.
+LRESULT CALLBACK StripesProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_ERASEBKGND) return 1;
+    if (message == WM_PAINT) {
+        PAINTSTRUCT ps;
+        HDC dc = ::BeginPaint(hwnd, &ps);
+        for (int x = 0; x < 256; ++x) {
+            HBRUSH brush = ::CreateSolidBrush(RGB(x, 0x40, 0x80));
+            RECT column{x, 0, x + 1, 200};
+            ::FillRect(dc, &column, brush);
+            ::DeleteObject(brush);
+        }
+        ::EndPaint(hwnd, &ps);
+        return 0;
+    }
+    return ::DefWindowProcA(hwnd, message, wParam, lParam);
+}
+
+TEST(XPButtonWindow, TransparentLookCopiesTheParentAtTheControlsPixelPosition) {
+    WNDCLASSA wc{};
+    wc.lpfnWndProc = StripesProc;
+    wc.hInstance = ::GetModuleHandleA(nullptr);
+    wc.lpszClassName = "XPButtonStripes";
+    ::RegisterClassA(&wc);
+    HWND parent = ::CreateWindowA("XPButtonStripes", "stripes", WS_POPUP | WS_VISIBLE, 0, 0, 256, 200, nullptr,
+                                  nullptr, wc.hInstance, nullptr);
+    ASSERT_NE(parent, nullptr);
+    ::UpdateWindow(parent);
+    {
+        win32::XPButtonWindow button;
+        ASSERT_TRUE(button.Create(parent, 1, 37, 20, 60, 30, ""));
+        button.button().SetButtonType(11);
+        button.Show();
+        Hosted::Pump();
+        // The copy starts at the control's left edge in pixels, whatever the container's units.
+        EXPECT_EQ(button.canvas().At(0, 15), static_cast<Rgb>(RGB(37, 0x40, 0x80)));
+        EXPECT_EQ(button.canvas().At(59, 15), static_cast<Rgb>(RGB(96, 0x40, 0x80)));
+        // The control has its height back.
+        RECT r;
+        ::GetClientRect(button.hwnd(), &r);
+        EXPECT_EQ(r.bottom, 30);
+        EXPECT_EQ(button.button().height(), 30);
+    }
+    ::DestroyWindow(parent);
+}
+
+TEST(XPButtonWindow, HoverFollowsTheRealPointer) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr);
+    h.button.events().MouseOver = [&] { h.log.push_back("MouseOver"); };
+    h.button.events().MOUSEOUT = [&] { h.log.push_back("MOUSEOUT"); };
+    RECT r;
+    ::GetWindowRect(h.button.hwnd(), &r);
+    ::SetCursorPos(r.left + 30, r.top + 20);
+    h.Send(WM_MOUSEMOVE, 0, MAKELPARAM(30, 20));
+    EXPECT_TRUE(h.button.button().hovering());
+    // Pointer elsewhere: the hover timer (3 ms) notices without any message from the platform.
+    ::SetCursorPos(r.right + 200, r.bottom + 100);
+    for (int i = 0; i < 100 && h.button.button().hovering(); ++i) {
+        ::Sleep(10);
+        Hosted::Pump();
+    }
+    EXPECT_FALSE(h.button.button().hovering());
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseOver", "MOUSEOUT"}));
+}
+
+TEST(XPButtonWindow, AccessKeyThroughIsDialogMessage) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr);
+    h.button.button().SetCaption("E&xit");
+    ::SetFocus(h.parent);
+    MSG msg{};
+    msg.hwnd = h.parent;
+    msg.message = WM_SYSCHAR;
+    msg.wParam = 'x';
+    msg.lParam = 1 << 29;  // Alt held
+    EXPECT_TRUE(::IsDialogMessageA(h.parent, &msg));
+    Hosted::Pump();
+    EXPECT_EQ(std::count(h.log.begin(), h.log.end(), "Click"), 1);
+}
+
+TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
+    // A 2 × 1 bitmap: red, then green.
+    HDC screen = ::GetDC(nullptr);
+    HBITMAP bitmap = ::CreateCompatibleBitmap(screen, 2, 1);
+    HDC dc = ::CreateCompatibleDC(screen);
+    HGDIOBJ old = ::SelectObject(dc, bitmap);
+    ::SetPixelV(dc, 0, 0, RGB(255, 0, 0));
+    ::SetPixelV(dc, 1, 0, RGB(0, 255, 0));
+    ::SelectObject(dc, old);
+    ::DeleteDC(dc);
+    ::ReleaseDC(nullptr, screen);
+    auto picture = win32::GdiPicture::FromBitmap(bitmap);
+    ASSERT_NE(picture, nullptr);
+    EXPECT_EQ(picture->Kind(), platform::PictureKind::kBitmap);
+    std::vector<std::uint8_t> px;
+    ASSERT_TRUE(picture->Render(2, 1, 0xC0C0C0, px));
+    EXPECT_EQ(px.size(), 8u);
+    EXPECT_EQ((std::vector<int>{px[0], px[1], px[2], px[3], px[4], px[5]}), (std::vector<int>{0, 0, 255, 0, 255, 0}));
+
+    // A 32 × 32 icon whose mask leaves the left half transparent: those pixels take the fill.
+    std::vector<std::uint8_t> andMask(32 * 4, 0), xorMask(32 * 4, 0);
+    for (int row = 0; row < 32; ++row) andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
+    HICON icon = ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data());
+    auto iconPicture = win32::GdiPicture::FromIcon(icon);
+    ASSERT_NE(iconPicture, nullptr);
+    EXPECT_EQ(iconPicture->Kind(), platform::PictureKind::kIcon);
+    EXPECT_EQ(iconPicture->HimetricWidth(), 847);  // 32 pixels at 96 dpi
+    ASSERT_TRUE(iconPicture->Render(32, 32, 0x00FF00FF, px));
+    const std::size_t stride = platform::DibStride(32);
+    EXPECT_EQ((std::vector<int>{px[0], px[1], px[2]}), (std::vector<int>{0xFF, 0x00, 0xFF}));  // transparent
+    const std::uint8_t* right = px.data() + 5 * stride + 20 * 3;
+    EXPECT_EQ((std::vector<int>{right[0], right[1], right[2]}), (std::vector<int>{0, 0, 0}));  // black
 }
 
 }  // namespace

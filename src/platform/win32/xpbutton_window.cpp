@@ -171,7 +171,9 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
             if (b == 1) doubleClicked_ = false;
             return 0;
         }
-        case WM_GETDLGCODE: return DLGC_WANTARROWS | (default_ ? DLGC_DEFPUSHBUTTON : DLGC_UNDEFPUSHBUTTON);
+        case WM_GETDLGCODE:
+            // DLGC_BUTTON lets IsDialogMessage send BM_CLICK for the access key in the window text.
+            return DLGC_WANTARROWS | DLGC_BUTTON | (default_ ? DLGC_DEFPUSHBUTTON : DLGC_UNDEFPUSHBUTTON);
         case WM_KEYDOWN: button_->OnKeyDown(static_cast<std::int16_t>(wParam), ShiftState()); return 0;
         case WM_KEYUP: button_->OnKeyUp(static_cast<std::int16_t>(wParam), ShiftState()); return 0;
         case WM_CHAR: button_->OnKeyPress(static_cast<std::int16_t>(wParam)); return 0;
