@@ -70,5 +70,5 @@ add_executable(xpbutton-gallery src/platform/win32/xpbutton_gallery_main.cpp)
 target_link_libraries(xpbutton-gallery PRIVATE vantorel_win32)
 set(VANTOREL_ARTIFACTS ${CMAKE_SOURCE_DIR}/build)
 add_test(NAME xpbutton_gallery COMMAND sh -c
-    "export ${WINE_DISPLAY} && env ${WINE_ENV} wine '$<TARGET_FILE:xpbutton-gallery>' --save '${VANTOREL_ARTIFACTS}/xpbutton-gallery.bmp' && convert '${VANTOREL_ARTIFACTS}/xpbutton-gallery.bmp' '${VANTOREL_ARTIFACTS}/xpbutton-gallery.png'")
+    "export ${WINE_DISPLAY} ${WINE_ENV} && '${CMAKE_SOURCE_DIR}/scripts/xpbutton-gallery-shot' '$<TARGET_FILE:xpbutton-gallery>' '${VANTOREL_ARTIFACTS}'")
 set_tests_properties(xpbutton_gallery PROPERTIES FIXTURES_REQUIRED "wine;xvfb" TIMEOUT 300)

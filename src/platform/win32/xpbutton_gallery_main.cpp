@@ -5,10 +5,13 @@
 // custom one, each drawn by a real control on its own GDI back buffer.
 //
 //   xpbutton-gallery.exe                 shows the gallery
-//   xpbutton-gallery.exe --save FILE     also writes the gallery as a 24-bit .bmp and exits
+//   xpbutton-gallery.exe --save FILE [--hold MS]
+//                                        also writes the gallery as a 24-bit .bmp, then stays up
+//                                        MS milliseconds (for a screenshot) and exits
 #include <windows.h>
 
 #include <cstdio>
+#include <cstdlib>
 #include <memory>
 #include <string>
 #include <vector>
@@ -364,8 +367,10 @@ private:
 
 int main(int argc, char** argv) {
     std::string savePath;
+    DWORD holdMs = 0;
     for (int i = 1; i + 1 < argc; ++i) {
         if (std::string(argv[i]) == "--save") savePath = argv[i + 1];
+        if (std::string(argv[i]) == "--hold") holdMs = static_cast<DWORD>(std::strtoul(argv[i + 1], nullptr, 10));
     }
     Gallery gallery;
     if (!gallery.Create(::GetModuleHandleA(nullptr))) {
@@ -382,6 +387,14 @@ int main(int argc, char** argv) {
         const bool saved = gallery.Save(savePath);
         std::printf("xpbutton-gallery: %s %s\n", saved ? "saved" : "could not save", savePath.c_str());
         std::fflush(stdout);
+        const DWORD until = ::GetTickCount() + holdMs;
+        while (saved && static_cast<LONG>(until - ::GetTickCount()) > 0) {
+            ::MsgWaitForMultipleObjects(0, nullptr, FALSE, until - ::GetTickCount(), QS_ALLINPUT);
+            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+                ::TranslateMessage(&msg);
+                ::DispatchMessageA(&msg);
+            }
+        }
         ::DestroyWindow(gallery.hwnd());
         return saved ? 0 : 1;
     }
