@@ -463,6 +463,23 @@ TEST(XPButtonPictures, BlitPictureRules) {
     EXPECT_EQ(l.At(1, 5), 0x00FF00u);
 }
 
+TEST(XPButtonPictures, HimetricSizeRoundsHalvesToEven) {
+    // At 127 dpi one pixel is 20 HIMETRIC: 50 → 2.5 → 2, 70 → 3.5 → 4, 61 → 3.05 → 3.
+    Look l(2);
+    l.host.dpi = 127;
+    auto sized = [&](std::int32_t hw, std::int32_t hh) {
+        auto picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 1, 1, std::vector<Rgb>{0});
+        picture->SetHimetric(hw, hh);
+        l.button.SetPictureNormal(picture);
+        return std::pair{l.button.pictureRect().width, l.button.pictureRect().height};
+    };
+    EXPECT_EQ(sized(50, 70), (std::pair{2, 4}));
+    EXPECT_EQ(sized(61, 0), (std::pair{3, 0}));
+    l.button.SetPictureNormal(nullptr);
+    EXPECT_EQ(l.button.pictureRect().width, 0);
+    EXPECT_EQ(l.button.pictureRect().height, 0);
+}
+
 TEST(XPButtonPictures, PictureByStateAndEffects) {
     // A 2 × 2 black square with a key-coloured corner on a 40 × 20 classic button.
     Look l(2, 40, 20, 3);
@@ -497,6 +514,13 @@ TEST(XPButtonPictures, PictureByStateAndEffects) {
     EXPECT_EQ(l.At(r.x + 2, r.y + 2), S(p.FaceColor, -40));
     EXPECT_EQ(l.At(r.x, r.y - 1), S(p.FaceColor, 40));
     EXPECT_EQ(l.At(r.x + 1, r.y), 0u);
+    // Sunken: the lighter copy below-right; drop shadow: only the darker copy below-right.
+    l.button.SetSpecialEffect(2);
+    EXPECT_EQ(l.At(r.x + 2, r.y + 2), S(p.FaceColor, 40));
+    EXPECT_EQ(l.At(r.x, r.y - 1), S(p.FaceColor, -40));
+    l.button.SetSpecialEffect(3);
+    EXPECT_EQ(l.At(r.x + 2, r.y + 2), S(p.FaceColor, -40));
+    EXPECT_EQ(l.At(r.x, r.y - 1), p.FaceColor);
     // Caption effect copies: sunken puts the lighter copy below-right, then the text.
     l.button.SetCaption("Go");
     l.button.SetSpecialEffect(2);

@@ -88,6 +88,10 @@ public:
     std::int32_t HimetricWidth() const override { return himetricW_; }
     std::int32_t HimetricHeight() const override { return himetricH_; }
     bool Render(std::int32_t w, std::int32_t h, platform::Rgb fill, std::vector<std::uint8_t>& pixels) const override;
+    void SetHimetric(std::int32_t w, std::int32_t h) {
+        himetricW_ = w;
+        himetricH_ = h;
+    }
     mutable int renders = 0;
 
 private:

@@ -5,6 +5,7 @@
 // custom one, each drawn by a real control on its own GDI back buffer.
 //
 //   xpbutton-gallery.exe                 shows the gallery
+//   xpbutton-gallery.exe --bench         prints GDI paint times of every look and exits
 //   xpbutton-gallery.exe --save FILE [--hold MS]
 //                                        also writes the gallery as a 24-bit .bmp, then stays up
 //                                        MS milliseconds (for a screenshot) and exits
@@ -45,7 +46,7 @@ constexpr Rgb kOffColour = 0x000080;  // dark red "OFF"
 class CellHost final : public vantorel::platform::ButtonHost {
 public:
     std::intptr_t Handle() const override { return 0; }
-    Box ClientRect() const override { return {0, 0, kCellW, kCellH}; }
+    Box ClientRect() const override { return {0, 0, width, height}; }
     void SetEnabled(bool) override {}
     void SetFont(const vantorel::platform::FontDesc&) override {}
     void SetMousePointer(std::int32_t) override {}
@@ -81,8 +82,43 @@ public:
     Rgb SystemColour(int index) const override { return ::GetSysColor(index); }
 
     bool pointerOver = false;
+    int width = kCellW;
+    int height = kCellH;
     vantorel::platform::WindowShape shape;
 };
+
+// Times painting on the GDI back buffer: one full (forced) paint of a 160 × 270 button of each
+// look, and an unforced repaint with nothing changed.
+void RunPaintBenchmark() {
+    LARGE_INTEGER frequency;
+    ::QueryPerformanceFrequency(&frequency);
+    auto now = [] {
+        LARGE_INTEGER t;
+        ::QueryPerformanceCounter(&t);
+        return t.QuadPart;
+    };
+    for (int type = 1; type <= 15; ++type) {
+        CellHost host;
+        host.width = 160;
+        host.height = 270;
+        GdiCanvas canvas;
+        KirelXPButton button(host, canvas);
+        button.InitNewControl();
+        button.OnResize();
+        button.OnShow();
+        button.SetButtonType(type == 15 ? 3 : type);
+        const int rounds = type == 15 ? 1000000 : 200;
+        const auto start = now();
+        for (int i = 0; i < rounds; ++i) button.Paint(0, type != 15);
+        const double us = static_cast<double>(now() - start) * 1e6 / static_cast<double>(frequency.QuadPart) / rounds;
+        if (type == 15) {
+            std::printf("unforced repaint, nothing changed: %.4f us\n", us);
+        } else {
+            std::printf("ButtonType %2d full paint 160 x 270: %8.1f us\n", type, us);
+        }
+    }
+    std::fflush(stdout);
+}
 
 struct Cell {
     int x = 0;
@@ -366,6 +402,12 @@ private:
 }  // namespace
 
 int main(int argc, char** argv) {
+    for (int i = 1; i < argc; ++i) {
+        if (std::string(argv[i]) == "--bench") {
+            RunPaintBenchmark();
+            return 0;
+        }
+    }
     std::string savePath;
     DWORD holdMs = 0;
     for (int i = 1; i + 1 < argc; ++i) {
