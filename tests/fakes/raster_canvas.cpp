@@ -57,7 +57,8 @@ void RasterCanvas::FrameBox(std::int32_t x, std::int32_t y, std::int32_t w, std:
 }
 
 // Bresenham's line as GDI draws it with a one-pixel cosmetic pen: the major axis steps every
-// pixel, the minor axis steps when the error passes the half, the last point is left out.
+// pixel, the minor axis steps when the error passes the half, and at exactly the half only when
+// the minor axis runs toward negative coordinates; the last point is left out.
 void RasterCanvas::DrawLine(std::int32_t x1, std::int32_t y1, std::int32_t x2, std::int32_t y2, Rgb c) {
     ++drawCalls;
     const std::int32_t dx = std::abs(x2 - x1);
@@ -69,7 +70,7 @@ void RasterCanvas::DrawLine(std::int32_t x1, std::int32_t y1, std::int32_t x2, s
         std::int32_t y = y1;
         for (std::int32_t x = x1, n = 0; n < dx; ++n, x += sx) {
             Set(x, y, c);
-            if (err > 0 || (err == 0 && sx < 0)) {
+            if (err > 0 || (err == 0 && sy < 0)) {
                 y += sy;
                 err -= 2 * dx;
             }
@@ -80,7 +81,7 @@ void RasterCanvas::DrawLine(std::int32_t x1, std::int32_t y1, std::int32_t x2, s
         std::int32_t x = x1;
         for (std::int32_t y = y1, n = 0; n < dy; ++n, y += sy) {
             Set(x, y, c);
-            if (err > 0) {
+            if (err > 0 || (err == 0 && sx < 0)) {
                 x += sx;
                 err -= 2 * dy;
             }

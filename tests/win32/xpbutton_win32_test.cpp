@@ -111,6 +111,33 @@ TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
     }
 }
 
+TEST(XPButtonGdi, RasterPrimitivesMatchGdi) {
+    // Lines from the centre to every point of a square around it (all octants, ties included),
+    // frames, fills and pixels, clipped at the edges.
+    RasterCanvas raster;
+    win32::GdiCanvas gdi;
+    raster.Resize(31, 31);
+    gdi.Resize(31, 31);
+    for (platform::Canvas* c : {static_cast<platform::Canvas*>(&raster), static_cast<platform::Canvas*>(&gdi)}) {
+        c->FillBox(0, 0, 31, 31, 0xFFFFFF);
+        c->FillBox(-3, 25, 8, 20, 0x00FF00);
+        c->FrameBox(20, -2, 14, 9, 0xFF0000);
+        c->PutPixel(30, 30, 0x0000FF);
+    }
+    for (int i = -6; i <= 6; ++i) {
+        for (auto [x, y] : {std::pair{i, -6}, std::pair{i, 6}, std::pair{-6, i}, std::pair{6, i}}) {
+            raster.FillBox(0, 0, 31, 31, 0xFFFFFF);
+            gdi.FillBox(0, 0, 31, 31, 0xFFFFFF);
+            raster.DrawLine(15, 15, 15 + x, 15 + y, 0);
+            gdi.DrawLine(15, 15, 15 + x, 15 + y, 0);
+            int differ = 0;
+            for (int py = 0; py < 31; ++py)
+                for (int px = 0; px < 31; ++px) differ += raster.At(px, py) != gdi.At(px, py);
+            EXPECT_EQ(differ, 0) << "line to (" << x << ", " << y << ")";
+        }
+    }
+}
+
 // A top-level window holding one button, on the private display.
 struct Hosted {
     HWND parent = nullptr;
