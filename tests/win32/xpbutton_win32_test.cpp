@@ -323,6 +323,44 @@ TEST(XPButtonWindow, AccessKeyThroughIsDialogMessage) {
     EXPECT_EQ(std::count(h.log.begin(), h.log.end(), "Click"), 1);
 }
 
+TEST(XPButtonWindow, ArrowKeysMoveTheFocusThroughInjectedTabs) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr);
+    win32::XPButtonWindow second;
+    ASSERT_TRUE(second.Create(h.parent, 2, 20, 80, 120, 40, "Second"));
+    second.Show();
+    ::SetForegroundWindow(h.parent);
+    ::SetFocus(h.button.hwnd());
+    ASSERT_EQ(::GetFocus(), h.button.hwnd());
+    auto pumpDialog = [&] {
+        MSG msg;
+        for (int i = 0; i < 50; ++i) {
+            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+                if (!::IsDialogMessageA(h.parent, &msg)) {
+                    ::TranslateMessage(&msg);
+                    ::DispatchMessageA(&msg);
+                }
+            }
+            ::Sleep(5);
+        }
+    };
+    // Right arrow: KeyDown first, then Tab is queued and moves the focus to the next control.
+    std::vector<std::string> keys;
+    h.button.events().KeyDown = [&](std::int16_t& k, std::int16_t&) { keys.push_back("KeyDown " + std::to_string(k)); };
+    h.Send(WM_KEYDOWN, VK_RIGHT);
+    EXPECT_EQ(keys, std::vector<std::string>{"KeyDown 39"});
+    EXPECT_EQ(::GetFocus(), h.button.hwnd());  // the injected keys wait in the queue
+    pumpDialog();
+    EXPECT_EQ(::GetFocus(), second.hwnd());
+    EXPECT_FALSE(h.button.button().hasFocus());
+    EXPECT_TRUE(second.button().hasFocus());
+    // Up arrow on the second: Shift+Tab back to the first.
+    ::SendMessageA(second.hwnd(), WM_KEYDOWN, VK_UP, 0);
+    pumpDialog();
+    EXPECT_EQ(::GetFocus(), h.button.hwnd());
+    second.Destroy();
+}
+
 TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
     // A 2 × 1 bitmap: red, then green.
     HDC screen = ::GetDC(nullptr);
