@@ -312,9 +312,15 @@ bool XPButtonWindow::CaptureParentPixels(std::int32_t w, std::int32_t h, std::ve
     ::RedrawWindow(parent_, nullptr, nullptr, RDW_INVALIDATE | RDW_UPDATENOW | RDW_ALLCHILDREN);
     MSG msg;
     while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+        if (msg.message == WM_QUIT) {
+            // Leave the quit request for the application's own loop.
+            ::PostQuitMessage(static_cast<int>(msg.wParam));
+            break;
+        }
         ::TranslateMessage(&msg);
         ::DispatchMessageA(&msg);
     }
+    if (!hwnd_) return false;  // destroyed while the messages ran
     bool copied = false;
     {
         WindowDc parentDc(parent_);
