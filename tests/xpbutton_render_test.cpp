@@ -336,6 +336,27 @@ TEST(XPButtonLooks, SpecialLooksAndStates) {
         EXPECT_GE(l.host.backgroundCaptures, 1);
     }
     {
+        // A resize arriving while the background is captured is ignored; Refresh captures again.
+        Look l(11);
+        const int captures = l.host.backgroundCaptures;
+        l.host.duringCapture = [&] {
+            l.host.height = 0;
+            l.button.OnResize();
+        };
+        l.button.Refresh();
+        EXPECT_EQ(l.host.backgroundCaptures, captures + 1);
+        EXPECT_EQ(l.button.height(), 20);
+        EXPECT_EQ(l.At(5, 5), l.host.parentPixel);
+        l.host.duringCapture = nullptr;
+        l.host.height = 20;
+        // A show captures again; a hidden control does not capture when its type is set.
+        l.button.OnHide();
+        l.button.SetButtonType(11);
+        EXPECT_EQ(l.host.backgroundCaptures, captures + 1);
+        l.button.OnShow();
+        EXPECT_EQ(l.host.backgroundCaptures, captures + 2);
+    }
+    {
         Look l(13);
         ASSERT_EQ(l.canvas.ovals.size(), 1u);
         EXPECT_EQ(l.canvas.ovals[0].pen, l.p().FaceColor);

@@ -2,6 +2,7 @@
 // (notifications, shapes, timers, keys, presents) and answers from settable fields.
 #pragma once
 
+#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -75,6 +76,8 @@ public:
     platform::Rgb parentText = 0x00112233;
     platform::Rgb parentPixel = 0x00336699;
     int backgroundCaptures = 0;
+    // Runs inside CaptureParentPixels, as pending window messages would.
+    std::function<void()> duringCapture;
     std::map<int, platform::Rgb> systemColours;
 };
 
