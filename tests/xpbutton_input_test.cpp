@@ -432,8 +432,14 @@ TEST(XPButtonInput, FocusAndLifecycle) {
     f.button.OnAmbientChanged();
     EXPECT_EQ(f.button.palette().FaceColor, 0x123456u);
 
+    // Terminating releases the shape, stops the hover timer and stops painting.
+    f.host.pointerOver = true;
+    f.button.OnMouseMove(0, 0, 1, 1);
+    ASSERT_TRUE(f.host.timerRunning);
     f.button.OnTerminate();
     EXPECT_EQ(f.host.shapesReleased, f.host.shapesSet);
+    EXPECT_FALSE(f.host.timerRunning);
+    EXPECT_FALSE(f.button.paintingEnabled());
 }
 
 TEST(XPButtonInput, AccessKeyParsing) {

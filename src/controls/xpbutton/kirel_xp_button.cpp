@@ -354,7 +354,7 @@ void KirelXPButton::OnTerminate() {
     paintingEnabled_ = false;
     if (hasShape_) host_.ReleaseShape();
     hasShape_ = false;
-    if (buttonType_ == 11 || hover_) host_.StopOverTimer();
+    if (hover_) host_.StopOverTimer();
     hover_ = false;
     background_.clear();
     hasBackground_ = false;
