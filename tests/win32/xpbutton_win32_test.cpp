@@ -1,7 +1,7 @@
 // The push button on real GDI and in a real window, under Wine on a private Xvfb.
 // - The GDI canvas and the raster canvas draw the same pixels for every look's solid parts in
-//   every state and two colour schemes (the captions are empty so no text is drawn; the oval look
-//   is left out since ellipse pixels are the platform's).
+//   every state and two colour schemes (the captions are empty so no text is drawn; of the oval
+//   look only the corners outside the ellipse, whose pixels are the platform's).
 // - The window class turns real mouse and key messages into the control's events: one Click per
 //   click, none for the right button, one for a double click, one for the access key.
 #include <windows.h>
@@ -57,11 +57,15 @@ struct Pair {
         f(b, gdiHost);
     }
     // Describes the first few differing pixels, empty when the surfaces agree.
-    std::string Differences() const {
+    // For the oval look only the corners outside the ellipse are compared.
+    std::string Differences(bool cornersOnly = false) const {
         std::ostringstream out;
         int count = 0;
-        for (int y = 0; y < raster.height(); ++y)
-            for (int x = 0; x < raster.width(); ++x) {
+        const int w = raster.width();
+        const int h = raster.height();
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x) {
+                if (cornersOnly && !((x == 0 || x == w - 1) && (y == 0 || y == h - 1))) continue;
                 const Rgb want = raster.At(x, y);
                 const Rgb got = gdi.At(x, y);
                 if (want != got && count++ < 6) out << "(" << x << "," << y << ") raster " << std::hex << want
@@ -78,7 +82,6 @@ TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
         std::vector<Rgb>{0xC0C0C0, 0x000000, 0x0000FF, 0x404040, 0xFFFFFF, 0x00FF00, 0x808081, 0x123456, 0xC0C0C0});
     for (int scheme : {2, 3}) {
         for (int type = 1; type <= 14; ++type) {
-            if (type == 13) continue;
             for (int state = 0; state < 5; ++state) {
                 for (bool withPicture : {false, true}) {
                     Pair p(type, scheme, 37, 23);
@@ -103,7 +106,7 @@ TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
                                 break;
                         }
                     });
-                    EXPECT_EQ(p.Differences(), "") << "type " << type << " scheme " << scheme << " state " << state
+                    EXPECT_EQ(p.Differences(type == 13), "") << "type " << type << " scheme " << scheme << " state " << state
                                                    << (withPicture ? " with picture" : "");
                 }
             }
