@@ -12,6 +12,8 @@ add_executable(vantorel_tests
     tests/frm_options_test.cpp
     tests/read_definitions_test.cpp
     tests/registry_routines_test.cpp
+    tests/xpbutton_input_test.cpp
+    tests/xpbutton_render_test.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )
@@ -23,4 +25,6 @@ if(NOT VANTOREL_SANITIZE)
     find_package(benchmark REQUIRED)
     add_executable(definitions_bench bench/definitions_bench.cpp)
     target_link_libraries(definitions_bench PRIVATE vantorel_native benchmark::benchmark)
+    add_executable(xpbutton_bench bench/xpbutton_bench.cpp)
+    target_link_libraries(xpbutton_bench PRIVATE vantorel_fakes benchmark::benchmark)
 endif()

@@ -1,0 +1,52 @@
+// Owners for the GDI objects the button's drawing creates, and a guard that selects an object into
+// a device context and puts the previous one back. Declare the object before its selection guard,
+// so it is deselected before it is deleted.
+#pragma once
+
+#include <windows.h>
+
+#include "platform/win32/unique_handle.h"
+
+namespace vantorel::win32 {
+
+inline void DeleteGdiObject(HGDIOBJ object) { ::DeleteObject(object); }
+
+using UniqueHbrush = UniqueHandle<NullInvalid<HBRUSH, DeleteGdiObject>>;
+using UniqueHpen = UniqueHandle<NullInvalid<HPEN, DeleteGdiObject>>;
+using UniqueHfont = UniqueHandle<NullInvalid<HFONT, DeleteGdiObject>>;
+using UniqueHbitmap = UniqueHandle<NullInvalid<HBITMAP, DeleteGdiObject>>;
+using UniqueHrgn = UniqueHandle<NullInvalid<HRGN, DeleteGdiObject>>;
+using UniqueHdc = UniqueHandle<NullInvalid<HDC, ::DeleteDC>>;
+using UniqueHicon = UniqueHandle<NullInvalid<HICON, ::DestroyIcon>>;
+
+class SelectGuard {
+public:
+    SelectGuard(HDC dc, HGDIOBJ object) : dc_(dc), previous_(object ? ::SelectObject(dc, object) : nullptr) {}
+    SelectGuard(const SelectGuard&) = delete;
+    SelectGuard& operator=(const SelectGuard&) = delete;
+    ~SelectGuard() {
+        if (previous_) ::SelectObject(dc_, previous_);
+    }
+
+private:
+    HDC dc_;
+    HGDIOBJ previous_;
+};
+
+// A screen DC obtained with GetDC and released on scope exit.
+class WindowDc {
+public:
+    explicit WindowDc(HWND hwnd) : hwnd_(hwnd), dc_(::GetDC(hwnd)) {}
+    WindowDc(const WindowDc&) = delete;
+    WindowDc& operator=(const WindowDc&) = delete;
+    ~WindowDc() {
+        if (dc_) ::ReleaseDC(hwnd_, dc_);
+    }
+    HDC get() const { return dc_; }
+
+private:
+    HWND hwnd_;
+    HDC dc_;
+};
+
+}  // namespace vantorel::win32

@@ -1,0 +1,402 @@
+// The push button on real GDI and in a real window, under Wine on a private Xvfb.
+// - The GDI canvas and the raster canvas draw the same pixels for every look's solid parts in
+//   every state and two colour schemes (the captions are empty so no text is drawn; of the oval
+//   look only the corners outside the ellipse, whose pixels are the platform's).
+// - The window class turns real mouse and key messages into the control's events: one Click per
+//   click, none for the right button, one for a double click, one for the access key.
+#include <windows.h>
+
+#include <gtest/gtest.h>
+
+#include <memory>
+#include <algorithm>
+#include <sstream>
+
+#include "controls/xpbutton/kirel_xp_button.h"
+#include "fakes/fake_button_host.h"
+#include "fakes/raster_canvas.h"
+#include "platform/win32/gdi_canvas.h"
+#include "platform/win32/gdi_picture.h"
+#include "platform/win32/xpbutton_window.h"
+
+namespace vantorel {
+namespace {
+
+using testing::FakeButtonHost;
+using testing::MemoryPicture;
+using testing::RasterCanvas;
+using xpbutton::KirelXPButton;
+using xpbutton::Rgb;
+
+struct Pair {
+    FakeButtonHost rasterHost, gdiHost;
+    RasterCanvas raster;
+    win32::GdiCanvas gdi;
+    KirelXPButton a{rasterHost, raster};
+    KirelXPButton b{gdiHost, gdi};
+
+    Pair(int type, int scheme, int w, int h) {
+        for (FakeButtonHost* host : {&rasterHost, &gdiHost}) {
+            host->width = w;
+            host->height = h;
+            host->name = "";
+        }
+        for (KirelXPButton* k : {&a, &b}) {
+            k->InitNewControl();
+            k->OnResize();
+            k->SetColorScheme(scheme);
+            k->SetBackColor(0x3080C0);
+            k->SetBackOver(0x30C080);
+            k->OnShow();
+            k->SetButtonType(type);
+        }
+    }
+    template <typename F>
+    void Both(F f) {
+        f(a, rasterHost);
+        f(b, gdiHost);
+    }
+    // Describes the first few differing pixels, empty when the surfaces agree.
+    // For the oval look only the corners outside the ellipse are compared.
+    std::string Differences(bool cornersOnly = false) const {
+        std::ostringstream out;
+        int count = 0;
+        const int w = raster.width();
+        const int h = raster.height();
+        for (int y = 0; y < h; ++y)
+            for (int x = 0; x < w; ++x) {
+                if (cornersOnly && !((x == 0 || x == w - 1) && (y == 0 || y == h - 1))) continue;
+                const Rgb want = raster.At(x, y);
+                const Rgb got = gdi.At(x, y);
+                if (want != got && count++ < 6) out << "(" << x << "," << y << ") raster " << std::hex << want
+                                                    << " gdi " << got << std::dec << "; ";
+            }
+        if (count) out << count << " pixels differ";
+        return out.str();
+    }
+};
+
+TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
+    auto picture = std::make_shared<MemoryPicture>(
+        platform::PictureKind::kBitmap, 3, 3,
+        std::vector<Rgb>{0xC0C0C0, 0x000000, 0x0000FF, 0x404040, 0xFFFFFF, 0x00FF00, 0x808081, 0x123456, 0xC0C0C0});
+    for (int scheme : {2, 3}) {
+        for (int type = 1; type <= 14; ++type) {
+            for (int state = 0; state < 5; ++state) {
+                for (bool withPicture : {false, true}) {
+                    Pair p(type, scheme, 37, 23);
+                    if (withPicture) {
+                        p.Both([&](KirelXPButton& k, FakeButtonHost&) {
+                            k.SetPictureNormal(picture);
+                            k.SetSpecialEffect(1);
+                        });
+                    }
+                    p.Both([&](KirelXPButton& k, FakeButtonHost& host) {
+                        switch (state) {
+                            case 0: k.Paint(0, true); break;
+                            case 1:
+                                host.pointerOver = true;
+                                k.OnMouseMove(0, 0, 1, 1);
+                                break;
+                            case 2: k.OnMouseDown(1, 0, 1, 1); break;
+                            case 3: k.SetEnabled(false); break;
+                            case 4:
+                                host.isDefault = true;
+                                k.Paint(0, true);
+                                break;
+                        }
+                    });
+                    EXPECT_EQ(p.Differences(type == 13), "") << "type " << type << " scheme " << scheme << " state " << state
+                                                   << (withPicture ? " with picture" : "");
+                }
+            }
+        }
+    }
+}
+
+TEST(XPButtonGdi, RasterPrimitivesMatchGdi) {
+    // Lines from the centre to every point of a square around it (all octants, ties included),
+    // frames, fills and pixels, clipped at the edges.
+    RasterCanvas raster;
+    win32::GdiCanvas gdi;
+    raster.Resize(31, 31);
+    gdi.Resize(31, 31);
+    for (platform::Canvas* c : {static_cast<platform::Canvas*>(&raster), static_cast<platform::Canvas*>(&gdi)}) {
+        c->FillBox(0, 0, 31, 31, 0xFFFFFF);
+        c->FillBox(-3, 25, 8, 20, 0x00FF00);
+        c->FrameBox(20, -2, 14, 9, 0xFF0000);
+        c->PutPixel(30, 30, 0x0000FF);
+    }
+    for (int i = -6; i <= 6; ++i) {
+        for (auto [x, y] : {std::pair{i, -6}, std::pair{i, 6}, std::pair{-6, i}, std::pair{6, i}}) {
+            raster.FillBox(0, 0, 31, 31, 0xFFFFFF);
+            gdi.FillBox(0, 0, 31, 31, 0xFFFFFF);
+            raster.DrawLine(15, 15, 15 + x, 15 + y, 0);
+            gdi.DrawLine(15, 15, 15 + x, 15 + y, 0);
+            int differ = 0;
+            for (int py = 0; py < 31; ++py)
+                for (int px = 0; px < 31; ++px) differ += raster.At(px, py) != gdi.At(px, py);
+            EXPECT_EQ(differ, 0) << "line to (" << x << ", " << y << ")";
+        }
+    }
+}
+
+// A top-level window holding one button, on the private display.
+struct Hosted {
+    HWND parent = nullptr;
+    win32::XPButtonWindow button;
+    std::vector<std::string> log;
+
+    Hosted() {
+        WNDCLASSA wc{};
+        wc.lpfnWndProc = ::DefWindowProcA;
+        wc.hInstance = ::GetModuleHandleA(nullptr);
+        wc.lpszClassName = "XPButtonTestParent";
+        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
+        ::RegisterClassA(&wc);
+        parent = ::CreateWindowA("XPButtonTestParent", "XPButton test", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 10, 10, 300,
+                                 200, nullptr, nullptr, wc.hInstance, nullptr);
+        if (!parent || !button.Create(parent, 1, 20, 20, 120, 40, "BtnOnOff")) return;
+        button.events().Click = [this] { log.push_back("Click"); };
+        button.events().MouseDown = [this](std::int16_t& b, std::int16_t&, float&, float&) {
+            log.push_back("MouseDown " + std::to_string(b));
+        };
+        button.events().MouseUp = [this](std::int16_t& b, std::int16_t&, float&, float&) {
+            log.push_back("MouseUp " + std::to_string(b));
+        };
+        button.Show();
+        Pump();
+    }
+    ~Hosted() {
+        button.Destroy();
+        if (parent) ::DestroyWindow(parent);
+    }
+    static void Pump() {
+        MSG msg;
+        while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            ::TranslateMessage(&msg);
+            ::DispatchMessageA(&msg);
+        }
+    }
+    void Send(UINT message, WPARAM wParam = 0, LPARAM lParam = MAKELPARAM(10, 10)) {
+        ::SendMessageA(button.hwnd(), message, wParam, lParam);
+    }
+};
+
+TEST(XPButtonWindow, MessagesBecomeEvents) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr) << "no display";
+    ASSERT_NE(h.button.hwnd(), nullptr);
+    // Shown: the back buffer holds the new control's look (ButtonType 3, blue border).
+    EXPECT_EQ(h.button.canvas().At(0, 10), 0x733C00u);
+    // The window shape has the rounded corners: (0, 0) is outside, (2, 0) inside.
+    HRGN region = ::CreateRectRgn(0, 0, 0, 0);
+    ASSERT_NE(::GetWindowRgn(h.button.hwnd(), region), ERROR);
+    EXPECT_FALSE(::PtInRegion(region, 0, 0));
+    EXPECT_TRUE(::PtInRegion(region, 2, 0));
+    ::DeleteObject(region);
+
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    EXPECT_EQ(h.button.button().lastState(), 2);
+    h.Send(WM_LBUTTONUP);
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click"}));
+
+    h.log.clear();
+    h.Send(WM_RBUTTONDOWN, MK_RBUTTON);
+    h.Send(WM_RBUTTONUP);
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 2", "MouseUp 2"}));
+
+    // A double click: down, up, double-click, up gives one Click.
+    h.log.clear();
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    h.Send(WM_LBUTTONUP);
+    h.Send(WM_LBUTTONDBLCLK, MK_LBUTTON);
+    h.Send(WM_LBUTTONUP);
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}));
+
+    // A release outside the control raises MouseUp but no Click.
+    h.log.clear();
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    h.Send(WM_LBUTTONUP, 0, MAKELPARAM(500, 10));
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1"}));
+
+    // The two-state switch: space toggles Value before Click; BM_CLICK is the access key path.
+    h.button.button().SetCheckBoxBehaviour(true);
+    h.log.clear();
+    h.Send(WM_KEYDOWN, VK_SPACE);
+    h.Send(WM_KEYUP, VK_SPACE);
+    EXPECT_TRUE(h.button.button().Value());
+    h.Send(BM_CLICK);
+    EXPECT_FALSE(h.button.button().Value());
+    EXPECT_EQ(h.log, (std::vector<std::string>{"Click", "Click"}));
+
+    // The caption becomes the window text (for IsDialogMessage's access keys).
+    h.button.button().SetCaption("&On");
+    char text[32] = {};
+    ::GetWindowTextA(h.button.hwnd(), text, sizeof text);
+    EXPECT_STREQ(text, "&On");
+
+    // Disabled: the window is disabled and a reported click raises nothing.
+    h.button.button().SetEnabled(false);
+    EXPECT_FALSE(::IsWindowEnabled(h.button.hwnd()));
+    h.log.clear();
+    h.Send(BM_CLICK);
+    EXPECT_TRUE(h.log.empty());
+}
+
+// A parent that paints vertical stripes whose red channel is the column number, so copied pixels
+// tell where they were copied from.
+LRESULT CALLBACK StripesProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_ERASEBKGND) return 1;
+    if (message == WM_PAINT) {
+        PAINTSTRUCT ps;
+        HDC dc = ::BeginPaint(hwnd, &ps);
+        for (int x = 0; x < 256; ++x) {
+            HBRUSH brush = ::CreateSolidBrush(RGB(x, 0x40, 0x80));
+            RECT column{x, 0, x + 1, 200};
+            ::FillRect(dc, &column, brush);
+            ::DeleteObject(brush);
+        }
+        ::EndPaint(hwnd, &ps);
+        return 0;
+    }
+    return ::DefWindowProcA(hwnd, message, wParam, lParam);
+}
+
+TEST(XPButtonWindow, TransparentLookCopiesTheParentAtTheControlsPixelPosition) {
+    WNDCLASSA wc{};
+    wc.lpfnWndProc = StripesProc;
+    wc.hInstance = ::GetModuleHandleA(nullptr);
+    wc.lpszClassName = "XPButtonStripes";
+    ::RegisterClassA(&wc);
+    HWND parent = ::CreateWindowA("XPButtonStripes", "stripes", WS_POPUP | WS_VISIBLE, 0, 0, 256, 200, nullptr,
+                                  nullptr, wc.hInstance, nullptr);
+    ASSERT_NE(parent, nullptr);
+    ::UpdateWindow(parent);
+    {
+        win32::XPButtonWindow button;
+        ASSERT_TRUE(button.Create(parent, 1, 37, 20, 60, 30, ""));
+        button.button().SetButtonType(11);
+        button.Show();
+        Hosted::Pump();
+        // The copy starts at the control's left edge in pixels, whatever the container's units.
+        EXPECT_EQ(button.canvas().At(0, 15), static_cast<Rgb>(RGB(37, 0x40, 0x80)));
+        EXPECT_EQ(button.canvas().At(59, 15), static_cast<Rgb>(RGB(96, 0x40, 0x80)));
+        // The control has its height back.
+        RECT r;
+        ::GetClientRect(button.hwnd(), &r);
+        EXPECT_EQ(r.bottom, 30);
+        EXPECT_EQ(button.button().height(), 30);
+    }
+    ::DestroyWindow(parent);
+}
+
+TEST(XPButtonWindow, HoverFollowsTheRealPointer) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr);
+    h.button.events().MouseOver = [&] { h.log.push_back("MouseOver"); };
+    h.button.events().MOUSEOUT = [&] { h.log.push_back("MOUSEOUT"); };
+    RECT r;
+    ::GetWindowRect(h.button.hwnd(), &r);
+    ::SetCursorPos(r.left + 30, r.top + 20);
+    h.Send(WM_MOUSEMOVE, 0, MAKELPARAM(30, 20));
+    EXPECT_TRUE(h.button.button().hovering());
+    // Pointer elsewhere: the hover timer (3 ms) notices without any message from the platform.
+    ::SetCursorPos(r.right + 200, r.bottom + 100);
+    for (int i = 0; i < 100 && h.button.button().hovering(); ++i) {
+        ::Sleep(10);
+        Hosted::Pump();
+    }
+    EXPECT_FALSE(h.button.button().hovering());
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseOver", "MOUSEOUT"}));
+}
+
+TEST(XPButtonWindow, AccessKeyThroughIsDialogMessage) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr);
+    h.button.button().SetCaption("E&xit");
+    ::SetFocus(h.parent);
+    MSG msg{};
+    msg.hwnd = h.parent;
+    msg.message = WM_SYSCHAR;
+    msg.wParam = 'x';
+    msg.lParam = 1 << 29;  // Alt held
+    EXPECT_TRUE(::IsDialogMessageA(h.parent, &msg));
+    Hosted::Pump();
+    EXPECT_EQ(std::count(h.log.begin(), h.log.end(), "Click"), 1);
+}
+
+TEST(XPButtonWindow, ArrowKeysMoveTheFocusThroughInjectedTabs) {
+    Hosted h;
+    ASSERT_NE(h.parent, nullptr);
+    win32::XPButtonWindow second;
+    ASSERT_TRUE(second.Create(h.parent, 2, 20, 80, 120, 40, "Second"));
+    second.Show();
+    ::SetForegroundWindow(h.parent);
+    ::SetFocus(h.button.hwnd());
+    ASSERT_EQ(::GetFocus(), h.button.hwnd());
+    auto pumpDialog = [&] {
+        MSG msg;
+        for (int i = 0; i < 50; ++i) {
+            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+                if (!::IsDialogMessageA(h.parent, &msg)) {
+                    ::TranslateMessage(&msg);
+                    ::DispatchMessageA(&msg);
+                }
+            }
+            ::Sleep(5);
+        }
+    };
+    // Right arrow: KeyDown first, then Tab is queued and moves the focus to the next control.
+    std::vector<std::string> keys;
+    h.button.events().KeyDown = [&](std::int16_t& k, std::int16_t&) { keys.push_back("KeyDown " + std::to_string(k)); };
+    h.Send(WM_KEYDOWN, VK_RIGHT);
+    EXPECT_EQ(keys, std::vector<std::string>{"KeyDown 39"});
+    EXPECT_EQ(::GetFocus(), h.button.hwnd());  // the injected keys wait in the queue
+    pumpDialog();
+    EXPECT_EQ(::GetFocus(), second.hwnd());
+    EXPECT_FALSE(h.button.button().hasFocus());
+    EXPECT_TRUE(second.button().hasFocus());
+    // Up arrow on the second: Shift+Tab back to the first.
+    ::SendMessageA(second.hwnd(), WM_KEYDOWN, VK_UP, 0);
+    pumpDialog();
+    EXPECT_EQ(::GetFocus(), h.button.hwnd());
+    second.Destroy();
+}
+
+TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
+    // A 2 × 1 bitmap: red, then green.
+    HDC screen = ::GetDC(nullptr);
+    HBITMAP bitmap = ::CreateCompatibleBitmap(screen, 2, 1);
+    HDC dc = ::CreateCompatibleDC(screen);
+    HGDIOBJ old = ::SelectObject(dc, bitmap);
+    ::SetPixelV(dc, 0, 0, RGB(255, 0, 0));
+    ::SetPixelV(dc, 1, 0, RGB(0, 255, 0));
+    ::SelectObject(dc, old);
+    ::DeleteDC(dc);
+    ::ReleaseDC(nullptr, screen);
+    auto picture = win32::GdiPicture::FromBitmap(bitmap);
+    ASSERT_NE(picture, nullptr);
+    EXPECT_EQ(picture->Kind(), platform::PictureKind::kBitmap);
+    std::vector<std::uint8_t> px;
+    ASSERT_TRUE(picture->Render(2, 1, 0xC0C0C0, px));
+    EXPECT_EQ(px.size(), 8u);
+    EXPECT_EQ((std::vector<int>{px[0], px[1], px[2], px[3], px[4], px[5]}), (std::vector<int>{0, 0, 255, 0, 255, 0}));
+
+    // A 32 × 32 icon whose mask leaves the left half transparent: those pixels take the fill.
+    std::vector<std::uint8_t> andMask(32 * 4, 0), xorMask(32 * 4, 0);
+    for (int row = 0; row < 32; ++row) andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
+    HICON icon = ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data());
+    auto iconPicture = win32::GdiPicture::FromIcon(icon);
+    ASSERT_NE(iconPicture, nullptr);
+    EXPECT_EQ(iconPicture->Kind(), platform::PictureKind::kIcon);
+    EXPECT_EQ(iconPicture->HimetricWidth(), 847);  // 32 pixels at 96 dpi
+    ASSERT_TRUE(iconPicture->Render(32, 32, 0x00FF00FF, px));
+    const std::size_t stride = platform::DibStride(32);
+    EXPECT_EQ((std::vector<int>{px[0], px[1], px[2]}), (std::vector<int>{0xFF, 0x00, 0xFF}));  // transparent
+    const std::uint8_t* right = px.data() + 5 * stride + 20 * 3;
+    EXPECT_EQ((std::vector<int>{right[0], right[1], right[2]}), (std::vector<int>{0, 0, 0}));  // black
+}
+
+}  // namespace
+}  // namespace vantorel
