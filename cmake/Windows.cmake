@@ -42,3 +42,17 @@ vantorel_wine_test(registry_win32_tests
     tests/contract/registry_contract.cpp
     tests/win32/registry_win32_test.cpp
 )
+
+# The downloader with the real WinINet transfer against the scriptable HTTP server on 127.0.0.1, which
+# a fixture starts in the background (its port chosen by the system) and stops by its PID.
+set(VANTOREL_HTTP_DIR ${CMAKE_BINARY_DIR}/http-server)
+add_test(NAME http_server_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh start ${VANTOREL_HTTP_DIR}
+    /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/servers/http_test_server.py)
+set_tests_properties(http_server_start PROPERTIES FIXTURES_SETUP http_server)
+add_test(NAME http_server_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh stop ${VANTOREL_HTTP_DIR})
+set_tests_properties(http_server_stop PROPERTIES FIXTURES_CLEANUP http_server)
+
+vantorel_wine_test(download_win32_tests tests/win32/download_win32_test.cpp)
+target_link_libraries(download_win32_tests PRIVATE ws2_32)
+set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server"
+    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1")
