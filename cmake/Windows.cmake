@@ -56,3 +56,7 @@ vantorel_wine_test(download_win32_tests tests/win32/download_win32_test.cpp)
 target_link_libraries(download_win32_tests PRIVATE ws2_32)
 set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server"
     ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1")
+
+# The download benchmark (bench/run-download-bench runs it against the loopback server); not a test.
+add_executable(download_bench_win32 bench/download_bench_win32.cpp)
+target_link_libraries(download_bench_win32 PRIVATE vantorel_win32)

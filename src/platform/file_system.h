@@ -23,7 +23,8 @@ public:
     FileWriter& operator=(const FileWriter&) = delete;
     virtual ~FileWriter() = default;
 
-    // Appends all of `data` at once.
+    // Appends all of `data`. An implementation may gather small writes into larger ones; a failure
+    // then shows at a later Write or at Close.
     virtual bool Write(const std::string& data, FileError& error) = 0;
     // Closes the file, reporting a failure to flush it.
     virtual bool Close(FileError& error) = 0;

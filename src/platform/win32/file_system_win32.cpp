@@ -19,25 +19,24 @@ std::string FolderName(std::string path) {
     return path;
 }
 
+// Coalesces the caller's small writes into blocks of 64 KiB: under Wine each WriteFile costs about
+// 2 µs whatever its size, a fifth of what receiving a 1024-byte chunk costs.
 class Win32FileWriter final : public platform::FileWriter {
 public:
-    explicit Win32FileWriter(UniqueFile file) : file_(std::move(file)) {}
+    static constexpr std::size_t kBlock = 64 * 1024;
+
+    explicit Win32FileWriter(UniqueFile file) : file_(std::move(file)) { pending_.reserve(kBlock); }
     bool Write(const std::string& data, platform::FileError& error) override {
-        DWORD written = 0;
-        if (!::WriteFile(file_.get(), data.data(), static_cast<DWORD>(data.size()), &written, nullptr)) {
-            error = LastError();
-            return false;
-        }
-        if (written != data.size()) {
-            error = {ERROR_DISK_FULL, SystemMessage(ERROR_DISK_FULL)};
-            return false;
-        }
-        return true;
+        pending_ += data;
+        return pending_.size() < kBlock || WritePending(error);
     }
     bool Close(platform::FileError& error) override {
         if (!file_) return true;
-        bool ok = ::FlushFileBuffers(file_.get()) != FALSE;
-        if (!ok) error = LastError();
+        bool ok = WritePending(error);
+        if (ok && !::FlushFileBuffers(file_.get())) {
+            error = LastError();
+            ok = false;
+        }
         if (!::CloseHandle(file_.release()) && ok) {
             error = LastError();
             ok = false;
@@ -46,7 +45,21 @@ public:
     }
 
 private:
+    bool WritePending(platform::FileError& error) {
+        DWORD written = 0;
+        bool ok = ::WriteFile(file_.get(), pending_.data(), static_cast<DWORD>(pending_.size()), &written, nullptr);
+        if (!ok) {
+            error = LastError();
+        } else if (written != pending_.size()) {
+            error = {ERROR_DISK_FULL, SystemMessage(ERROR_DISK_FULL)};
+            ok = false;
+        }
+        pending_.clear();
+        return ok;
+    }
+
     UniqueFile file_;
+    std::string pending_;
 };
 
 }  // namespace
