@@ -9,10 +9,12 @@ target_link_libraries(vantorel_native PUBLIC vantorel_core)
 
 add_executable(vantorel_tests
     tests/definitions_test.cpp
+    tests/draw_progress_test.cpp
     tests/file_downloader_test.cpp
     tests/leading_number_test.cpp
     tests/read_definitions_test.cpp
     tests/registry_routines_test.cpp
+    tests/update_check_test.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )

@@ -9,11 +9,23 @@
 #include <string>
 
 #include "platform/file_system.h"
+#include "platform/files.h"
 
 namespace vantorel::testing {
 
-class FakeFileSystem final : public platform::FileSystem {
+class FakeFileSystem final : public platform::FileSystem, public platform::Files {
 public:
+    std::set<std::string> unreadable;
+
+    // platform::Files, over the same files.
+    bool Exists(const std::string& path) override { return files.count(path) != 0 || FolderExists(path); }
+    bool ReadAll(const std::string& path, std::string& content) override {
+        auto it = files.find(path);
+        if (it == files.end() || unreadable.count(path) != 0) return false;
+        content = it->second;
+        return true;
+    }
+
     std::map<std::string, std::string> files;
     std::set<std::string> folders{"C:", "C:\\Vantorel"};
     std::uint32_t bytesPerSector = 512, sectorsPerCluster = 8, freeClusters = 1000000;
