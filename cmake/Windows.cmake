@@ -60,3 +60,14 @@ set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;htt
 # The download benchmark (bench/run-download-bench runs it against the loopback server); not a test.
 add_executable(download_bench_win32 bench/download_bench_win32.cpp)
 target_link_libraries(download_bench_win32 PRIVATE vantorel_win32)
+
+# The update check against nginx serving the update files with the configuration in deploy/.
+set(VANTOREL_NGINX_DIR ${CMAKE_BINARY_DIR}/nginx)
+add_test(NAME nginx_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh start ${VANTOREL_NGINX_DIR})
+set_tests_properties(nginx_start PROPERTIES FIXTURES_SETUP nginx)
+add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh stop ${VANTOREL_NGINX_DIR})
+set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
+
+vantorel_wine_test(update_check_win32_tests tests/win32/update_check_win32_test.cpp)
+set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
+    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1")

@@ -9,6 +9,7 @@
 #include "fakes/fake_http_transfer.h"
 #include "fakes/fake_message_pump.h"
 #include "fakes/fake_picture_box.h"
+#include "fakes/fake_updates_frame.h"
 #include "fakes/fake_registry.h"
 #include "settings/registry_routines.h"
 #include "settings/server_address.h"
@@ -21,31 +22,10 @@ using testing::FakeHttpTransfer;
 using testing::FakeMessagePump;
 using testing::FakePictureBox;
 using testing::FakeWebServer;
+using testing::FakeFrame;
 
 const std::string kServer = "http://updates.test";
 const std::string kFolder = "C:\\Vantorel";
-
-class FakeFrame final : public UpdatesFrame {
-public:
-    std::vector<std::string> log;
-    std::string L[2] = {"Definitions Updates:", "Program Updates:"};
-    bool enabled = true, pbVisible = false;
-    FakePictureBox box{393, 17};
-
-    void SetBtnUpdateEnabled(bool on) override {
-        enabled = on;
-        log.push_back(on ? "enable" : "disable");
-    }
-    void SetLCaption(int index, const std::string& caption) override {
-        L[index] = caption;
-        log.push_back("L" + std::to_string(index) + ":" + caption);
-    }
-    void ShowPb() override { pbVisible = true; }
-    platform::PictureBox& pb() override { return box; }
-    void MsgBoxExclamation(const std::string& prompt, const std::string& title) override {
-        log.push_back("msgbox[" + title + "]:" + prompt);
-    }
-};
 
 struct Rig {
     FakeWebServer server;
