@@ -24,7 +24,9 @@ add_subdirectory(/usr/src/googletest ${CMAKE_BINARY_DIR}/_gtest EXCLUDE_FROM_ALL
 
 # Wine services inherit ctest's output pipe and stall it: a fixture starts a persistent wineserver
 # (and the prefix) once, quietly, and stops it at the end.
-set(WINE_ENV WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=)
+# One text for `sh -c`: a CMake list would reach the shell joined with ";", which ends the `env`
+# command at the first variable and left wineserver on the default prefix.
+set(WINE_ENV "WINEPREFIX='${VANTOREL_WINEPREFIX}' WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=")
 add_test(NAME wine_start COMMAND sh -c
     "mkdir -p '${VANTOREL_WINEPREFIX}' && env ${WINE_ENV} wineserver -p </dev/null >/dev/null 2>&1 && env ${WINE_ENV} wine wineboot </dev/null >/dev/null 2>&1")
 set_tests_properties(wine_start PROPERTIES FIXTURES_SETUP wine)
@@ -52,10 +54,26 @@ set_tests_properties(http_server_start PROPERTIES FIXTURES_SETUP http_server)
 add_test(NAME http_server_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh stop ${VANTOREL_HTTP_DIR})
 set_tests_properties(http_server_stop PROPERTIES FIXTURES_CLEANUP http_server)
 
+# Two https servers: one with a certificate from a test authority, one self-signed.
+set(VANTOREL_HTTPS_DIR ${CMAKE_BINARY_DIR}/https-servers)
+add_test(NAME https_servers_start COMMAND sh -c "\
+    '${CMAKE_SOURCE_DIR}/tests/servers/make_test_certificates.sh' '${VANTOREL_HTTPS_DIR}/certs' && \
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' start '${VANTOREL_HTTPS_DIR}/trusted' /usr/bin/python3 \
+        '${CMAKE_SOURCE_DIR}/tests/servers/http_test_server.py' \
+        --tls '${VANTOREL_HTTPS_DIR}/certs/server.pem' '${VANTOREL_HTTPS_DIR}/certs/server.key' && \
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' start '${VANTOREL_HTTPS_DIR}/untrusted' /usr/bin/python3 \
+        '${CMAKE_SOURCE_DIR}/tests/servers/http_test_server.py' \
+        --tls '${VANTOREL_HTTPS_DIR}/certs/untrusted.pem' '${VANTOREL_HTTPS_DIR}/certs/untrusted.key'")
+set_tests_properties(https_servers_start PROPERTIES FIXTURES_SETUP https_servers)
+add_test(NAME https_servers_stop COMMAND sh -c "\
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/trusted'; \
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/untrusted'")
+set_tests_properties(https_servers_stop PROPERTIES FIXTURES_CLEANUP https_servers)
+
 vantorel_wine_test(download_win32_tests tests/win32/download_win32_test.cpp)
-target_link_libraries(download_win32_tests PRIVATE ws2_32)
-set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server"
-    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1")
+target_link_libraries(download_win32_tests PRIVATE ws2_32 crypt32)
+set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server;https_servers"
+    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;VANTOREL_HTTPS_DIR=${VANTOREL_HTTPS_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1")
 
 # The download benchmark (bench/run-download-bench runs it against the loopback server); not a test.
 add_executable(download_bench_win32 bench/download_bench_win32.cpp)

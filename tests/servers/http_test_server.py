@@ -14,7 +14,7 @@ so a test can check every byte it received:
   /slow/N/MS         N bytes in pieces of 1024 with a pause of MS milliseconds before each
   /files/NAME        the file NAME from the --root folder, 404 when missing
 
-The listening port is chosen by the system and written to --port-file once the server listens.
+With --tls CERT KEY it speaks https instead. The listening port is chosen by the system and written to --port-file once the server listens.
 """
 import argparse
 import base64
@@ -130,9 +130,15 @@ def main():
     parser = argparse.ArgumentParser()
     parser.add_argument("--port-file", required=True)
     parser.add_argument("--root", default=".")
+    parser.add_argument("--tls", nargs=2, metavar=("CERT", "KEY"), help="serve https with this certificate")
     options = parser.parse_args()
     Handler.root = options.root
     server = ThreadingHTTPServer(("127.0.0.1", 0), Handler)
+    if options.tls:
+        import ssl
+        context = ssl.SSLContext(ssl.PROTOCOL_TLS_SERVER)
+        context.load_cert_chain(*options.tls)
+        server.socket = context.wrap_socket(server.socket, server_side=True)
     server.daemon_threads = True
     temporary = options.port_file + ".tmp"
     with open(temporary, "w") as f:

@@ -25,7 +25,9 @@ stop)
     pid=$(cat "$dir/server.pid")
     kill "$pid" 2>/dev/null
     i=0
-    while kill -0 "$pid" 2>/dev/null && [ $i -lt 50 ]; do i=$((i + 1)); sleep 0.1; done
+    # Gone, or a zombie waiting for whoever adopted it to reap it.
+    while kill -0 "$pid" 2>/dev/null && ! grep -q '^[0-9]* ([^)]*) Z' "/proc/$pid/stat" 2>/dev/null &&
+        [ $i -lt 50 ]; do i=$((i + 1)); sleep 0.1; done
     rm -f "$dir/server.pid" "$dir/server.port"
     ;;
 esac

@@ -6,6 +6,7 @@
 // running while a slow download waits.
 #include <winsock2.h>
 #include <windows.h>
+#include <wincrypt.h>
 
 #include <gtest/gtest.h>
 
@@ -229,6 +230,63 @@ TEST_F(WinInetDownload, WindowMessagesRunWhileASlowDownloadWaits) {
     EXPECT_GE(took, 500u);
     EXPECT_GE(ticks, static_cast<int>(took / 20 / 3)) << "the timer ran " << ticks << " times in " << took << " ms";
     EXPECT_EQ(ReadFile(dest_), Pattern(5000));
+}
+
+}  // namespace
+}  // namespace vantorel
+
+namespace vantorel {
+namespace {
+
+// https through the same transfer. Two loopback https servers: one with a certificate signed by a
+// test authority that this test puts among the trusted roots of its own scratch Wine prefix, one
+// with a self-signed certificate nobody trusts. The first must deliver; the second must be refused
+// (the certificate check is never switched off) without touching the installed file.
+TEST(WinInetHttps, TrustedCertificateDeliversAndUntrustedIsRefused) {
+    const char* dir = std::getenv("VANTOREL_HTTPS_DIR");
+    ASSERT_NE(dir, nullptr) << "VANTOREL_HTTPS_DIR is not set";
+    auto port = [&](const char* which) {
+        std::ifstream in(std::string("Z:") + dir + "/" + which + "/server.port");
+        std::string value;
+        in >> value;
+        return value;
+    };
+    std::string trusted = "https://127.0.0.1:" + port("trusted"), untrusted = "https://127.0.0.1:" + port("untrusted");
+
+    std::string der = ReadFile(std::string("Z:") + dir + "/certs/ca.der");
+    ASSERT_FALSE(der.empty());
+    HCERTSTORE root = ::CertOpenStore(CERT_STORE_PROV_SYSTEM_A, 0, 0, CERT_SYSTEM_STORE_LOCAL_MACHINE, "ROOT");
+    ASSERT_NE(root, nullptr);
+    ASSERT_TRUE(::CertAddEncodedCertificateToStore(root, X509_ASN_ENCODING,
+                                                   reinterpret_cast<const BYTE*>(der.data()),
+                                                   static_cast<DWORD>(der.size()), CERT_STORE_ADD_REPLACE_EXISTING,
+                                                   nullptr));
+    ::CertCloseStore(root, 0);
+
+    char temp[MAX_PATH];
+    ::GetTempPathA(MAX_PATH, temp);
+    std::string dest = std::string(temp) + "vtdl-https-" + std::to_string(::GetCurrentProcessId()) + ".def";
+    WriteFile(dest, "installed");
+
+    win32::Win32MessagePump pump;
+    win32::WinInetTransfer inet(pump);
+    win32::Win32FileSystem disk;
+    FileDownloader fd(inet, disk, pump);
+    std::vector<std::string> events;
+    fd.DownloadErrors = [&](const std::string& s) { events.push_back("error:" + s); };
+    fd.DowloadComplete = [&] { events.push_back("complete"); };
+
+    EXPECT_FALSE(fd.DownloadFile(untrusted + "/body/5000", dest));
+    ASSERT_EQ(events.size(), 1u);
+    EXPECT_EQ(events[0].rfind("error:Error: ", 0), 0u) << events[0];
+    EXPECT_NE(events[0].find("certificate authority"), std::string::npos) << events[0];
+    EXPECT_EQ(ReadFile(dest), "installed");
+
+    events.clear();
+    EXPECT_TRUE(fd.DownloadFile(trusted + "/range/5000", dest)) << (events.empty() ? "" : events[0]);
+    EXPECT_EQ(events, (std::vector<std::string>{"complete"}));
+    EXPECT_EQ(ReadFile(dest), Pattern(5000));
+    ::DeleteFileA(dest.c_str());
 }
 
 }  // namespace

@@ -17,7 +17,18 @@ constexpr std::size_t kBlocksAhead = 4;
 using UniqueHinternet = UniqueHandle<NullInvalid<HINTERNET, ::InternetCloseHandle>>;
 
 platform::TransferError InternetError(DWORD code) {
-    return {static_cast<std::int32_t>(code), SystemMessage(code, ::GetModuleHandleA("wininet.dll"))};
+    std::string text = SystemMessage(code, ::GetModuleHandleA("wininet.dll"));
+    // Wine's wininet has no text for some certificate failures; say what they are.
+    if (text == "Error " + std::to_string(code)) {
+        switch (code) {
+            case ERROR_INTERNET_INVALID_CA: text = "The certificate authority is invalid or incorrect."; break;
+            case ERROR_INTERNET_SEC_CERT_DATE_INVALID: text = "The server's certificate has expired."; break;
+            case ERROR_INTERNET_SEC_INVALID_CERT: text = "The server's certificate is invalid."; break;
+            case ERROR_INTERNET_SECURITY_CHANNEL_ERROR: text = "The secure channel could not be set up."; break;
+            default: text = "WinINet error " + std::to_string(code); break;
+        }
+    }
+    return {static_cast<std::int32_t>(code), text};
 }
 
 }  // namespace
