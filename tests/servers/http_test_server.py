@@ -13,6 +13,7 @@ so a test can check every byte it received:
   /length/TEXT/N     Content-Length: TEXT (any text), then N bytes and a close
   /slow/N/MS         N bytes in pieces of 1024 with a pause of MS milliseconds before each
   /files/NAME        the file NAME from the --root folder, 404 when missing
+  /stall/MS          answers 200 with 10 bytes only after MS milliseconds
 
 With --tls CERT KEY it speaks https instead. The listening port is chosen by the system and written to --port-file once the server listens.
 """
@@ -113,6 +114,9 @@ class Handler(BaseHTTPRequestHandler):
                     time.sleep(pause)
                     self.wfile.write(data[start:start + 1024])
                     self.wfile.flush()
+            elif kind == "stall":
+                time.sleep(int(args[0]) / 1000.0)
+                self.answer(200, body(10))
             elif kind == "files":
                 path = os.path.join(self.root, os.path.basename("/".join(args)))
                 if os.path.isfile(path):

@@ -183,6 +183,21 @@ TEST_F(WinInetDownload, CancelDuringTheChunkLoopStopsAtOnce) {
     EXPECT_EQ(ReadFile(dest_), Pattern(2000));
 }
 
+TEST_F(WinInetDownload, CancelWhileTheServerHasNotAnsweredReturnsPromptly) {
+    // The server holds its answer for 8 s; the user cancels after about 300 ms of waiting (a
+    // thread timer stands for the click).
+    static FileDownloader* target = nullptr;
+    target = &fd_;
+    DWORD started = ::GetTickCount();
+    UINT_PTR timer = ::SetTimer(nullptr, 0, 300, [](HWND, UINT, UINT_PTR, DWORD) { target->Cancel(); });
+    EXPECT_FALSE(Get("/stall/8000"));
+    DWORD took = ::GetTickCount() - started;
+    ::KillTimer(nullptr, timer);
+    EXPECT_LT(took, 3000u) << "cancelling a request the server has not answered took " << took << " ms";
+    EXPECT_TRUE(events_.empty());
+    EXPECT_EQ(ReadFile(dest_), kOld);
+}
+
 TEST_F(WinInetDownload, MissingDestinationFolderIsCreated) {
     std::string dest = folder_ + "\\new\\sw2.def";
     EXPECT_TRUE(fd_.DownloadFile(server_ + "/body/5000", dest));

@@ -3,7 +3,7 @@
 #include <windows.h>
 #include <wininet.h>
 
-#include <functional>
+#include <thread>
 #include <utility>
 
 #include "platform/http_header.h"
@@ -33,27 +33,42 @@ platform::TransferError InternetError(DWORD code) {
 
 }  // namespace
 
+struct WinInetTransfer::Shared {
+    enum class Stage { Requesting, Answered, Failed };
+
+    UniqueKernelHandle wake{::CreateEventA(nullptr, FALSE, FALSE, nullptr)};  // set after every change
+    std::mutex mutex;
+    std::condition_variable room;  // the worker waits here for the window thread to take blocks
+    Stage stage = Stage::Requesting;
+    bool stop = false, bodyEnded = false, bodyFailed = false;
+    platform::TransferError error, bodyError;
+    std::string header;
+    std::deque<std::string> blocks;
+    HINTERNET request = nullptr;  // the open request, closed by whoever takes it first
+
+    template <typename Change>
+    void Publish(Change change) {
+        {
+            std::lock_guard<std::mutex> lock(mutex);
+            change();
+        }
+        ::SetEvent(wake.get());
+    }
+};
+
 WinInetTransfer::WinInetTransfer(platform::MessagePump& pump, std::size_t blockSize)
-    : pump_(pump), blockSize_(blockSize), wake_(::CreateEventA(nullptr, FALSE, FALSE, nullptr)) {}
+    : pump_(pump), blockSize_(blockSize) {}
 
 WinInetTransfer::~WinInetTransfer() { Cancel(); }
-
-void WinInetTransfer::Publish(const std::function<void()>& change) {
-    {
-        std::lock_guard<std::mutex> lock(mutex_);
-        change();
-    }
-    ::SetEvent(wake_.get());
-}
 
 template <typename Ready>
 void WinInetTransfer::WaitPumping(Ready ready) {
     for (;;) {
         {
-            std::lock_guard<std::mutex> lock(mutex_);
-            if (ready()) return;
+            std::lock_guard<std::mutex> lock(shared_->mutex);
+            if (ready(*shared_)) return;
         }
-        HANDLE wake = wake_.get();
+        HANDLE wake = shared_->wake.get();
         DWORD woke = ::MsgWaitForMultipleObjectsEx(1, &wake, INFINITE, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
         if (woke == WAIT_OBJECT_0 + 1) pump_.PumpMessages();
     }
@@ -94,27 +109,31 @@ bool WinInetTransfer::ExecuteGet(const std::string& requestHeader, platform::Tra
     request.password = password_.empty() ? std::string(password, parts.dwPasswordLength) : password_;
     request.headers = requestHeader;
 
-    {
-        std::lock_guard<std::mutex> lock(mutex_);
-        stage_ = Stage::Requesting;
-        stop_ = bodyEnded_ = bodyFailed_ = false;
-        workerDone_ = false;
-        error_ = bodyError_ = {};
-        header_.clear();
-        blocks_.clear();
+    auto shared = std::make_shared<Shared>();
+    if (!shared->wake) {
+        error = InternetError(::GetLastError());
+        return false;
     }
+    try {
+        std::thread(&WinInetTransfer::Work, shared, std::move(request), blockSize_).detach();
+    } catch (const std::system_error&) {
+        error = InternetError(ERROR_NOT_ENOUGH_MEMORY);
+        return false;
+    }
+    shared_ = std::move(shared);
     current_.clear();
     offset_ = 0;
-    worker_ = std::thread(&WinInetTransfer::Work, this, std::move(request));
     return true;
 }
 
-void WinInetTransfer::Work(Request request) {
-    auto fail = [this](DWORD code) {
+// The worker: the request, the response header, then the body in blocks. It touches nothing but
+// `shared`, which it keeps alive, so it may outlive the transfer that started it.
+void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize) {
+    auto fail = [&shared](DWORD code) {
         platform::TransferError error = InternetError(code);
-        Publish([&] {
-            stage_ = Stage::Failed;
-            error_ = error;
+        shared->Publish([&] {
+            shared->stage = Shared::Stage::Failed;
+            shared->error = error;
         });
     };
     UniqueHinternet session(::InternetOpenA("Vantorel", INTERNET_OPEN_TYPE_PRECONFIG, nullptr, nullptr, 0));
@@ -125,112 +144,116 @@ void WinInetTransfer::Work(Request request) {
                                             request.password.empty() ? nullptr : request.password.c_str(),
                                             INTERNET_SERVICE_HTTP, 0, 0));
     }
-    if (!connection) {
-        fail(::GetLastError());
-    } else {
+    HINTERNET opened = nullptr;
+    if (connection) {
         DWORD flags = INTERNET_FLAG_RELOAD | INTERNET_FLAG_NO_CACHE_WRITE | INTERNET_FLAG_NO_UI |
                       INTERNET_FLAG_NO_COOKIES | (request.secure ? INTERNET_FLAG_SECURE : 0);
-        HINTERNET opened = ::HttpOpenRequestA(connection.get(), "GET", request.path.c_str(), nullptr, nullptr,
-                                              nullptr, flags, 0);
-        bool stopped = false;
-        {
-            std::lock_guard<std::mutex> lock(mutex_);
-            request_ = opened;
-            stopped = stop_;
+        opened = ::HttpOpenRequestA(connection.get(), "GET", request.path.c_str(), nullptr, nullptr, nullptr, flags, 0);
+    }
+    bool stopped = false;
+    if (opened != nullptr) {
+        std::lock_guard<std::mutex> lock(shared->mutex);
+        shared->request = opened;
+        stopped = shared->stop;
+    }
+
+    if (opened == nullptr) {
+        fail(::GetLastError());
+    } else if (stopped) {
+        // Cancelled before the request went out.
+    } else if (!::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()),
+                                   nullptr, 0)) {
+        fail(::GetLastError());
+    } else {
+        std::string header(4096, '\0');
+        DWORD length = static_cast<DWORD>(header.size());
+        BOOL ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
+        if (!ok && ::GetLastError() == ERROR_INSUFFICIENT_BUFFER) {
+            header.resize(length + 1);
+            ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
         }
-        if (opened == nullptr) {
+        if (!ok) {
             fail(::GetLastError());
-        } else if (!stopped) {
-            if (!::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()),
-                                    nullptr, 0)) {
-                fail(::GetLastError());
-            } else {
-                std::string header(4096, '\0');
-                DWORD length = static_cast<DWORD>(header.size());
-                BOOL ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
-                if (!ok && ::GetLastError() == ERROR_INSUFFICIENT_BUFFER) {
-                    header.resize(length + 1);
-                    ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
+        } else {
+            header.resize(length);
+            shared->Publish([&] {
+                shared->header = header;
+                shared->stage = Shared::Stage::Answered;
+            });
+            // The body, in blocks, a few ahead of the window thread.
+            for (;;) {
+                {
+                    std::unique_lock<std::mutex> lock(shared->mutex);
+                    shared->room.wait(lock, [&] { return shared->stop || shared->blocks.size() < kBlocksAhead; });
+                    if (shared->stop) break;
                 }
-                if (!ok) {
-                    fail(::GetLastError());
-                } else {
-                    header.resize(length);
-                    Publish([&] {
-                        header_ = header;
-                        stage_ = Stage::Answered;
-                    });
-                    // The body, in blocks, a few ahead of the window thread.
-                    for (;;) {
-                        {
-                            std::unique_lock<std::mutex> lock(mutex_);
-                            roomCv_.wait(lock, [this] { return stop_ || blocks_.size() < kBlocksAhead; });
-                            if (stop_) break;
-                        }
-                        std::string block(blockSize_, '\0');
-                        std::size_t filled = 0;
-                        bool ended = false;
-                        DWORD failure = 0;
-                        while (filled < block.size()) {
-                            DWORD read = 0;
-                            if (!::InternetReadFile(opened, block.data() + filled,
-                                                    static_cast<DWORD>(block.size() - filled), &read)) {
-                                failure = ::GetLastError();
-                                break;
-                            }
-                            if (read == 0) {
-                                ended = true;
-                                break;
-                            }
-                            filled += read;
-                        }
-                        block.resize(filled);
-                        platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
-                        Publish([&] {
-                            if (!block.empty()) blocks_.push_back(std::move(block));
-                            if (failure != 0) {
-                                bodyFailed_ = true;
-                                bodyError_ = error;
-                            }
-                            bodyEnded_ = ended || failure != 0;
-                        });
-                        if (ended || failure != 0) break;
+                std::string block(blockSize, '\0');
+                std::size_t filled = 0;
+                bool ended = false;
+                DWORD failure = 0;
+                while (filled < block.size()) {
+                    DWORD read = 0;
+                    if (!::InternetReadFile(opened, block.data() + filled, static_cast<DWORD>(block.size() - filled),
+                                            &read)) {
+                        failure = ::GetLastError();
+                        break;
                     }
+                    if (read == 0) {
+                        ended = true;
+                        break;
+                    }
+                    filled += read;
                 }
+                block.resize(filled);
+                platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
+                shared->Publish([&] {
+                    if (!block.empty()) shared->blocks.push_back(std::move(block));
+                    if (failure != 0) {
+                        shared->bodyFailed = true;
+                        shared->bodyError = error;
+                    }
+                    shared->bodyEnded = ended || failure != 0;
+                });
+                if (ended || failure != 0) break;
             }
         }
     }
-    Publish([&] {
-        if (request_ != nullptr) ::InternetCloseHandle(static_cast<HINTERNET>(request_));
-        request_ = nullptr;
-        if (stage_ == Stage::Requesting) {
-            stage_ = Stage::Failed;
-            error_ = InternetError(ERROR_INTERNET_OPERATION_CANCELLED);
+    shared->Publish([&] {
+        if (shared->request != nullptr) ::InternetCloseHandle(shared->request);
+        shared->request = nullptr;
+        if (shared->stage == Shared::Stage::Requesting) {
+            shared->stage = Shared::Stage::Failed;
+            shared->error = InternetError(ERROR_INTERNET_OPERATION_CANCELLED);
         }
-        workerDone_ = true;
+        shared->bodyEnded = true;
     });
 }
 
 bool WinInetTransfer::StillExecuting() {
+    if (!shared_) return false;
     {
-        std::lock_guard<std::mutex> lock(mutex_);
-        if (stage_ != Stage::Requesting) return false;
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        if (shared_->stage != Shared::Stage::Requesting) return false;
     }
     // A short wait keeps the caller's poll loop from spinning; a waiting message ends it at once.
-    HANDLE wake = wake_.get();
+    HANDLE wake = shared_->wake.get();
     ::MsgWaitForMultipleObjectsEx(1, &wake, 10, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
-    std::lock_guard<std::mutex> lock(mutex_);
-    return stage_ == Stage::Requesting;
+    std::lock_guard<std::mutex> lock(shared_->mutex);
+    return shared_->stage == Shared::Stage::Requesting;
 }
 
 bool WinInetTransfer::GetHeader(std::string& header, platform::TransferError& error) {
-    WaitPumping([this] { return stage_ != Stage::Requesting; });
-    std::lock_guard<std::mutex> lock(mutex_);
-    if (stage_ == Stage::Failed) {
-        error = error_;
+    if (!shared_) {
+        header.clear();
+        return true;
+    }
+    WaitPumping([](Shared& s) { return s.stage != Shared::Stage::Requesting; });
+    std::lock_guard<std::mutex> lock(shared_->mutex);
+    if (shared_->stage == Shared::Stage::Failed) {
+        error = shared_->error;
         return false;
     }
-    header = header_;
+    header = shared_->header;
     return true;
 }
 
@@ -243,13 +266,13 @@ bool WinInetTransfer::GetHeader(const std::string& name, std::string& value, pla
 
 bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::TransferError& error) {
     data.clear();
+    if (!shared_) return true;
     {
-        std::lock_guard<std::mutex> lock(mutex_);
-        if (stage_ == Stage::Failed) {
-            error = error_;
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        if (shared_->stage == Shared::Stage::Failed) {
+            error = shared_->error;
             return false;
         }
-        if (stage_ == Stage::Idle) return true;
     }
     while (data.size() < size) {
         if (offset_ < current_.size()) {
@@ -258,23 +281,23 @@ bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::Tr
             offset_ += take;
             continue;
         }
+        WaitPumping([](Shared& s) { return !s.blocks.empty() || s.bodyEnded; });
         bool failed = false;
-        WaitPumping([this] { return !blocks_.empty() || bodyEnded_; });
         {
-            std::lock_guard<std::mutex> lock(mutex_);
-            if (!blocks_.empty()) {
-                current_ = std::move(blocks_.front());
-                blocks_.pop_front();
+            std::lock_guard<std::mutex> lock(shared_->mutex);
+            if (!shared_->blocks.empty()) {
+                current_ = std::move(shared_->blocks.front());
+                shared_->blocks.pop_front();
                 offset_ = 0;
             } else {
-                failed = bodyFailed_;
-                if (failed && data.empty()) error = bodyError_;
+                failed = shared_->bodyFailed;
+                if (failed && data.empty()) error = shared_->bodyError;
             }
         }
-        roomCv_.notify_one();
+        shared_->room.notify_one();
         if (offset_ >= current_.size()) {
             // The body has ended (or failed): what was gathered is the last chunk; a failure is
-            // reported on its own call.
+            // reported on a call of its own.
             if (failed && data.empty()) return false;
             break;
         }
@@ -283,21 +306,17 @@ bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::Tr
 }
 
 void WinInetTransfer::Cancel() {
-    if (!worker_.joinable()) return;
-    void* request = nullptr;
+    if (!shared_) return;
+    HINTERNET request = nullptr;
     {
-        std::lock_guard<std::mutex> lock(mutex_);
-        stop_ = true;
-        std::swap(request, request_);
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        shared_->stop = true;
+        std::swap(request, shared_->request);
     }
-    roomCv_.notify_all();
-    // Closing the request handle ends a blocking call on it in the worker.
-    if (request != nullptr) ::InternetCloseHandle(static_cast<HINTERNET>(request));
-    WaitPumping([this] { return workerDone_; });
-    worker_.join();
-    std::lock_guard<std::mutex> lock(mutex_);
-    stage_ = Stage::Idle;
-    blocks_.clear();
+    shared_->room.notify_all();
+    // Closing the request handle ends the worker's next call on it; the worker closes the rest.
+    if (request != nullptr) ::InternetCloseHandle(request);
+    shared_.reset();
     current_.clear();
     offset_ = 0;
 }

@@ -12,9 +12,9 @@
 #include <cstddef>
 #include <deque>
 #include <functional>
+#include <memory>
 #include <mutex>
 #include <string>
-#include <thread>
 
 #include "platform/http_transfer.h"
 #include "platform/message_pump.h"
@@ -39,39 +39,28 @@ public:
     bool GetHeader(std::string& header, platform::TransferError& error) override;
     bool GetHeader(const std::string& name, std::string& value, platform::TransferError& error) override;
     bool GetChunk(std::size_t size, std::string& data, platform::TransferError& error) override;
+    // Stops the request without waiting for it: a worker stuck on a server that does not answer
+    // is left to finish on its own (it owns everything it still touches) and the window thread
+    // goes on at once.
     void Cancel() override;
 
 private:
-    enum class Stage { Idle, Requesting, Answered, Failed };
     struct Request {
         std::string host, path, userName, password, headers;
         unsigned short port = 0;
         bool secure = false;
     };
+    struct Shared;  // what the window thread and one worker share; lives while either needs it
 
-    void Work(Request request);
+    static void Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize);
     // Waits until `ready` holds (checked under the lock), pumping window messages meanwhile.
     template <typename Ready>
     void WaitPumping(Ready ready);
-    void Publish(const std::function<void()>& change);
 
     platform::MessagePump& pump_;
     const std::size_t blockSize_;
     std::string url_, userName_, password_;
-
-    UniqueKernelHandle wake_;  // set by the worker after every change the window thread may wait for
-    std::thread worker_;
-
-    // Shared with the worker, under `mutex_`.
-    std::mutex mutex_;
-    std::condition_variable roomCv_;
-    Stage stage_ = Stage::Idle;
-    bool stop_ = false, bodyEnded_ = false, workerDone_ = true;
-    platform::TransferError error_, bodyError_;
-    bool bodyFailed_ = false;
-    std::string header_;
-    std::deque<std::string> blocks_;
-    void* request_ = nullptr;  // HINTERNET of the running request, closed by whoever takes it
+    std::shared_ptr<Shared> shared_;  // of the running request; none when idle
 
     // Window thread only: the block chunks are being served from.
     std::string current_;
