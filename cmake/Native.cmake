@@ -15,6 +15,8 @@ add_executable(vantorel_tests
     tests/read_definitions_test.cpp
     tests/registry_routines_test.cpp
     tests/update_check_test.cpp
+    tests/contract/file_system_contract.cpp
+    tests/contract/file_system_contract_fake.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )

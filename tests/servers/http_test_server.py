@@ -11,7 +11,7 @@ so a test can check every byte it received:
   /cut/N/SENT        announces N bytes, sends SENT, then closes the connection
   /nolength/N        N bytes without a Content-Length, ended by closing the connection
   /length/TEXT/N     Content-Length: TEXT (any text), then N bytes and a close
-  /slow/N/MS         N bytes in pieces of 1024 with a pause of MS milliseconds before each
+  /slow/N/MS[/PIECE] N bytes in pieces of PIECE (1024) bytes with a pause of MS milliseconds before each
   /files/NAME        the file NAME from the --root folder, 404 when missing
   /stall/MS          answers 200 with 10 bytes only after MS milliseconds
 
@@ -106,13 +106,14 @@ class Handler(BaseHTTPRequestHandler):
                 self.cut()
             elif kind == "slow":
                 n, pause = int(args[0]), int(args[1]) / 1000.0
+                piece = int(args[2]) if len(args) > 2 else 1024
                 self.send_response(200)
                 self.send_header("Content-Length", str(n))
                 self.end_headers()
                 data = body(n)
-                for start in range(0, n, 1024):
+                for start in range(0, n, piece):
                     time.sleep(pause)
-                    self.wfile.write(data[start:start + 1024])
+                    self.wfile.write(data[start:start + piece])
                     self.wfile.flush()
             elif kind == "stall":
                 time.sleep(int(args[0]) / 1000.0)

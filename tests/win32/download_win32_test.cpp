@@ -245,6 +245,14 @@ TEST_F(WinInetDownload, WindowMessagesRunWhileASlowDownloadWaits) {
     EXPECT_GE(took, 500u);
     EXPECT_GE(ticks, static_cast<int>(took / 20 / 3)) << "the timer ran " << ticks << " times in " << took << " ms";
     EXPECT_EQ(ReadFile(dest_), Pattern(5000));
+
+    // Data trickling in pieces of 300 bytes still comes out as whole chunks: a short chunk only at
+    // the end, so the loop does not stop early.
+    events_.clear();
+    EXPECT_TRUE(Get("/slow/5000/25/300"));
+    EXPECT_EQ(events_, (Events{"progress:20", "progress:41", "progress:61", "progress:82", "progress:100",
+                               "progress:100", "complete"}));
+    EXPECT_EQ(ReadFile(dest_), Pattern(5000));
 }
 
 }  // namespace
