@@ -9,9 +9,10 @@ add_library(vantorel_win32 STATIC
     src/platform/win32/files_win32.cpp
     src/platform/win32/http_transfer_win32.cpp
     src/platform/win32/message_pump_win32.cpp
+    src/platform/win32/picture_box_win32.cpp
     src/platform/win32/registry_win32.cpp
 )
-target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet user32)
+target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet user32 gdi32)
 target_compile_definitions(vantorel_win32 PUBLIC WIN32_LEAN_AND_MEAN NOMINMAX)
 
 add_executable(vantorel WIN32 src/platform/win32/main_win32.cpp)
@@ -69,6 +70,8 @@ add_test(NAME https_servers_stop COMMAND sh -c "\
     '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/trusted'; \
     '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/untrusted'")
 set_tests_properties(https_servers_stop PROPERTIES FIXTURES_CLEANUP https_servers)
+
+vantorel_wine_test(draw_progress_win32_tests tests/win32/draw_progress_win32_test.cpp)
 
 vantorel_wine_test(file_system_win32_tests
     tests/contract/file_system_contract.cpp
