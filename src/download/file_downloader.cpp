@@ -160,7 +160,8 @@ void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t a
         if (buffer.size() <= 1) break;
     }
 
-    if (!file->Close(fileError) && !failed) FileError(fileError);
+    // After a failure or a cancel the partial file goes anyway: a failing close adds nothing to say.
+    if (!file->Close(fileError) && !failed && !cancel_) FileError(fileError);
     file.reset();
     if (!cancel_ && received == announced && !files_.Replace(partial, strDestination, fileError)) {
         FileError(fileError);
