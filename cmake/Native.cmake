@@ -11,6 +11,7 @@ add_executable(vantorel_tests
     tests/definitions_test.cpp
     tests/draw_progress_test.cpp
     tests/file_downloader_test.cpp
+    tests/http_header_test.cpp
     tests/leading_number_test.cpp
     tests/read_definitions_test.cpp
     tests/registry_routines_test.cpp
