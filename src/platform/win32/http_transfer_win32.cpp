@@ -36,8 +36,11 @@ platform::TransferError InternetError(DWORD code) {
 struct WinInetTransfer::Shared {
     enum class Stage { Requesting, Answered, Failed };
 
-    UniqueKernelHandle wake{::CreateEventA(nullptr, FALSE, FALSE, nullptr)};  // set after every change
+    // Set after a change while the window thread waits for one. (Setting it costs a round trip to
+    // the wine server; a window thread busy with the blocks it has does not need it.)
+    UniqueKernelHandle wake{::CreateEventA(nullptr, FALSE, FALSE, nullptr)};
     std::mutex mutex;
+    bool waiting = false;  // the window thread waits, or is about to, for `wake`
     std::condition_variable room;  // the worker waits here for the window thread to take blocks
     Stage stage = Stage::Requesting;
     bool stop = false, bodyEnded = false, bodyFailed = false;
@@ -48,11 +51,13 @@ struct WinInetTransfer::Shared {
 
     template <typename Change>
     void Publish(Change change) {
+        bool signal = false;
         {
             std::lock_guard<std::mutex> lock(mutex);
             change();
+            signal = waiting;
         }
-        ::SetEvent(wake.get());
+        if (signal) ::SetEvent(wake.get());
     }
 };
 
@@ -66,7 +71,8 @@ void WinInetTransfer::WaitPumping(Ready ready) {
     for (;;) {
         {
             std::lock_guard<std::mutex> lock(shared_->mutex);
-            if (ready(*shared_)) return;
+            shared_->waiting = !ready(*shared_);
+            if (!shared_->waiting) return;
         }
         HANDLE wake = shared_->wake.get();
         DWORD woke = ::MsgWaitForMultipleObjectsEx(1, &wake, INFINITE, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
@@ -239,11 +245,13 @@ bool WinInetTransfer::StillExecuting() {
     {
         std::lock_guard<std::mutex> lock(shared_->mutex);
         if (shared_->stage != Shared::Stage::Requesting) return false;
+        shared_->waiting = true;
     }
     // A short wait keeps the caller's poll loop from spinning; a waiting message ends it at once.
     HANDLE wake = shared_->wake.get();
     ::MsgWaitForMultipleObjectsEx(1, &wake, 10, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
     std::lock_guard<std::mutex> lock(shared_->mutex);
+    shared_->waiting = false;
     return shared_->stage == Shared::Stage::Requesting;
 }
 
