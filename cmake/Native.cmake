@@ -14,6 +14,13 @@ add_executable(vantorel_tests
     tests/registry_routines_test.cpp
     tests/xpbutton_input_test.cpp
     tests/xpbutton_render_test.cpp
+    tests/draw_progress_test.cpp
+    tests/file_downloader_test.cpp
+    tests/http_header_test.cpp
+    tests/leading_number_test.cpp
+    tests/update_check_test.cpp
+    tests/contract/file_system_contract.cpp
+    tests/contract/file_system_contract_fake.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )
@@ -27,4 +34,6 @@ if(NOT VANTOREL_SANITIZE)
     target_link_libraries(definitions_bench PRIVATE vantorel_native benchmark::benchmark)
     add_executable(xpbutton_bench bench/xpbutton_bench.cpp)
     target_link_libraries(xpbutton_bench PRIVATE vantorel_fakes benchmark::benchmark)
+    add_executable(download_bench bench/download_bench.cpp)
+    target_link_libraries(download_bench PRIVATE vantorel_core benchmark::benchmark)
 endif()

@@ -6,11 +6,15 @@ set(CMAKE_CROSSCOMPILING_EMULATOR sh ${CMAKE_SOURCE_DIR}/tests/win32/wine-exec $
 
 add_library(vantorel_win32 STATIC
     src/platform/win32/controls_win32.cpp
+    src/platform/win32/file_system_win32.cpp
     src/platform/win32/files_win32.cpp
+    src/platform/win32/http_transfer_win32.cpp
+    src/platform/win32/message_pump_win32.cpp
     src/platform/win32/options_window_win32.cpp
+    src/platform/win32/picture_box_win32.cpp
     src/platform/win32/registry_win32.cpp
 )
-target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi user32 gdi32)
+target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet user32 gdi32)
 target_compile_definitions(vantorel_win32 PUBLIC WIN32_LEAN_AND_MEAN NOMINMAX)
 
 # Icons drawn at build time, the manifest and the version resource.
@@ -41,9 +45,9 @@ add_subdirectory(/usr/src/googletest ${CMAKE_BINARY_DIR}/_gtest EXCLUDE_FROM_ALL
 # Wine services inherit ctest's output pipe and stall it: a fixture starts a virtual display and a
 # persistent wineserver (and the prefix) once, quietly, and stops both at the end. A server left
 # running for the prefix (an interrupted run) is simply used.
-# One shell word list: a CMake list would put ";" between the words and split the sh -c commands,
-# leaving wineserver on the default prefix.
-set(WINE_ENV "WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=")
+# One text for `sh -c`: a CMake list would reach the shell joined with ";", which ends the `env`
+# command at the first variable and leaves wineserver on the default prefix.
+set(WINE_ENV "WINEPREFIX='${VANTOREL_WINEPREFIX}' WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml=")
 add_test(NAME wine_start COMMAND sh -c
     "sh '${CMAKE_SOURCE_DIR}/tests/win32/xvfb-fixture' start '${CMAKE_BINARY_DIR}' && . '${CMAKE_BINARY_DIR}/xvfb.env' && mkdir -p '${VANTOREL_WINEPREFIX}' && { env ${WINE_ENV} wineserver -p </dev/null >/dev/null 2>&1 || true; } && env ${WINE_ENV} wine wineboot </dev/null >/dev/null 2>&1")
 set_tests_properties(wine_start PROPERTIES FIXTURES_SETUP wine)
@@ -88,3 +92,55 @@ set_tests_properties(xpbutton_gallery PROPERTIES FIXTURES_REQUIRED wine TIMEOUT 
 # End-to-end: the real vantorel.exe driven under Wine on a virtual display of its own.
 add_test(NAME e2e COMMAND /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/e2e/e2e_tests.py ${CMAKE_BINARY_DIR})
 set_tests_properties(e2e PROPERTIES TIMEOUT 900)
+
+# The downloader with the real WinINet transfer against the scriptable HTTP server on 127.0.0.1, which
+# a fixture starts in the background (its port chosen by the system) and stops by its PID.
+set(VANTOREL_HTTP_DIR ${CMAKE_BINARY_DIR}/http-server)
+add_test(NAME http_server_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh start ${VANTOREL_HTTP_DIR}
+    /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/servers/http_test_server.py)
+set_tests_properties(http_server_start PROPERTIES FIXTURES_SETUP http_server)
+add_test(NAME http_server_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh stop ${VANTOREL_HTTP_DIR})
+set_tests_properties(http_server_stop PROPERTIES FIXTURES_CLEANUP http_server)
+
+# Two https servers: one with a certificate from a test authority, one self-signed.
+set(VANTOREL_HTTPS_DIR ${CMAKE_BINARY_DIR}/https-servers)
+add_test(NAME https_servers_start COMMAND sh -c "\
+    '${CMAKE_SOURCE_DIR}/tests/servers/make_test_certificates.sh' '${VANTOREL_HTTPS_DIR}/certs' && \
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' start '${VANTOREL_HTTPS_DIR}/trusted' /usr/bin/python3 \
+        '${CMAKE_SOURCE_DIR}/tests/servers/http_test_server.py' \
+        --tls '${VANTOREL_HTTPS_DIR}/certs/server.pem' '${VANTOREL_HTTPS_DIR}/certs/server.key' && \
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' start '${VANTOREL_HTTPS_DIR}/untrusted' /usr/bin/python3 \
+        '${CMAKE_SOURCE_DIR}/tests/servers/http_test_server.py' \
+        --tls '${VANTOREL_HTTPS_DIR}/certs/untrusted.pem' '${VANTOREL_HTTPS_DIR}/certs/untrusted.key'")
+set_tests_properties(https_servers_start PROPERTIES FIXTURES_SETUP https_servers)
+add_test(NAME https_servers_stop COMMAND sh -c "\
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/trusted'; \
+    '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/untrusted'")
+set_tests_properties(https_servers_stop PROPERTIES FIXTURES_CLEANUP https_servers)
+
+vantorel_wine_test(draw_progress_win32_tests tests/win32/draw_progress_win32_test.cpp)
+
+vantorel_wine_test(file_system_win32_tests
+    tests/contract/file_system_contract.cpp
+    tests/win32/file_system_win32_test.cpp
+)
+
+vantorel_wine_test(download_win32_tests tests/win32/download_win32_test.cpp)
+target_link_libraries(download_win32_tests PRIVATE ws2_32 crypt32)
+set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server;https_servers"
+    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;VANTOREL_HTTPS_DIR=${VANTOREL_HTTPS_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1")
+
+# The download benchmark (bench/run-download-bench runs it against the loopback server); not a test.
+add_executable(download_bench_win32 bench/download_bench_win32.cpp)
+target_link_libraries(download_bench_win32 PRIVATE vantorel_win32)
+
+# The update check against nginx serving the update files with the configuration in deploy/.
+set(VANTOREL_NGINX_DIR ${CMAKE_BINARY_DIR}/nginx)
+add_test(NAME nginx_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh start ${VANTOREL_NGINX_DIR})
+set_tests_properties(nginx_start PROPERTIES FIXTURES_SETUP nginx)
+add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh stop ${VANTOREL_NGINX_DIR})
+set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
+
+vantorel_wine_test(update_check_win32_tests tests/win32/update_check_win32_test.cpp)
+set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
+    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1")

@@ -1,0 +1,206 @@
+#include "download/file_downloader.h"
+
+#include <cmath>
+#include <memory>
+
+#include "download/leading_number.h"
+
+namespace vantorel {
+namespace {
+
+constexpr std::size_t kChunkSize = 1024;
+
+// The part after the last separator (`wantFile`) or the part up to and including it; a path
+// without the separator comes back whole. The separator is "/" for addresses and "\" for paths.
+std::string SplitPath(const std::string& path, bool wantFile, bool isAddress) {
+    std::size_t last = path.rfind(isAddress ? '/' : '\\');
+    if (last == std::string::npos) return path;
+    return wantFile ? path.substr(last + 1) : path.substr(0, last + 1);
+}
+
+std::string WithTrailingBackslash(const std::string& path) {
+    return !path.empty() && path.back() == '\\' ? path : path + "\\";
+}
+
+}  // namespace
+
+double FileDownloader::DiskFreeBytes(const std::string& root) {
+    std::uint32_t bytesPerSector = 0, sectorsPerCluster = 0, freeClusters = 0;
+    files_.QueryDiskFreeSpace(WithTrailingBackslash(root), bytesPerSector, sectorsPerCluster, freeClusters);
+    return static_cast<double>(bytesPerSector) * sectorsPerCluster * freeClusters;
+}
+
+void FileDownloader::RequestError(const std::string& description) {
+    Raise(DownloadErrors, "Error: " + description + " occurred.");
+    cancel_ = true;
+}
+
+void FileDownloader::FileError(const platform::FileError& error) {
+    Raise(DownloadErrors,
+          "Cannot write file to disk.\r\rError " + std::to_string(error.number) + ": " + error.description);
+    cancel_ = true;
+}
+
+bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_t& announced) {
+    platform::TransferError error;
+    // The range always starts at 0: nothing has been received when a download starts.
+    if (!Inet_.ExecuteGet("Range: bytes=" + std::to_string(0) + "-\r\n", error)) {
+        RequestError(error.description);
+        return false;
+    }
+    while (Inet_.StillExecuting()) {
+        pump_.PumpMessages();
+        if (cancel_) return false;
+    }
+
+    std::string header;
+    if (!Inet_.GetHeader(header, error)) {
+        RequestError(error.description);
+        return false;
+    }
+    const std::string status = header.size() > 9 ? header.substr(9, 3) : std::string();
+    if (status != "200" && status != "206") {
+        if (status == "204") {
+            Raise(DownloadErrors, "Nothing to download!");
+        } else if (status == "401") {
+            Raise(DownloadErrors, "Authorization failed!");
+        } else if (status == "404") {
+            Raise(DownloadErrors, "The file, \"" + Inet_.URL() + "\" was not found!");
+        } else if (status == "\r\n") {
+            Raise(DownloadErrors, "Cannot establish connection.");
+        } else {
+            std::size_t cr = header.find('\r');
+            std::string first = cr == std::string::npos ? std::string() : header.substr(0, cr + 1);
+            if (first.empty()) first = "<nothing>";
+            Raise(DownloadErrors, "The server returned the following response:\r\r" + first);
+        }
+        cancel_ = true;
+        return false;
+    }
+
+    std::string length;
+    if (!Inet_.GetHeader("Content-Length", length, error)) {
+        RequestError(error.description);
+        return false;
+    }
+    std::int32_t size = 0;
+    if (!RoundToInt32(LeadingNumber(length), size)) {
+        RequestError("Overflow (the server announced " + length + " bytes, more than a download can take)");
+        return false;
+    }
+    if (size < 0) {
+        RequestError("Invalid size (the server announced " + length + " bytes)");
+        return false;
+    }
+    announced = size;
+    if (announced == 0) return false;
+
+    if (strDestination.size() >= 3 && strDestination.compare(1, 2, ":\\") == 0) {
+        std::string root = strDestination.substr(0, strDestination.find('\\') + 1);
+        if (announced > DiskFreeBytes(root)) {
+            Raise(DownloadErrors, "There is not enough free space on disk for this file.");
+            cancel_ = true;
+            return false;
+        }
+    }
+    pump_.PumpMessages();
+    return true;
+}
+
+void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t announced, std::int32_t& received) {
+    platform::FileError fileError;
+    received = 0;
+
+    // A destination given without a folder has no folder to create.
+    if (strDestination.find('\\') != std::string::npos) {
+        std::string folder = SplitPath(strDestination, false, false);
+        if (!files_.FolderExists(folder) && !files_.CreateFolder(folder, fileError)) {
+            FileError(fileError);
+            return;
+        }
+    }
+
+    const std::string partial = PartialPath(strDestination);
+    std::unique_ptr<platform::FileWriter> file = files_.CreateNew(partial, fileError);
+    if (!file) {
+        FileError(fileError);
+        return;
+    }
+
+    std::string buffer;
+    bool failed = false;
+    for (;;) {
+        platform::TransferError readError;
+        if (!Inet_.GetChunk(kChunkSize, buffer, readError)) {
+            FileError({readError.number, readError.description});
+            failed = true;
+            break;
+        }
+        // Nothing beyond the announced size is ever written: the server is not to be trusted with
+        // the disk.
+        if (static_cast<std::int64_t>(received) + static_cast<std::int64_t>(buffer.size()) > announced) {
+            if (!cancel_) {
+                Raise(DownloadErrors,
+                      "The server sent more than the " + std::to_string(announced) + " bytes it announced.");
+            }
+            cancel_ = true;
+            failed = true;
+            break;
+        }
+        if (!file->Write(buffer, fileError)) {
+            FileError(fileError);
+            failed = true;
+            break;
+        }
+        if (cancel_) break;
+        received += static_cast<std::int32_t>(buffer.size());
+        double percent = std::nearbyint(static_cast<double>(received) / announced * 100.0);
+        Raise(DownloadProgress, std::to_string(static_cast<long long>(percent)));
+        pump_.PumpMessages();
+        if (buffer.size() <= 1) break;
+    }
+
+    // After a failure or a cancel the partial file goes anyway: a failing close adds nothing to say.
+    if (!file->Close(fileError) && !failed && !cancel_) FileError(fileError);
+    file.reset();
+    if (!cancel_ && received == announced && !files_.Replace(partial, strDestination, fileError)) {
+        FileError(fileError);
+    }
+}
+
+bool FileDownloader::DownloadFile(const std::string& strURL, const std::string& strDestination,
+                                  const std::string& UserName, const std::string& Password) {
+    cancel_ = false;
+    std::int32_t received = 0;
+    std::int32_t announced = 0;
+
+    Raise(DownloadEvents, "Getting file information");
+    pump_.PumpMessages();
+    Inet_.SetURL(strURL);
+    Inet_.SetUserName(UserName);
+    Inet_.SetPassword(Password);
+
+    if (RequestPhase(strDestination, announced)) FilePhase(strDestination, announced, received);
+
+    // Finish: the destination was replaced only if the download completed; whatever is left of the
+    // partial file goes.
+    const std::string partial = PartialPath(strDestination);
+    bool result = false;
+    if (received == announced) {
+        if (!cancel_) {
+            if (DowloadComplete) DowloadComplete();
+        }
+        result = !cancel_;
+    } else {
+        if (!files_.FileExists(partial)) {
+            cancel_ = true;
+        } else if (!cancel_) {
+            Raise(DownloadErrors, "The connection with the server was reset.");
+        }
+    }
+    if (files_.FileExists(partial)) files_.Delete(partial);
+    Inet_.Cancel();
+    return result;
+}
+
+}  // namespace vantorel

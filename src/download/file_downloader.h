@@ -1,0 +1,64 @@
+// FileDownloader: fetches one file over HTTP into a local path and tells its host what happens
+// through events.
+//
+// `DownloadFile` runs to its end before it returns, letting window messages run while it waits, so
+// the host stays responsive and can call `Cancel`. The body arrives in chunks of at most 1024
+// bytes, each written at once, with one progress event and one message pump per chunk. The data
+// goes into a partial file beside the destination ("<destination>.part"), which takes the
+// destination's place in one step only when the whole announced body has arrived: a download that
+// fails, is refused or is cancelled leaves an existing destination exactly as it was. Every problem
+// is reported through `DownloadErrors`; nothing is thrown to the caller.
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <string>
+
+#include "platform/file_system.h"
+#include "platform/http_transfer.h"
+#include "platform/message_pump.h"
+
+namespace vantorel {
+
+class FileDownloader {
+public:
+    FileDownloader(platform::HttpTransfer& Inet, platform::FileSystem& files, platform::MessagePump& pump)
+        : Inet_(Inet), files_(files), pump_(pump) {}
+    FileDownloader(const FileDownloader&) = delete;
+    FileDownloader& operator=(const FileDownloader&) = delete;
+
+    // Events, set by the host. Any may be left empty.
+    std::function<void(const std::string& strError)> DownloadErrors;
+    std::function<void(const std::string& strEvent)> DownloadEvents;
+    std::function<void()> DowloadComplete;
+    std::function<void(const std::string& intPercent)> DownloadProgress;
+
+    // Fetches `strURL` into `strDestination` (a full local path). True when the file arrived
+    // complete and the call was not cancelled.
+    bool DownloadFile(const std::string& strURL, const std::string& strDestination, const std::string& UserName = "",
+                      const std::string& Password = "");
+
+    // Asks the running download to stop at its next check.
+    void Cancel() { cancel_ = true; }
+
+    // Where a download into `destination` keeps its data until it is complete.
+    static std::string PartialPath(const std::string& destination) { return destination + ".part"; }
+
+private:
+    void Raise(const std::function<void(const std::string&)>& event, const std::string& text) {
+        if (event) event(text);
+    }
+    // Steps from the request to the file phase; false when the download stops before the file phase.
+    bool RequestPhase(const std::string& strDestination, std::int32_t& announced);
+    void FilePhase(const std::string& strDestination, std::int32_t announced, std::int32_t& received);
+    void RequestError(const std::string& description);
+    void FileError(const platform::FileError& error);
+    double DiskFreeBytes(const std::string& root);
+
+    platform::HttpTransfer& Inet_;
+    platform::FileSystem& files_;
+    platform::MessagePump& pump_;
+    bool cancel_ = false;
+};
+
+}  // namespace vantorel

@@ -1,0 +1,337 @@
+#include "platform/win32/http_transfer_win32.h"
+
+#include <windows.h>
+#include <wininet.h>
+
+#include <thread>
+#include <utility>
+
+#include "platform/http_header.h"
+#include "platform/win32/system_message.h"
+
+namespace vantorel::win32 {
+namespace {
+
+constexpr std::size_t kBlocksAhead = 4;
+
+using UniqueHinternet = UniqueHandle<NullInvalid<HINTERNET, ::InternetCloseHandle>>;
+
+platform::TransferError InternetError(DWORD code) {
+    std::string text = SystemMessage(code, ::GetModuleHandleA("wininet.dll"));
+    // Wine's wininet has no text for some certificate failures; say what they are.
+    if (text == "Error " + std::to_string(code)) {
+        switch (code) {
+            case ERROR_INTERNET_INVALID_CA: text = "The certificate authority is invalid or incorrect."; break;
+            case ERROR_INTERNET_SEC_CERT_DATE_INVALID: text = "The server's certificate has expired."; break;
+            case ERROR_INTERNET_SEC_INVALID_CERT: text = "The server's certificate is invalid."; break;
+            case ERROR_INTERNET_SECURITY_CHANNEL_ERROR: text = "The secure channel could not be set up."; break;
+            default: text = "WinINet error " + std::to_string(code); break;
+        }
+    }
+    return {static_cast<std::int32_t>(code), text};
+}
+
+}  // namespace
+
+struct WinInetTransfer::Shared {
+    enum class Stage { Requesting, Answered, Failed };
+
+    // Set after a change while the window thread waits for one. (Setting it costs a round trip to
+    // the wine server; a window thread busy with the blocks it has does not need it.)
+    UniqueKernelHandle wake{::CreateEventA(nullptr, FALSE, FALSE, nullptr)};
+    std::mutex mutex;
+    bool waiting = false;  // the window thread waits, or is about to, for `wake`
+    std::condition_variable room;  // the worker waits here for the window thread to take blocks
+    Stage stage = Stage::Requesting;
+    bool stop = false, bodyEnded = false, bodyFailed = false;
+    platform::TransferError error, bodyError;
+    std::string header;
+    std::deque<std::string> blocks;
+    HINTERNET request = nullptr;  // the open request, closed by whoever takes it first
+
+    template <typename Change>
+    void Publish(Change change) {
+        bool signal = false;
+        {
+            std::lock_guard<std::mutex> lock(mutex);
+            change();
+            signal = waiting;
+        }
+        if (signal) ::SetEvent(wake.get());
+    }
+};
+
+WinInetTransfer::WinInetTransfer(platform::MessagePump& pump, std::size_t blockSize)
+    : pump_(pump), blockSize_(blockSize) {}
+
+WinInetTransfer::~WinInetTransfer() { Cancel(); }
+
+template <typename Ready>
+void WinInetTransfer::WaitPumping(Ready ready) {
+    for (;;) {
+        {
+            std::lock_guard<std::mutex> lock(shared_->mutex);
+            shared_->waiting = !ready(*shared_);
+            if (!shared_->waiting) return;
+        }
+        HANDLE wake = shared_->wake.get();
+        DWORD woke = ::MsgWaitForMultipleObjectsEx(1, &wake, INFINITE, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
+        if (woke == WAIT_OBJECT_0 + 1) {
+            pump_.PumpMessages();
+            // The pump may hold messages back for a moment (it rate-limits its looks at the queue);
+            // wait for the worker alone meanwhile instead of spinning on the same messages.
+            ::WaitForSingleObject(wake, 1);
+        }
+    }
+}
+
+bool WinInetTransfer::ExecuteGet(const std::string& requestHeader, platform::TransferError& error) {
+    Cancel();  // one request at a time
+
+    URL_COMPONENTSA parts{};
+    parts.dwStructSize = sizeof parts;
+    char host[INTERNET_MAX_HOST_NAME_LENGTH + 1] = {}, user[256] = {}, password[256] = {};
+    std::string path(INTERNET_MAX_URL_LENGTH + 1, '\0'), extra(INTERNET_MAX_URL_LENGTH + 1, '\0');
+    parts.lpszHostName = host;
+    parts.dwHostNameLength = sizeof host;
+    parts.lpszUserName = user;
+    parts.dwUserNameLength = sizeof user;
+    parts.lpszPassword = password;
+    parts.dwPasswordLength = sizeof password;
+    parts.lpszUrlPath = path.data();
+    parts.dwUrlPathLength = static_cast<DWORD>(path.size());
+    parts.lpszExtraInfo = extra.data();
+    parts.dwExtraInfoLength = static_cast<DWORD>(extra.size());
+    if (!::InternetCrackUrlA(url_.c_str(), static_cast<DWORD>(url_.size()), 0, &parts)) {
+        error = InternetError(::GetLastError());
+        return false;
+    }
+    if (parts.nScheme != INTERNET_SCHEME_HTTP && parts.nScheme != INTERNET_SCHEME_HTTPS) {
+        error = InternetError(ERROR_INTERNET_UNRECOGNIZED_SCHEME);
+        return false;
+    }
+    Request request;
+    request.host.assign(host, parts.dwHostNameLength);
+    request.port = parts.nPort;
+    request.secure = parts.nScheme == INTERNET_SCHEME_HTTPS;
+    request.path = path.substr(0, parts.dwUrlPathLength) + extra.substr(0, parts.dwExtraInfoLength);
+    if (request.path.empty()) request.path.push_back('/');
+    request.userName = userName_.empty() ? std::string(user, parts.dwUserNameLength) : userName_;
+    request.password = password_.empty() ? std::string(password, parts.dwPasswordLength) : password_;
+    request.headers = requestHeader;
+
+    auto shared = std::make_shared<Shared>();
+    if (!shared->wake) {
+        error = InternetError(::GetLastError());
+        return false;
+    }
+    try {
+        std::thread(&WinInetTransfer::Work, shared, std::move(request), blockSize_).detach();
+    } catch (const std::system_error&) {
+        error = InternetError(ERROR_NOT_ENOUGH_MEMORY);
+        return false;
+    }
+    shared_ = std::move(shared);
+    current_.clear();
+    offset_ = 0;
+    return true;
+}
+
+// The worker: the request, the response header, then the body in blocks. It touches nothing but
+// `shared`, which it keeps alive, so it may outlive the transfer that started it.
+void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize) {
+    auto fail = [&shared](DWORD code) {
+        platform::TransferError error = InternetError(code);
+        shared->Publish([&] {
+            shared->stage = Shared::Stage::Failed;
+            shared->error = error;
+        });
+    };
+    UniqueHinternet session(::InternetOpenA("Vantorel", INTERNET_OPEN_TYPE_PRECONFIG, nullptr, nullptr, 0));
+    UniqueHinternet connection;
+    if (session) {
+        connection.reset(::InternetConnectA(session.get(), request.host.c_str(), request.port,
+                                            request.userName.empty() ? nullptr : request.userName.c_str(),
+                                            request.password.empty() ? nullptr : request.password.c_str(),
+                                            INTERNET_SERVICE_HTTP, 0, 0));
+    }
+    HINTERNET opened = nullptr;
+    if (connection) {
+        DWORD flags = INTERNET_FLAG_RELOAD | INTERNET_FLAG_NO_CACHE_WRITE | INTERNET_FLAG_NO_UI |
+                      INTERNET_FLAG_NO_COOKIES | (request.secure ? INTERNET_FLAG_SECURE : 0);
+        opened = ::HttpOpenRequestA(connection.get(), "GET", request.path.c_str(), nullptr, nullptr, nullptr, flags, 0);
+    }
+    bool stopped = false;
+    if (opened != nullptr) {
+        std::lock_guard<std::mutex> lock(shared->mutex);
+        shared->request = opened;
+        stopped = shared->stop;
+    }
+
+    if (opened == nullptr) {
+        fail(::GetLastError());
+    } else if (stopped) {
+        // Cancelled before the request went out.
+    } else if (!::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()),
+                                   nullptr, 0)) {
+        fail(::GetLastError());
+    } else {
+        std::string header(4096, '\0');
+        DWORD length = static_cast<DWORD>(header.size());
+        BOOL ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
+        if (!ok && ::GetLastError() == ERROR_INSUFFICIENT_BUFFER) {
+            header.resize(length + 1);
+            ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
+        }
+        if (!ok) {
+            fail(::GetLastError());
+        } else {
+            header.resize(length);
+            shared->Publish([&] {
+                shared->header = header;
+                shared->stage = Shared::Stage::Answered;
+            });
+            // The body, in blocks, a few ahead of the window thread.
+            for (;;) {
+                {
+                    std::unique_lock<std::mutex> lock(shared->mutex);
+                    shared->room.wait(lock, [&] { return shared->stop || shared->blocks.size() < kBlocksAhead; });
+                    if (shared->stop) break;
+                }
+                std::string block(blockSize, '\0');
+                std::size_t filled = 0;
+                bool ended = false;
+                DWORD failure = 0;
+                while (filled < block.size()) {
+                    DWORD read = 0;
+                    if (!::InternetReadFile(opened, block.data() + filled, static_cast<DWORD>(block.size() - filled),
+                                            &read)) {
+                        failure = ::GetLastError();
+                        break;
+                    }
+                    if (read == 0) {
+                        ended = true;
+                        break;
+                    }
+                    filled += read;
+                }
+                block.resize(filled);
+                platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
+                shared->Publish([&] {
+                    if (!block.empty()) shared->blocks.push_back(std::move(block));
+                    if (failure != 0) {
+                        shared->bodyFailed = true;
+                        shared->bodyError = error;
+                    }
+                    shared->bodyEnded = ended || failure != 0;
+                });
+                if (ended || failure != 0) break;
+            }
+        }
+    }
+    shared->Publish([&] {
+        if (shared->request != nullptr) ::InternetCloseHandle(shared->request);
+        shared->request = nullptr;
+        if (shared->stage == Shared::Stage::Requesting) {
+            shared->stage = Shared::Stage::Failed;
+            shared->error = InternetError(ERROR_INTERNET_OPERATION_CANCELLED);
+        }
+        shared->bodyEnded = true;
+    });
+}
+
+bool WinInetTransfer::StillExecuting() {
+    if (!shared_) return false;
+    {
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        if (shared_->stage != Shared::Stage::Requesting) return false;
+        shared_->waiting = true;
+    }
+    // A short wait keeps the caller's poll loop from spinning; a waiting message ends it at once.
+    HANDLE wake = shared_->wake.get();
+    ::MsgWaitForMultipleObjectsEx(1, &wake, 10, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
+    std::lock_guard<std::mutex> lock(shared_->mutex);
+    shared_->waiting = false;
+    return shared_->stage == Shared::Stage::Requesting;
+}
+
+bool WinInetTransfer::GetHeader(std::string& header, platform::TransferError& error) {
+    if (!shared_) {
+        header.clear();
+        return true;
+    }
+    WaitPumping([](Shared& s) { return s.stage != Shared::Stage::Requesting; });
+    std::lock_guard<std::mutex> lock(shared_->mutex);
+    if (shared_->stage == Shared::Stage::Failed) {
+        error = shared_->error;
+        return false;
+    }
+    header = shared_->header;
+    return true;
+}
+
+bool WinInetTransfer::GetHeader(const std::string& name, std::string& value, platform::TransferError& error) {
+    std::string header;
+    if (!GetHeader(header, error)) return false;
+    value = platform::HeaderField(header, name);
+    return true;
+}
+
+bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::TransferError& error) {
+    data.clear();
+    if (!shared_) return true;
+    {
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        if (shared_->stage == Shared::Stage::Failed) {
+            error = shared_->error;
+            return false;
+        }
+    }
+    while (data.size() < size) {
+        if (offset_ < current_.size()) {
+            std::size_t take = std::min(size - data.size(), current_.size() - offset_);
+            data.append(current_, offset_, take);
+            offset_ += take;
+            continue;
+        }
+        WaitPumping([](Shared& s) { return !s.blocks.empty() || s.bodyEnded; });
+        bool failed = false;
+        {
+            std::lock_guard<std::mutex> lock(shared_->mutex);
+            if (!shared_->blocks.empty()) {
+                current_ = std::move(shared_->blocks.front());
+                shared_->blocks.pop_front();
+                offset_ = 0;
+            } else {
+                failed = shared_->bodyFailed;
+                if (failed && data.empty()) error = shared_->bodyError;
+            }
+        }
+        shared_->room.notify_one();
+        if (offset_ >= current_.size()) {
+            // The body has ended (or failed): what was gathered is the last chunk; a failure is
+            // reported on a call of its own.
+            if (failed && data.empty()) return false;
+            break;
+        }
+    }
+    return true;
+}
+
+void WinInetTransfer::Cancel() {
+    if (!shared_) return;
+    HINTERNET request = nullptr;
+    {
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        shared_->stop = true;
+        std::swap(request, shared_->request);
+    }
+    shared_->room.notify_all();
+    // Closing the request handle ends the worker's next call on it; the worker closes the rest.
+    if (request != nullptr) ::InternetCloseHandle(request);
+    shared_.reset();
+    current_.clear();
+    offset_ = 0;
+}
+
+}  // namespace vantorel::win32

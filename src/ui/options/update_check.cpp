@@ -1,0 +1,116 @@
+#include "ui/options/update_check.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "download/leading_number.h"
+#include "download/open_url.h"
+#include "ui/options/draw_progress.h"
+
+namespace vantorel {
+namespace {
+
+const char* const kTitle = "Updates";
+
+}  // namespace
+
+UpdateCheck::UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, platform::MessagePump& pump,
+                         platform::Files& files, FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3,
+                         std::string programFolder, ProgramVersion version, std::string server)
+    : frame_(frame),
+      Inet_(Inet),
+      pump_(pump),
+      files_(files),
+      FD1_(FD1),
+      FD2_(FD2),
+      FD3_(FD3),
+      folder_(std::move(programFolder)),
+      version_(version),
+      server_(std::move(server)) {}
+
+void UpdateCheck::ConnectEvents() {
+    FD1_.DownloadErrors = [this](const std::string& strError) {
+        frame_.MsgBoxExclamation("Error downloading definition updates " + strError, kTitle);
+    };
+    FD1_.DowloadComplete = [this] { frame_.SetLCaption(0, "Definitions Updates: Complete"); };
+    FD2_.DownloadErrors = [this](const std::string& strError) {
+        frame_.MsgBoxExclamation("Error downloading program updates " + strError, kTitle);
+    };
+    FD2_.DowloadComplete = [this] { frame_.SetLCaption(1, "Program Updates: Complete"); };
+    FD3_.DownloadErrors = nullptr;
+    FD3_.DowloadComplete = nullptr;
+    for (FileDownloader* fd : {&FD1_, &FD2_, &FD3_}) {
+        fd->DownloadEvents = nullptr;
+        fd->DownloadProgress = [this](const std::string& intPercent) { Progress(intPercent); };
+    }
+}
+
+void UpdateCheck::Progress(const std::string& intPercent) {
+    std::int32_t percent = 0;
+    if (!RoundToInt32(LeadingNumber(intPercent), percent)) return;
+    percent = std::clamp<std::int32_t>(percent, -32768, 32767);
+    DrawProgress(frame_.pb(), static_cast<std::int16_t>(percent), kProgressForeColor, kProgressBackColor);
+}
+
+double UpdateCheck::LocalDefinitionsVersion() {
+    const std::string path = folder_ + "\\defver";
+    std::string content;
+    if (!files_.ReadAll(path, content)) {
+        if (!files_.Exists(path)) frame_.SetLCaption(0, "Definitions Updates: defver has been corrupted");
+        return 0;
+    }
+    if (content.empty()) {
+        frame_.SetLCaption(0, "Definitions Updates: defver has been corrupted");
+        return 0;
+    }
+    return LeadingNumber(content.substr(0, content.find_first_of("\r\n")));
+}
+
+bool UpdateCheck::RemoteVersion(const std::string& path, double& version) {
+    std::string text;
+    platform::TransferError error;
+    if (!OpenURL(Inet_, pump_, server_ + path, text, error)) {
+        frame_.MsgBoxExclamation("Cannot check for updates: the update server " + server_ +
+                                     " could not be reached.\r\r" + error.description,
+                                 kTitle);
+        return false;
+    }
+    version = LeadingNumber(text);
+    return true;
+}
+
+void UpdateCheck::BtnUpdate_Click() {
+    frame_.SetBtnUpdateEnabled(false);
+
+    const double localDefinitions = LocalDefinitionsVersion();
+    double remote = 0;
+    if (!RemoteVersion("/vt/defver", remote)) {
+        frame_.SetBtnUpdateEnabled(true);
+        return;
+    }
+    if (remote <= localDefinitions) {
+        frame_.SetLCaption(0, "Definitions Updates: No Updates");
+    } else {
+        frame_.ShowPb();
+        if (FD1_.DownloadFile(server_ + "/vt/sw2.def", folder_ + "\\sw2.def")) {
+            FD3_.DownloadFile(server_ + "/vt/defver", folder_ + "\\defver");
+        }
+    }
+
+    const double localProgram =
+        LeadingNumber(std::to_string(version_.major) + "." + std::to_string(version_.minor));
+    if (!RemoteVersion("/vt/mainver", remote)) {
+        frame_.SetBtnUpdateEnabled(true);
+        return;
+    }
+    if (remote <= localProgram) {
+        frame_.SetLCaption(1, "Program Updates: No Updates");
+    } else {
+        frame_.ShowPb();
+        FD2_.DownloadFile(server_ + "/vt/VTSetup.exe", folder_ + "\\VTSetup.exe");
+    }
+
+    frame_.SetBtnUpdateEnabled(true);
+}
+
+}  // namespace vantorel

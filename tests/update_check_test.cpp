@@ -1,0 +1,187 @@
+// The update check against a pretend web server, an in-memory program folder and a recording
+// updates panel: which files are fetched in which order, what the labels and message boxes say,
+// and that a failed definitions download leaves the installed version where it was.
+#include "ui/options/update_check.h"
+
+#include <gtest/gtest.h>
+
+#include "fakes/fake_file_system.h"
+#include "fakes/fake_http_transfer.h"
+#include "fakes/fake_message_pump.h"
+#include "fakes/fake_picture_box.h"
+#include "fakes/fake_updates_frame.h"
+#include "fakes/fake_registry.h"
+#include "settings/registry_routines.h"
+#include "settings/server_address.h"
+
+namespace vantorel {
+namespace {
+
+using testing::FakeFileSystem;
+using testing::FakeHttpTransfer;
+using testing::FakeMessagePump;
+using testing::FakePictureBox;
+using testing::FakeWebServer;
+using testing::FakeUpdatesFrame;
+
+const std::string kServer = "http://updates.test";
+const std::string kFolder = "C:\\Vantorel";
+
+struct Rig {
+    FakeWebServer server;
+    FakeHttpTransfer inet, t1, t2, t3;
+    FakeFileSystem disk;
+    FakeMessagePump pump;
+    FileDownloader FD1{t1, disk, pump}, FD2{t2, disk, pump}, FD3{t3, disk, pump};
+    FakeUpdatesFrame frame;
+    ProgramVersion version{1, 0};
+
+    Rig() {
+        for (FakeHttpTransfer* t : {&inet, &t1, &t2, &t3}) t->server = &server;
+        disk.files[kFolder + "\\defver"] = "20\r\n";
+        disk.files[kFolder + "\\sw2.def"] = "old definitions";
+        server.PutFile(kServer + "/vt/defver", "20");
+        server.PutFile(kServer + "/vt/mainver", "1.0");
+    }
+    void Click() {
+        UpdateCheck check(frame, inet, pump, disk, FD1, FD2, FD3, kFolder, version, kServer);
+        check.ConnectEvents();
+        check.BtnUpdate_Click();
+    }
+    std::string File(const std::string& name) { return disk.files[kFolder + "\\" + name]; }
+};
+
+using Log = std::vector<std::string>;
+
+TEST(UpdateCheck, NewerDefinitionsReplaceTheFileAndThenTheVersion) {
+    Rig rig;
+    rig.server.PutFile(kServer + "/vt/defver", "21\r\n");
+    rig.server.PutFile(kServer + "/vt/sw2.def", std::string(3000, 'd'));
+    rig.Click();
+    EXPECT_EQ(rig.server.requests, (Log{kServer + "/vt/defver", kServer + "/vt/sw2.def", kServer + "/vt/defver",
+                                        kServer + "/vt/mainver"}));
+    EXPECT_EQ(rig.File("sw2.def"), std::string(3000, 'd'));
+    EXPECT_EQ(rig.File("defver"), "21\r\n");
+    EXPECT_EQ(rig.frame.log, (Log{"disable", "L0:Definitions Updates: Complete", "L1:Program Updates: No Updates",
+                                  "enable"}));
+    EXPECT_TRUE(rig.frame.pbVisible);
+    EXPECT_EQ(rig.frame.box.printed.back(), "100%") << "progress of the downloads is painted into pb";
+}
+
+TEST(UpdateCheck, VersionsCompareAsNumbers) {
+    // Equal: nothing is fetched beyond the version files and pb stays hidden.
+    Rig equal;
+    equal.Click();
+    EXPECT_EQ(equal.server.requests, (Log{kServer + "/vt/defver", kServer + "/vt/mainver"}));
+    EXPECT_EQ(equal.frame.log, (Log{"disable", "L0:Definitions Updates: No Updates", "L1:Program Updates: No Updates",
+                                    "enable"}));
+    EXPECT_FALSE(equal.frame.pbVisible);
+
+    // Server 3 against local 10 is older, whatever the texts say when compared as texts.
+    Rig older;
+    older.disk.files[kFolder + "\\defver"] = "10";
+    older.server.PutFile(kServer + "/vt/defver", "3");
+    older.Click();
+    EXPECT_EQ(older.frame.L[0], "Definitions Updates: No Updates");
+
+    // Program 1.10 reads as 1.1, below a server's 1.9: the setup program is fetched.
+    Rig program;
+    program.version = {1, 10};
+    program.server.PutFile(kServer + "/vt/mainver", "1.9");
+    program.server.PutFile(kServer + "/vt/VTSetup.exe", std::string(5000, 'x'));
+    program.Click();
+    EXPECT_EQ(program.File("VTSetup.exe"), std::string(5000, 'x'));
+    EXPECT_EQ(program.frame.L[1], "Program Updates: Complete");
+    EXPECT_TRUE(program.frame.pbVisible);
+
+    // A version request answered with an error page reads as version 0.
+    Rig errorPage;
+    errorPage.server.responses.erase(kServer + "/vt/defver");
+    errorPage.Click();
+    EXPECT_EQ(errorPage.frame.L[0], "Definitions Updates: No Updates");
+}
+
+TEST(UpdateCheck, FailedDefinitionsDownloadKeepsTheInstalledVersionSoTheNextCheckRetries) {
+    Rig rig;
+    rig.server.PutFile(kServer + "/vt/defver", "21");  // but no sw2.def on the server
+    rig.Click();
+    EXPECT_EQ(rig.frame.log,
+              (Log{"disable",
+                   "msgbox[Updates]:Error downloading definition updates The file, \"" + kServer +
+                       "/vt/sw2.def\" was not found!",
+                   "L1:Program Updates: No Updates", "enable"}));
+    EXPECT_EQ(rig.server.requests, (Log{kServer + "/vt/defver", kServer + "/vt/sw2.def", kServer + "/vt/mainver"}))
+        << "defver is not fetched after a failed sw2.def";
+    EXPECT_EQ(rig.File("defver"), "20\r\n");
+    EXPECT_EQ(rig.File("sw2.def"), "old definitions");
+
+    // The server is mended; the next check fetches both.
+    rig.server.PutFile(kServer + "/vt/sw2.def", "new definitions");
+    rig.Click();
+    EXPECT_EQ(rig.File("sw2.def"), "new definitions");
+    EXPECT_EQ(rig.File("defver"), "21");
+}
+
+TEST(UpdateCheck, MissingOrEmptyLocalVersionCountsAsZero) {
+    for (const char* state : {"missing", "empty"}) {
+        SCOPED_TRACE(state);
+        Rig rig;
+        if (std::string(state) == "missing")
+            rig.disk.files.erase(kFolder + "\\defver");
+        else
+            rig.disk.files[kFolder + "\\defver"] = "";
+        rig.server.PutFile(kServer + "/vt/defver", "1");
+        rig.server.PutFile(kServer + "/vt/sw2.def", "defs");
+        rig.Click();
+        EXPECT_EQ(rig.frame.log[1], "L0:Definitions Updates: defver has been corrupted");
+        EXPECT_EQ(rig.frame.L[0], "Definitions Updates: Complete");
+        EXPECT_EQ(rig.File("defver"), "1");
+    }
+    // A file that exists but cannot be read: version 0 without the message.
+    Rig locked;
+    locked.disk.unreadable.insert(kFolder + "\\defver");
+    locked.server.PutFile(kServer + "/vt/defver", "1");
+    locked.server.PutFile(kServer + "/vt/sw2.def", "defs");
+    locked.Click();
+    EXPECT_EQ(locked.frame.log[1], "L0:Definitions Updates: Complete");
+}
+
+TEST(UpdateCheck, UnreachableServerIsReportedOnceAndTheButtonComesBack) {
+    Rig rig;
+    rig.server.reachable = false;
+    rig.Click();
+    ASSERT_EQ(rig.frame.log.size(), 3u);
+    EXPECT_EQ(rig.frame.log[0], "disable");
+    EXPECT_EQ(rig.frame.log[1].rfind("msgbox[Updates]:", 0), 0u) << rig.frame.log[1];
+    EXPECT_NE(rig.frame.log[1].find(kServer), std::string::npos) << rig.frame.log[1];
+    EXPECT_NE(rig.frame.log[1].find("The attempt to connect to the server failed."), std::string::npos);
+    EXPECT_EQ(rig.frame.log[2], "enable");
+    EXPECT_TRUE(rig.frame.enabled);
+    EXPECT_EQ(rig.File("sw2.def"), "old definitions");
+}
+
+TEST(UpdateCheck, ProgramDownloadErrorsHaveTheirOwnMessage) {
+    Rig rig;
+    rig.server.PutFile(kServer + "/vt/mainver", "2");
+    rig.server.responses[kServer + "/vt/VTSetup.exe"] = {"HTTP/1.1 401 Unauthorized\r\n\r\n", ""};
+    rig.Click();
+    EXPECT_EQ(rig.frame.log[2], "msgbox[Updates]:Error downloading program updates Authorization failed!");
+    EXPECT_EQ(rig.frame.L[1], "Program Updates:") << "the caption keeps its text after a failure";
+    EXPECT_EQ(rig.disk.files.count(kFolder + "\\VTSetup.exe"), 0u);
+}
+
+TEST(ServerAddress, IsASettingWithABuiltInDefault) {
+    testing::FakeRegistry registry;
+    EXPECT_EQ(ServerAddress(registry), kDefaultServerAddress);
+    RegistryRoutines reg(registry);
+    reg.hkey(platform::kHkeyLocalMachine);
+    reg.KeyRoot("SOFTWARE\\Vantorel\\");
+    reg.CreateKey();
+    ASSERT_TRUE(reg.SetRegistryValue("Server", std::string("http://127.0.0.1:8080/"), platform::kRegSz));
+    EXPECT_EQ(ServerAddress(registry), "http://127.0.0.1:8080");
+    ASSERT_TRUE(reg.SetRegistryValue("Server", std::string(""), platform::kRegSz));
+    EXPECT_EQ(ServerAddress(registry), kDefaultServerAddress);
+}
+
+}  // namespace
+}  // namespace vantorel

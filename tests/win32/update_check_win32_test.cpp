@@ -1,0 +1,160 @@
+// The update check end to end under Wine: the real registry holds the server address, nginx (the
+// configuration in deploy/, started by a CTest fixture on a loopback port) serves the update files,
+// and the real WinINet transfers, disk and message pump do the work. The updates panel is a
+// recording fake: the options window itself is not part of this test.
+#include <windows.h>
+
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <sstream>
+
+#include "fakes/fake_updates_frame.h"
+#include "platform/win32/file_system_win32.h"
+#include "platform/win32/files_win32.h"
+#include "platform/win32/http_transfer_win32.h"
+#include "platform/win32/message_pump_win32.h"
+#include "platform/win32/registry_win32.h"
+#include "settings/registry_routines.h"
+#include "settings/server_address.h"
+#include "ui/options/update_check.h"
+
+namespace vantorel {
+namespace {
+
+std::string ReadFile(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    std::stringstream content;
+    content << in.rdbuf();
+    return content.str();
+}
+
+void WriteFile(const std::string& path, const std::string& content) {
+    std::ofstream(path, std::ios::binary) << content;
+}
+
+class NginxUpdateCheck : public ::testing::Test {
+protected:
+    void SetUp() override {
+        const char* dir = std::getenv("VANTOREL_NGINX_DIR");
+        ASSERT_NE(dir, nullptr) << "VANTOREL_NGINX_DIR is not set";
+        std::string port = ReadFile(std::string("Z:") + dir + "/server.port");
+        while (!port.empty() && (port.back() == '\n' || port.back() == '\r')) port.pop_back();
+        ASSERT_FALSE(port.empty()) << "nginx is not running";
+        www_ = std::string("Z:") + dir + "/www/vt/";
+        for (const char* name : {"defver", "sw2.def", "mainver", "VTSetup.exe"}) ::DeleteFileA((www_ + name).c_str());
+
+        // The address goes through the setting, as the program reads it.
+        RegistryRoutines reg(registry_);
+        reg.hkey(platform::kHkeyLocalMachine);
+        reg.KeyRoot("SOFTWARE\\Vantorel\\");
+        reg.CreateKey();
+        ASSERT_TRUE(reg.SetRegistryValue("Server", std::string("http://127.0.0.1:" + port + "/"), platform::kRegSz));
+
+        char temp[MAX_PATH];
+        ::GetTempPathA(MAX_PATH, temp);
+        folder_ = std::string(temp) + "vtupd-" + std::to_string(::GetCurrentProcessId());
+        ::CreateDirectoryA(folder_.c_str(), nullptr);
+        WriteFile(folder_ + "\\defver", "20\r\n");
+        WriteFile(folder_ + "\\sw2.def", "installed definitions\r\n");
+    }
+    void TearDown() override {
+        for (const char* name : {"\\defver", "\\sw2.def", "\\VTSetup.exe"}) ::DeleteFileA((folder_ + name).c_str());
+        EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
+        RegistryRoutines reg(registry_);
+        reg.hkey(platform::kHkeyLocalMachine);
+        reg.KeyRoot("SOFTWARE\\Vantorel\\");
+        reg.DeleteValue("Server");
+    }
+    void Serve(const std::string& name, const std::string& content) { WriteFile(www_ + name, content); }
+    void Click(ProgramVersion version = {1, 0}) {
+        UpdateCheck check(frame_, inet_, pump_, files_, FD1_, FD2_, FD3_, folder_, version, ServerAddress(registry_));
+        check.ConnectEvents();
+        check.BtnUpdate_Click();
+    }
+    std::string Local(const std::string& name) { return ReadFile(folder_ + "\\" + name); }
+
+    win32::Win32Registry registry_;
+    win32::Win32MessagePump pump_;
+    win32::WinInetTransfer inet_{pump_}, t1_{pump_}, t2_{pump_}, t3_{pump_};
+    win32::Win32FileSystem disk_;
+    win32::Win32Files files_;
+    FileDownloader FD1_{t1_, disk_, pump_}, FD2_{t2_, disk_, pump_}, FD3_{t3_, disk_, pump_};
+    testing::FakeUpdatesFrame frame_;
+    std::string www_, folder_;
+};
+
+using Log = std::vector<std::string>;
+
+TEST_F(NginxUpdateCheck, NewerDefinitionsReplaceSw2DefAndDefver) {
+    std::string definitions;
+    for (int i = 0; i < 3000; ++i) definitions += std::to_string(-1000000 + i * 7) + "\r\n";
+    Serve("defver", "21\n");
+    Serve("sw2.def", definitions);
+    Serve("mainver", "1.0\n");
+    Click();
+    EXPECT_EQ(frame_.log, (Log{"disable", "L0:Definitions Updates: Complete", "L1:Program Updates: No Updates",
+                               "enable"}));
+    EXPECT_EQ(Local("sw2.def"), definitions);
+    EXPECT_EQ(Local("defver"), "21\n");
+    EXPECT_TRUE(frame_.pbVisible);
+    EXPECT_EQ(frame_.box.printed.back(), "100%");
+}
+
+TEST_F(NginxUpdateCheck, EqualOrOlderVersionsFetchNothing) {
+    Serve("defver", "20");
+    Serve("mainver", "1.0");
+    Click();
+    EXPECT_EQ(frame_.log, (Log{"disable", "L0:Definitions Updates: No Updates", "L1:Program Updates: No Updates",
+                               "enable"}));
+    EXPECT_FALSE(frame_.pbVisible);
+
+    // 3 against 10: older as numbers, though "3" sorts after "10" as text.
+    WriteFile(folder_ + "\\defver", "10\r\n");
+    Serve("defver", "3");
+    Serve("sw2.def", "should not be fetched");
+    frame_.log.clear();
+    Click();
+    EXPECT_EQ(frame_.L[0], "Definitions Updates: No Updates");
+    EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
+}
+
+TEST_F(NginxUpdateCheck, ProgramVersionOneTenIsOlderThanOneNine) {
+    Serve("defver", "20");
+    Serve("mainver", "1.9\r\n");
+    std::string setup(200000, '\0');
+    for (std::size_t i = 0; i < setup.size(); ++i) setup[i] = static_cast<char>(i * 13);
+    Serve("VTSetup.exe", setup);
+    Click({1, 10});
+    EXPECT_EQ(frame_.L[1], "Program Updates: Complete");
+    EXPECT_EQ(Local("VTSetup.exe"), setup);
+}
+
+TEST_F(NginxUpdateCheck, MissingDefinitionsOnTheServerKeepTheInstalledVersion) {
+    Serve("defver", "21");
+    Serve("mainver", "1.0");
+    Click();
+    ASSERT_GE(frame_.log.size(), 2u);
+    EXPECT_EQ(frame_.log[1], "msgbox[Updates]:Error downloading definition updates The file, \"" +
+                                 ServerAddress(registry_) + "/vt/sw2.def\" was not found!");
+    EXPECT_EQ(Local("defver"), "20\r\n") << "defver is fetched only after sw2.def";
+    EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
+    EXPECT_TRUE(frame_.enabled);
+}
+
+TEST_F(NginxUpdateCheck, UnreachableServerIsReportedAndTheButtonComesBack) {
+    RegistryRoutines reg(registry_);
+    reg.hkey(platform::kHkeyLocalMachine);
+    reg.KeyRoot("SOFTWARE\\Vantorel\\");
+    // Port 9 (discard) is not served on this loopback.
+    ASSERT_TRUE(reg.SetRegistryValue("Server", std::string("http://127.0.0.1:9"), platform::kRegSz));
+    Click();
+    ASSERT_EQ(frame_.log.size(), 3u);
+    EXPECT_EQ(frame_.log[1].rfind("msgbox[Updates]:Cannot check for updates", 0), 0u) << frame_.log[1];
+    EXPECT_EQ(frame_.log[2], "enable");
+    EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
+}
+
+}  // namespace
+}  // namespace vantorel
