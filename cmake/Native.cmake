@@ -9,8 +9,11 @@ target_link_libraries(vantorel_native PUBLIC vantorel_core)
 
 add_executable(vantorel_tests
     tests/definitions_test.cpp
+    tests/guard_test.cpp
     tests/read_definitions_test.cpp
     tests/registry_routines_test.cpp
+    tests/sweep_test.cpp
+    tests/tray_test.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )
