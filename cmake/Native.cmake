@@ -4,6 +4,7 @@ include(GoogleTest)
 
 add_library(vantorel_native STATIC
     src/platform/std/files_std.cpp
+    src/platform/linux/connection_table_linux.cpp
 )
 target_link_libraries(vantorel_native PUBLIC vantorel_core)
 
@@ -19,6 +20,14 @@ add_executable(vantorel_tests
 )
 target_link_libraries(vantorel_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)
 gtest_discover_tests(vantorel_tests DISCOVERY_TIMEOUT 60)
+
+# Real teardown of real loopback connections through the Linux table; needs root, skips without.
+add_executable(teardown_linux_tests
+    tests/linux/loopback.cpp
+    tests/linux/teardown_test.cpp
+)
+target_link_libraries(teardown_linux_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)
+gtest_discover_tests(teardown_linux_tests DISCOVERY_TIMEOUT 60)
 
 # Benchmarks are not run by the tests; the sanitizer build leaves them out.
 if(NOT VANTOREL_SANITIZE)
