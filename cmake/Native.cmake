@@ -1,5 +1,6 @@
 # Native (Linux) build: the portable core against fakes, the Linux platform pieces, benchmarks.
 find_package(GTest REQUIRED)
+find_package(Threads REQUIRED)
 include(GoogleTest)
 
 add_library(vantorel_native STATIC
@@ -34,4 +35,6 @@ if(NOT VANTOREL_SANITIZE)
     find_package(benchmark REQUIRED)
     add_executable(definitions_bench bench/definitions_bench.cpp)
     target_link_libraries(definitions_bench PRIVATE vantorel_native benchmark::benchmark)
+    add_executable(sweep_bench bench/sweep_bench.cpp tests/linux/loopback.cpp)
+    target_link_libraries(sweep_bench PRIVATE vantorel_fakes vantorel_native benchmark::benchmark Threads::Threads)
 endif()
