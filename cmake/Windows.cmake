@@ -5,10 +5,13 @@ set(CMAKE_CROSSCOMPILING_EMULATOR
     env WINEPREFIX=${VANTOREL_WINEPREFIX} WINEDEBUG=-all WINEDLLOVERRIDES=mscoree,mshtml= /usr/bin/wine)
 
 add_library(vantorel_win32 STATIC
+    src/platform/win32/connection_table_win32.cpp
     src/platform/win32/files_win32.cpp
+    src/platform/win32/main_window_win32.cpp
     src/platform/win32/registry_win32.cpp
+    src/platform/win32/shell_win32.cpp
 )
-target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi)
+target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi iphlpapi shell32 user32 gdi32)
 target_compile_definitions(vantorel_win32 PUBLIC WIN32_LEAN_AND_MEAN NOMINMAX)
 
 add_executable(vantorel WIN32 src/platform/win32/main_win32.cpp)
