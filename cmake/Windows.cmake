@@ -42,3 +42,22 @@ vantorel_wine_test(registry_win32_tests
     tests/contract/registry_contract.cpp
     tests/win32/registry_win32_test.cpp
 )
+
+vantorel_wine_test(connection_table_win32_tests tests/win32/connection_table_win32_test.cpp)
+target_link_libraries(connection_table_win32_tests PRIVATE ws2_32)
+
+# Tests that open windows run on a virtual display of their own, started and stopped by a fixture.
+set(VANTOREL_TEST_DISPLAY ":200" CACHE STRING "Virtual X display for the Wine tests that open windows")
+set(VANTOREL_XVFB_PID ${CMAKE_BINARY_DIR}/xvfb.pid)
+add_test(NAME xvfb_start COMMAND sh -c
+    "Xvfb ${VANTOREL_TEST_DISPLAY} -screen 0 1024x768x24 -nolisten tcp </dev/null >/dev/null 2>&1 & echo $! > '${VANTOREL_XVFB_PID}'; sleep 1; kill -0 $(cat '${VANTOREL_XVFB_PID}')")
+set_tests_properties(xvfb_start PROPERTIES FIXTURES_SETUP display)
+add_test(NAME xvfb_stop COMMAND sh -c "[ -f '${VANTOREL_XVFB_PID}' ] && kill $(cat '${VANTOREL_XVFB_PID}'); rm -f '${VANTOREL_XVFB_PID}'; exit 0")
+set_tests_properties(xvfb_stop PROPERTIES FIXTURES_CLEANUP display)
+
+# The program needs its definitions beside it.
+configure_file(${CMAKE_SOURCE_DIR}/data/sw2.def ${CMAKE_BINARY_DIR}/sw2.def COPYONLY)
+
+vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
+add_dependencies(guard_win32_tests vantorel)
+set_tests_properties(guard_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;display" ENVIRONMENT DISPLAY=${VANTOREL_TEST_DISPLAY})
