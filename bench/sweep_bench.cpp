@@ -101,6 +101,7 @@ private:
 class IdlePump final : public platform::MessagePump {
 public:
     bool PumpMessages() override { return !quit_.load(std::memory_order_relaxed); }
+    bool YieldToMessages() override { return !quit_.load(std::memory_order_relaxed); }
 
 private:
     std::atomic<bool> quit_{false};

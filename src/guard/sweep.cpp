@@ -63,7 +63,7 @@ void ConnectionSweep::SweepConnections() {
     last_.rows = rows;
     const auto* words = reinterpret_cast<const unsigned char*>(buffer_.data() + 1);
     for (std::uint32_t i = 0; i < rows; ++i) {
-        if (!services_.pump.PumpMessages()) break;  // the program is quitting
+        if (!services_.pump.YieldToMessages()) break;  // the program is quitting
         ++last_.examined;
         platform::TcpRow row;
         std::memcpy(&row, words + static_cast<std::size_t>(i) * sizeof row, sizeof row);

@@ -84,6 +84,11 @@ public:
     // Runs every message waiting now and returns. False when the program has been asked to quit:
     // long work then stops at once.
     virtual bool PumpMessages() = 0;
+
+    // The yield of a long loop, called once per step: lets waiting messages run, but may look at the
+    // queue less often than it is called (a message then waits a moment, never longer than a
+    // millisecond or so). Same result as PumpMessages.
+    virtual bool YieldToMessages() { return PumpMessages(); }
 };
 
 // Placement of top-level windows and the screen they are on.

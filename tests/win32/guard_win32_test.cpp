@@ -272,8 +272,19 @@ TEST(SingleInstanceWin32, SecondStartOfTheProgramEndsSilently) {
     HANDLE firstOutput = nullptr;
     std::string ignored;
     ASSERT_EQ(RunProgram("\"" + exe + "\"", ignored, 0, &first, &firstOutput), 0);
+    // Start-up is over when the program reports it.
+    std::string firstSays;
     DWORD until = ::GetTickCount() + 30000;
-    while (CountMainWindows() == 0 && ::GetTickCount() < until) ::Sleep(100);
+    while (firstSays.find("Started") == std::string::npos && ::GetTickCount() < until) {
+        char buffer[256];
+        DWORD available = 0, got = 0;
+        if (::PeekNamedPipe(firstOutput, nullptr, 0, nullptr, &available, nullptr) && available > 0 &&
+            ::ReadFile(firstOutput, buffer, sizeof buffer, &got, nullptr))
+            firstSays.append(buffer, got);
+        else
+            ::Sleep(50);
+    }
+    ASSERT_NE(firstSays.find("Started"), std::string::npos) << firstSays;
     ASSERT_EQ(CountMainWindows(), 1) << "the first start shows its window";
     WriteSetting(HKEY_CURRENT_USER, "State", "1");  // a second start that read it would write it back
 

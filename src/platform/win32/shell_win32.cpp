@@ -30,9 +30,24 @@ bool Win32WindowManager::SetWindowPos(platform::WindowHandle window, platform::W
 std::int32_t Win32WindowManager::ScreenWidth() const { return ::GetSystemMetrics(SM_CXSCREEN); }
 std::int32_t Win32WindowManager::ScreenHeight() const { return ::GetSystemMetrics(SM_CYSCREEN); }
 
+Win32MessagePump::Win32MessagePump() {
+    LARGE_INTEGER frequency;
+    ::QueryPerformanceFrequency(&frequency);
+    yieldTicks_ = frequency.QuadPart * kYieldMicroseconds / 1'000'000;
+}
+
+bool Win32MessagePump::YieldToMessages() {
+    if (quitting_) return false;
+    LARGE_INTEGER now;
+    ::QueryPerformanceCounter(&now);
+    if (now.QuadPart - lastLook_ < yieldTicks_) return true;
+    lastLook_ = now.QuadPart;
+    return PumpMessages();
+}
+
 bool Win32MessagePump::PumpMessages() {
     if (quitting_) return false;
-    // The common case during a sweep: nothing waiting. The high word is what the queue holds now.
+    // The common case: nothing waiting. The high word is what the queue holds now.
     if (HIWORD(::GetQueueStatus(QS_ALLINPUT)) == 0) return true;
     MSG message;
     while (::PeekMessageA(&message, nullptr, 0, 0, PM_REMOVE)) {

@@ -23,15 +23,25 @@ public:
     std::int32_t ScreenHeight() const override;
 };
 
-// Runs the messages waiting on this thread. With nothing waiting it costs one GetQueueStatus call.
-// WM_QUIT is put back for the main loop and ends all further pumping.
+// Runs the messages waiting on this thread. WM_QUIT is put back for the main loop and ends all
+// further pumping.
+//
+// The yield of a sweep runs once per row. Asking the queue costs one GetQueueStatus call (well under
+// a microsecond on Windows, but a wineserver round trip of tens of microseconds under Wine), so the
+// yield asks at most once per kYieldMicroseconds and otherwise only reads the performance counter.
 class Win32MessagePump final : public platform::MessagePump {
 public:
+    static constexpr long long kYieldMicroseconds = 1000;
+
+    Win32MessagePump();
     bool PumpMessages() override;
+    bool YieldToMessages() override;
     bool Quitting() const { return quitting_; }
 
 private:
     bool quitting_ = false;
+    long long yieldTicks_ = 0;  // performance-counter ticks between two looks at the queue
+    long long lastLook_ = 0;
 };
 
 // The previous-instance test claims a mutex of its own, atomically, so of two programs started
