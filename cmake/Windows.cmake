@@ -43,6 +43,10 @@ vantorel_wine_test(registry_win32_tests
     tests/win32/registry_win32_test.cpp
 )
 
+# The per-row yield's cost, run by hand under Wine (not a test).
+add_executable(pump_bench bench/win32/pump_bench.cpp)
+target_link_libraries(pump_bench PRIVATE vantorel_win32)
+
 vantorel_wine_test(connection_table_win32_tests tests/win32/connection_table_win32_test.cpp)
 target_link_libraries(connection_table_win32_tests PRIVATE ws2_32)
 

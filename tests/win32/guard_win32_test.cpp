@@ -64,14 +64,26 @@ void WriteSetting(HKEY root, const char* name, const char* value) {
 
 TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     win32::MainWindow window;
-    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), {})) << "no display? error " << ::GetLastError();
     NotingNotifyArea tray;
+    win32::MainWindowHandlers handlers;
+    handlers.taskbarCreated = [&] {
+        AddTrayIcon(tray, window, window.Icon(), window.Caption(), kTrayCallbackMessage);
+    };
+    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers)) << "no display? error " << ::GetLastError();
     AddTrayIcon(tray, window, window.Icon(), StatusText(0, CountForm::BlankBeforeSign), kTrayCallbackMessage);
     ModifyTrayIcon(tray, window, StatusText(1, CountForm::Plain), kTrayCallbackMessage);
     ModifyTrayIcon(tray, window, std::string(100, 'x'), kTrayCallbackMessage);  // cut to the field
     RemoveTrayIcon(tray, window);
     ASSERT_EQ(tray.calls.size(), 4u);
     for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
+
+    // A restarted taskbar announces itself with the registered message: the icon is added again.
+    ASSERT_NE(window.TaskbarCreatedMessage(), 0u);
+    ::SendMessageA(window.Hwnd(), window.TaskbarCreatedMessage(), 0, 0);
+    ASSERT_EQ(tray.calls.size(), 5u);
+    EXPECT_EQ(tray.calls[4].message, platform::kNimAdd);
+    EXPECT_TRUE(tray.calls[4].ok);
+    RemoveTrayIcon(tray, window);
 }
 
 TEST(TrayWin32, IconClicksBringTheHiddenWindowBackRaisedNotTopmost) {
@@ -101,6 +113,36 @@ TEST(TrayWin32, IconClicksBringTheHiddenWindowBackRaisedNotTopmost) {
     ::ShowWindow(hwnd, SW_HIDE);
     ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(512, 0));
     EXPECT_FALSE(window.Visible());
+}
+
+TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
+    int ticks = 0;
+    win32::MainWindow window;
+    win32::MainWindowHandlers handlers;
+    handlers.timerTick = [&] { ++ticks; };
+    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers));
+    MSG stale;
+    while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {
+    }
+    window.Timer().Interval(20);
+    window.Timer().Enabled(true);
+    // A loop that only yields, as a long sweep does: the timer's ticks still arrive.
+    win32::Win32MessagePump pump;
+    DWORD until = ::GetTickCount() + 3000;
+    while (ticks < 3 && ::GetTickCount() < until) ASSERT_TRUE(pump.YieldToMessages());
+    EXPECT_GE(ticks, 3);
+    window.Timer().Enabled(false);
+
+    // A quit request ends the loop and is kept for the main loop.
+    ::PostQuitMessage(7);
+    until = ::GetTickCount() + 3000;
+    bool going = true;
+    while (going && ::GetTickCount() < until) going = pump.YieldToMessages();
+    EXPECT_FALSE(going);
+    EXPECT_FALSE(pump.PumpMessages()) << "stays quitting";
+    MSG quit;
+    ASSERT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE));
+    EXPECT_EQ(quit.wParam, 7u);
 }
 
 class StartUpWin32 : public ::testing::Test {
