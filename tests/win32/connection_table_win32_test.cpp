@@ -8,6 +8,7 @@
 
 #include <gtest/gtest.h>
 
+#include <memory>
 #include <vector>
 
 #include "fakes/fake_guard_platform.h"
@@ -145,6 +146,33 @@ TEST(Win32ConnectionTable, SweepRequestsTheTeardownOfAListedConnection) {
     EXPECT_EQ(::send(connection.client.s, "x", 1, 0), 1);
     char byte = 0;
     EXPECT_EQ(::recv(connection.server.s, &byte, 1, 0), 1);
+}
+
+TEST(Win32ConnectionTable, SweepGrowsItsBufferForMoreThan1001Rows) {
+    Winsock winsock;
+    // 600 connections to an unlisted peer give 1,200 rows or more, then one listed connection.
+    std::vector<std::unique_ptr<LoopbackConnection>> background;
+    for (int i = 0; i < 600; ++i) {
+        background.push_back(std::make_unique<LoopbackConnection>("127.0.0.3"));
+        ASSERT_TRUE(background.back()->Ok()) << i;
+    }
+    LoopbackConnection listed("127.0.0.2");
+    ASSERT_TRUE(listed.Ok());
+
+    win32::Win32ConnectionTable table;
+    FakePump pump;
+    FakeRegistry registry;
+    FakeWindow window;
+    FakeNotifyArea tray;
+    DefinitionList list = DefinitionList::FromText("33554559");
+    std::int32_t count = 0;
+    ConnectionSweep sweep(SweepServices{table, pump, registry, window, tray}, list, count);
+    sweep.SweepConnections();
+    EXPECT_TRUE(sweep.LastSweep().fetched);
+    EXPECT_GE(sweep.LastSweep().rows, 1200u);
+    EXPECT_GE(sweep.LastSweep().fetchCalls, 2) << "the first buffer was too small and the system said so";
+    EXPECT_GE(sweep.LastSweep().requested, 1u) << "the listed connection beyond row 1001 was reached";
+    EXPECT_GT(sweep.BufferBytes(), 20'024u);
 }
 
 }  // namespace
