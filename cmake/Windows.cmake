@@ -64,4 +64,5 @@ configure_file(${CMAKE_SOURCE_DIR}/data/sw2.def ${CMAKE_BINARY_DIR}/sw2.def COPY
 
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
 add_dependencies(guard_win32_tests vantorel)
+target_link_libraries(guard_win32_tests PRIVATE ws2_32)
 set_tests_properties(guard_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;display" ENVIRONMENT DISPLAY=${VANTOREL_TEST_DISPLAY})

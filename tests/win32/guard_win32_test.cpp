@@ -1,11 +1,15 @@
 // The guard's window side under Wine on a virtual display: the tray routines against Wine's shell,
 // BringToFront and the icon's mouse notifications on a real window, start-up on the real registry,
 // and single instance, both in-process and with two real starts of vantorel.exe.
+#include <winsock2.h>
 #include <windows.h>
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+
 #include <fstream>
+#include <regex>
 #include <string>
 #include <vector>
 
@@ -343,6 +347,81 @@ TEST(SingleInstanceWin32, SecondStartOfTheProgramEndsSilently) {
     ::CloseHandle(first.hProcess);
     ::CloseHandle(first.hThread);
     ::CloseHandle(firstOutput);
+    DeleteSettings();
+}
+
+// Reads what a running program wrote so far.
+void ReadAvailable(HANDLE pipe, std::string& out) {
+    char buffer[512];
+    DWORD available = 0, got = 0;
+    while (::PeekNamedPipe(pipe, nullptr, 0, nullptr, &available, nullptr) && available > 0 &&
+           ::ReadFile(pipe, buffer, sizeof buffer, &got, nullptr) && got > 0)
+        out.append(buffer, got);
+}
+
+TEST(ProgramWin32, SweepsAListedConnectionAndShowsTheCount) {
+    // The program in a folder of its own with a definitions file that lists 127.0.0.2.
+    char temp[MAX_PATH];
+    ::GetTempPathA(MAX_PATH, temp);
+    std::string folder = std::string(temp) + "vantorel-program-test";
+    ::CreateDirectoryA(folder.c_str(), nullptr);
+    std::string exe = folder + "\\vantorel.exe";
+    ASSERT_TRUE(::CopyFileA((win32::ProgramFolder() + "\\vantorel.exe").c_str(), exe.c_str(), FALSE));
+    std::ofstream(folder + "\\sw2.def", std::ios::binary) << "-939524086\r\n33554559";
+    DeleteSettings();
+    WriteSetting(HKEY_CURRENT_USER, "State", "1");
+
+    WSADATA wsa;
+    ::WSAStartup(MAKEWORD(2, 2), &wsa);
+    SOCKET listener = ::socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(0x7F000002);
+    ASSERT_EQ(::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+    ::listen(listener, 4);
+    int length = sizeof address;
+    ::getsockname(listener, reinterpret_cast<sockaddr*>(&address), &length);
+    SOCKET client = ::socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
+    ASSERT_EQ(::connect(client, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
+    SOCKET server = ::accept(listener, nullptr, nullptr);
+
+    PROCESS_INFORMATION program{};
+    HANDLE output = nullptr;
+    std::string ignored;
+    ASSERT_EQ(RunProgram("\"" + exe + "\"", ignored, 0, &program, &output), 0);
+    // Under Wine SetTcpEntry answers success without closing anything, so the connection is
+    // counted again on every sweep: the count climbs while the program runs.
+    const std::regex counted("Caption: Vantorel - [1-9][0-9]* attempts intercepted");
+    std::string says;
+    DWORD until = ::GetTickCount() + 30000;
+    while (!std::regex_search(says, counted) && ::GetTickCount() < until) {
+        ReadAvailable(output, says);
+        ::Sleep(100);
+    }
+    EXPECT_NE(says.find("Started"), std::string::npos) << says;
+    EXPECT_NE(says.find("guard on"), std::string::npos) << says;
+    EXPECT_TRUE(std::regex_search(says, counted)) << "the sweep writes the count without a blank\n" << says;
+
+    HWND window = ::FindWindowA("VantorelFrmMain", nullptr);
+    ASSERT_NE(window, nullptr);
+    char caption[128] = {};
+    ::GetWindowTextA(window, caption, sizeof caption);
+    EXPECT_EQ(std::string(caption).rfind("Vantorel - ", 0), 0u) << caption;
+    int stored = std::atoi(ReadSetting(HKEY_CURRENT_USER, "Attempts").c_str());
+    EXPECT_GE(stored, 1) << "the count is stored as it grows";
+
+    ::PostMessageA(window, WM_CLOSE, 0, 0);
+    EXPECT_EQ(::WaitForSingleObject(program.hProcess, 30000), WAIT_OBJECT_0);
+    ::CloseHandle(program.hProcess);
+    ::CloseHandle(program.hThread);
+    ::CloseHandle(output);
+    ::closesocket(server);
+    ::closesocket(client);
+    ::closesocket(listener);
+    ::WSACleanup();
+    ::DeleteFileA(exe.c_str());
+    ::DeleteFileA((folder + "\\sw2.def").c_str());
+    ::RemoveDirectoryA(folder.c_str());
     DeleteSettings();
 }
 
