@@ -59,9 +59,6 @@ set_tests_properties(xvfb_start PROPERTIES FIXTURES_SETUP display)
 add_test(NAME xvfb_stop COMMAND sh -c "[ -f '${VANTOREL_XVFB_PID}' ] && kill $(cat '${VANTOREL_XVFB_PID}'); rm -f '${VANTOREL_XVFB_PID}'; exit 0")
 set_tests_properties(xvfb_stop PROPERTIES FIXTURES_CLEANUP display)
 
-# The program needs its definitions beside it.
-configure_file(${CMAKE_SOURCE_DIR}/data/sw2.def ${CMAKE_BINARY_DIR}/sw2.def COPYONLY)
-
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
 add_dependencies(guard_win32_tests vantorel)
 target_link_libraries(guard_win32_tests PRIVATE ws2_32)

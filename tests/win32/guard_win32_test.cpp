@@ -254,54 +254,82 @@ TEST_F(StartUpWin32, StoredStateSevenComesUpOnAndIsRewritten) {
     EXPECT_FALSE(program.frmMain.Visible()) << "started hidden in the tray";
 }
 
-TEST(SingleInstanceWin32, OfTwoClaimsOnlyTheFirstCarriesOn) {
-    win32::Win32Instance first("Vantorel.SingleInstanceTest");
-    win32::Win32Instance second("Vantorel.SingleInstanceTest");
-    EXPECT_FALSE(first.PreviousInstance());
-    EXPECT_TRUE(second.PreviousInstance());
-}
+// A copy of vantorel.exe in a folder of its own, with its own definitions file.
+struct ProgramCopy {
+    std::string folder, exe;
+    ProgramCopy(const std::string& name, const std::string& definitions) {
+        char temp[MAX_PATH];
+        ::GetTempPathA(MAX_PATH, temp);
+        folder = std::string(temp) + name;
+        exe = folder + "\\vantorel.exe";
+        ::CreateDirectoryA(folder.c_str(), nullptr);
+        ::CopyFileA((win32::ProgramFolder() + "\\vantorel.exe").c_str(), exe.c_str(), FALSE);
+        std::ofstream(folder + "\\sw2.def", std::ios::binary) << definitions;
+    }
+    ~ProgramCopy() {
+        ::DeleteFileA(exe.c_str());
+        ::DeleteFileA((folder + "\\sw2.def").c_str());
+        ::RemoveDirectoryA(folder.c_str());
+    }
+};
 
-// Runs `command` with its standard output captured; the exit code, or -1 when it did not end in time.
-int RunProgram(const std::string& command, std::string& output, DWORD timeoutMs, PROCESS_INFORMATION* keep = nullptr,
-        HANDLE* keepRead = nullptr) {
-    SECURITY_ATTRIBUTES inherit{sizeof inherit, nullptr, TRUE};
-    HANDLE read = nullptr, write = nullptr;
-    ::CreatePipe(&read, &write, &inherit, 0);
-    ::SetHandleInformation(read, HANDLE_FLAG_INHERIT, 0);
-    STARTUPINFOA startup{};
-    startup.cb = sizeof startup;
-    startup.dwFlags = STARTF_USESTDHANDLES;
-    startup.hStdOutput = write;
-    startup.hStdError = write;
-    startup.hStdInput = ::GetStdHandle(STD_INPUT_HANDLE);
-    PROCESS_INFORMATION process{};
-    std::string line = command;
-    BOOL started = ::CreateProcessA(nullptr, line.data(), nullptr, nullptr, TRUE, 0, nullptr, nullptr, &startup, &process);
-    ::CloseHandle(write);
-    if (!started) {
-        ::CloseHandle(read);
-        return -2;
+// A started program with its standard output captured.
+class Started {
+public:
+    explicit Started(const std::string& exe) {
+        SECURITY_ATTRIBUTES inherit{sizeof inherit, nullptr, TRUE};
+        HANDLE write = nullptr;
+        ::CreatePipe(&read_, &write, &inherit, 0);
+        ::SetHandleInformation(read_, HANDLE_FLAG_INHERIT, 0);
+        STARTUPINFOA startup{};
+        startup.cb = sizeof startup;
+        startup.dwFlags = STARTF_USESTDHANDLES;
+        startup.hStdOutput = write;
+        startup.hStdError = write;
+        std::string line = "\"" + exe + "\"";
+        started_ = ::CreateProcessA(nullptr, line.data(), nullptr, nullptr, TRUE, 0, nullptr, nullptr, &startup,
+                                    &process_) != FALSE;
+        ::CloseHandle(write);
     }
-    if (keep != nullptr) {
-        *keep = process;
-        *keepRead = read;
-        return 0;
+    ~Started() {
+        if (!started_) return;
+        if (::WaitForSingleObject(process_.hProcess, 0) != WAIT_OBJECT_0) ::TerminateProcess(process_.hProcess, 1);
+        ::CloseHandle(process_.hProcess);
+        ::CloseHandle(process_.hThread);
+        ::CloseHandle(read_);
     }
-    DWORD waited = ::WaitForSingleObject(process.hProcess, timeoutMs);
-    char buffer[512];
-    DWORD got = 0;
-    DWORD available = 0;
-    while (::PeekNamedPipe(read, nullptr, 0, nullptr, &available, nullptr) && available > 0 &&
-           ::ReadFile(read, buffer, sizeof buffer, &got, nullptr) && got > 0)
-        output.append(buffer, got);
-    DWORD code = 0;
-    ::GetExitCodeProcess(process.hProcess, &code);
-    if (waited != WAIT_OBJECT_0) ::TerminateProcess(process.hProcess, 1);
-    ::CloseHandle(process.hProcess);
-    ::CloseHandle(process.hThread);
-    ::CloseHandle(read);
-    return waited == WAIT_OBJECT_0 ? static_cast<int>(code) : -1;
-}
+    bool Ok() const { return started_; }
+
+    // What the program has written so far.
+    const std::string& Says() {
+        char buffer[512];
+        DWORD available = 0, got = 0;
+        while (::PeekNamedPipe(read_, nullptr, 0, nullptr, &available, nullptr) && available > 0 &&
+               ::ReadFile(read_, buffer, sizeof buffer, &got, nullptr) && got > 0)
+            says_.append(buffer, got);
+        return says_;
+    }
+    // Waits up to 30 s for the output to match.
+    bool WaitToSay(const std::regex& pattern) {
+        for (DWORD until = ::GetTickCount() + 30000; ::GetTickCount() < until; ::Sleep(50))
+            if (std::regex_search(Says(), pattern)) return true;
+        return false;
+    }
+    // The exit code once it has ended (within 30 s), or -1.
+    int Wait() {
+        if (::WaitForSingleObject(process_.hProcess, 30000) != WAIT_OBJECT_0) return -1;
+        DWORD code = 0;
+        ::GetExitCodeProcess(process_.hProcess, &code);
+        Says();
+        return static_cast<int>(code);
+    }
+
+private:
+    bool started_ = false;
+    HANDLE read_ = nullptr;
+    PROCESS_INFORMATION process_{};
+    std::string says_;
+};
 
 int CountMainWindows() {
     int count = 0;
@@ -311,63 +339,28 @@ int CountMainWindows() {
 }
 
 TEST(SingleInstanceWin32, SecondStartOfTheProgramEndsSilently) {
-    std::string exe = win32::ProgramFolder() + "\\vantorel.exe";
-    ASSERT_NE(::GetFileAttributesA(exe.c_str()), INVALID_FILE_ATTRIBUTES) << exe;
+    ProgramCopy copy("vantorel-instance-test", "-939524086\r\n67305985");
     DeleteSettings();
-    PROCESS_INFORMATION first{};
-    HANDLE firstOutput = nullptr;
-    std::string ignored;
-    ASSERT_EQ(RunProgram("\"" + exe + "\"", ignored, 0, &first, &firstOutput), 0);
-    // Start-up is over when the program reports it.
-    std::string firstSays;
-    DWORD until = ::GetTickCount() + 30000;
-    while (firstSays.find("Started") == std::string::npos && ::GetTickCount() < until) {
-        char buffer[256];
-        DWORD available = 0, got = 0;
-        if (::PeekNamedPipe(firstOutput, nullptr, 0, nullptr, &available, nullptr) && available > 0 &&
-            ::ReadFile(firstOutput, buffer, sizeof buffer, &got, nullptr))
-            firstSays.append(buffer, got);
-        else
-            ::Sleep(50);
-    }
-    ASSERT_NE(firstSays.find("Started"), std::string::npos) << firstSays;
+    Started first(copy.exe);
+    ASSERT_TRUE(first.Ok());
+    ASSERT_TRUE(first.WaitToSay(std::regex("Started"))) << "start-up is over when the program reports it";
     ASSERT_EQ(CountMainWindows(), 1) << "the first start shows its window";
     WriteSetting(HKEY_CURRENT_USER, "State", "1");  // a second start that read it would write it back
 
-    std::string output;
-    int code = RunProgram("\"" + exe + "\"", output, 30000);
-    EXPECT_EQ(code, 0);
-    EXPECT_EQ(output, "") << "nothing shown or said";
+    Started second(copy.exe);
+    ASSERT_TRUE(second.Ok());
+    EXPECT_EQ(second.Wait(), 0);
+    EXPECT_EQ(second.Says(), "") << "nothing shown or said";
     EXPECT_EQ(CountMainWindows(), 1);
     EXPECT_EQ(ReadSetting(HKEY_CURRENT_USER, "State"), "1");
 
-    HWND window = ::FindWindowA("VantorelFrmMain", nullptr);
-    ::PostMessageA(window, WM_CLOSE, 0, 0);
-    EXPECT_EQ(::WaitForSingleObject(first.hProcess, 30000), WAIT_OBJECT_0) << "closing the window ends the program";
-    ::CloseHandle(first.hProcess);
-    ::CloseHandle(first.hThread);
-    ::CloseHandle(firstOutput);
+    ::PostMessageA(::FindWindowA("VantorelFrmMain", nullptr), WM_CLOSE, 0, 0);
+    EXPECT_EQ(first.Wait(), 0) << "closing the window ends the program";
     DeleteSettings();
 }
 
-// Reads what a running program wrote so far.
-void ReadAvailable(HANDLE pipe, std::string& out) {
-    char buffer[512];
-    DWORD available = 0, got = 0;
-    while (::PeekNamedPipe(pipe, nullptr, 0, nullptr, &available, nullptr) && available > 0 &&
-           ::ReadFile(pipe, buffer, sizeof buffer, &got, nullptr) && got > 0)
-        out.append(buffer, got);
-}
-
 TEST(ProgramWin32, SweepsAListedConnectionAndShowsTheCount) {
-    // The program in a folder of its own with a definitions file that lists 127.0.0.2.
-    char temp[MAX_PATH];
-    ::GetTempPathA(MAX_PATH, temp);
-    std::string folder = std::string(temp) + "vantorel-program-test";
-    ::CreateDirectoryA(folder.c_str(), nullptr);
-    std::string exe = folder + "\\vantorel.exe";
-    ASSERT_TRUE(::CopyFileA((win32::ProgramFolder() + "\\vantorel.exe").c_str(), exe.c_str(), FALSE));
-    std::ofstream(folder + "\\sw2.def", std::ios::binary) << "-939524086\r\n33554559";
+    ProgramCopy copy("vantorel-program-test", "-939524086\r\n33554559");  // 127.0.0.2 is listed
     DeleteSettings();
     WriteSetting(HKEY_CURRENT_USER, "State", "1");
 
@@ -385,43 +378,26 @@ TEST(ProgramWin32, SweepsAListedConnectionAndShowsTheCount) {
     ASSERT_EQ(::connect(client, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
     SOCKET server = ::accept(listener, nullptr, nullptr);
 
-    PROCESS_INFORMATION program{};
-    HANDLE output = nullptr;
-    std::string ignored;
-    ASSERT_EQ(RunProgram("\"" + exe + "\"", ignored, 0, &program, &output), 0);
     // Under Wine SetTcpEntry answers success without closing anything, so the connection is
     // counted again on every sweep: the count climbs while the program runs.
-    const std::regex counted("Caption: Vantorel - [1-9][0-9]* attempts intercepted");
-    std::string says;
-    DWORD until = ::GetTickCount() + 30000;
-    while (!std::regex_search(says, counted) && ::GetTickCount() < until) {
-        ReadAvailable(output, says);
-        ::Sleep(100);
-    }
-    EXPECT_NE(says.find("Started"), std::string::npos) << says;
-    EXPECT_NE(says.find("guard on"), std::string::npos) << says;
-    EXPECT_TRUE(std::regex_search(says, counted)) << "the sweep writes the count without a blank\n" << says;
-
+    Started program(copy.exe);
+    ASSERT_TRUE(program.Ok());
+    EXPECT_TRUE(program.WaitToSay(std::regex("Caption: Vantorel - [1-9][0-9]* attempts intercepted")))
+        << "the sweep writes the count without a blank\n" << program.Says();
+    EXPECT_NE(program.Says().find("guard on"), std::string::npos) << program.Says();
     HWND window = ::FindWindowA("VantorelFrmMain", nullptr);
     ASSERT_NE(window, nullptr);
     char caption[128] = {};
     ::GetWindowTextA(window, caption, sizeof caption);
     EXPECT_EQ(std::string(caption).rfind("Vantorel - ", 0), 0u) << caption;
-    int stored = std::atoi(ReadSetting(HKEY_CURRENT_USER, "Attempts").c_str());
-    EXPECT_GE(stored, 1) << "the count is stored as it grows";
+    EXPECT_GE(std::atoi(ReadSetting(HKEY_CURRENT_USER, "Attempts").c_str()), 1) << "the count is stored";
 
     ::PostMessageA(window, WM_CLOSE, 0, 0);
-    EXPECT_EQ(::WaitForSingleObject(program.hProcess, 30000), WAIT_OBJECT_0);
-    ::CloseHandle(program.hProcess);
-    ::CloseHandle(program.hThread);
-    ::CloseHandle(output);
+    EXPECT_EQ(program.Wait(), 0);
     ::closesocket(server);
     ::closesocket(client);
     ::closesocket(listener);
     ::WSACleanup();
-    ::DeleteFileA(exe.c_str());
-    ::DeleteFileA((folder + "\\sw2.def").c_str());
-    ::RemoveDirectoryA(folder.c_str());
     DeleteSettings();
 }
 
