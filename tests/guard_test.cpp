@@ -210,6 +210,7 @@ TEST(TmrTick, SweepsNeverNestAndSwitchingOffLetsTheRunFinish) {
         // A tick that fell due while the sweep lets messages run, and a click on the switch.
         ++nestedTicks;
         EXPECT_TRUE(rig.guard.Sweeping());
+        EXPECT_EQ(rig.guard.Sweep().LastSweep().rows, 0u) << "a sweep under way is not reported yet";
         rig.guard.TmrTick();
         if (rig.pump.pumps == 1) rig.Click();
     };
@@ -222,6 +223,7 @@ TEST(TmrTick, SweepsNeverNestAndSwitchingOffLetsTheRunFinish) {
     EXPECT_EQ(AttemptCount, 1);
     EXPECT_FALSE(rig.guard.Sweeping());
 
+    EXPECT_EQ(rig.guard.Sweep().LastSweep().examined, 2u);
     rig.pump.onPump = nullptr;
     rig.guard.TmrTick();
     EXPECT_EQ(rig.guard.SweepsRun(), 2u);

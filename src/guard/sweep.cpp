@@ -27,11 +27,11 @@ std::uint32_t ConnectionSweep::FetchTable() {
         buffer_[0] = 0;
         auto size = static_cast<std::uint32_t>(BufferBytes());
         std::uint32_t status = services_.table.GetTcpTable(buffer_.data(), size, false);
-        ++last_.fetchCalls;
+        ++current_.fetchCalls;
         if (status == platform::kNoError) {
             // Never trust the count beyond the rows the buffer holds.
             auto capacity = static_cast<std::uint32_t>((buffer_.size() - 1) / kWordsPerRow);
-            last_.fetched = true;
+            current_.fetched = true;
             return std::min(buffer_[0], capacity);
         }
         if (status != platform::kErrorInsufficientBuffer || size <= BufferBytes()) return 0;
@@ -58,25 +58,26 @@ void ConnectionSweep::Intercepted() {
 }
 
 void ConnectionSweep::SweepConnections() {
-    last_ = SweepResult();
+    current_ = SweepResult();
     std::uint32_t rows = FetchTable();
-    last_.rows = rows;
+    current_.rows = rows;
     const auto* words = reinterpret_cast<const unsigned char*>(buffer_.data() + 1);
     for (std::uint32_t i = 0; i < rows; ++i) {
         if (!services_.pump.YieldToMessages()) break;  // the program is quitting
-        ++last_.examined;
+        ++current_.examined;
         platform::TcpRow row;
         std::memcpy(&row, words + static_cast<std::size_t>(i) * sizeof row, sizeof row);
         auto key = static_cast<std::int32_t>(row.remoteAddr);
         if (row.state == platform::kTcpStateDeleteTcb || FindDefinition(definitions_, key) == kNoDefinition) continue;
         row.state = platform::kTcpStateDeleteTcb;
-        ++last_.requested;
+        ++current_.requested;
         // Only a teardown the system accepted is an attempt intercepted: without the rights to tear
         // connections down, every sweep would otherwise count every listed row again.
         if (services_.table.SetTcpEntry(row) != platform::kNoError) continue;
-        ++last_.intercepted;
+        ++current_.intercepted;
         Intercepted();
     }
+    last_ = current_;
 }
 
 }  // namespace vantorel

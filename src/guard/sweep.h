@@ -55,6 +55,7 @@ public:
     // One run over the table.
     void SweepConnections();
 
+    // The last sweep that ran to its end (a sweep under way is not reported until it ends).
     const SweepResult& LastSweep() const { return last_; }
 
     // Bytes of the table buffer kept between sweeps.
@@ -70,6 +71,7 @@ private:
     const DefinitionList& definitions_;
     std::int32_t& count_;
     std::vector<std::uint32_t> buffer_;  // 32-bit words: the entry count, then the rows
+    SweepResult current_;  // the sweep under way
     SweepResult last_;
 };
 
