@@ -60,6 +60,10 @@ add_test(NAME xvfb_stop COMMAND sh -c "[ -f '${VANTOREL_XVFB_PID}' ] && kill $(c
 set_tests_properties(xvfb_stop PROPERTIES FIXTURES_CLEANUP display)
 
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
-add_dependencies(guard_win32_tests vantorel)
-target_link_libraries(guard_win32_tests PRIVATE ws2_32)
 set_tests_properties(guard_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;display" ENVIRONMENT DISPLAY=${VANTOREL_TEST_DISPLAY})
+
+# Black-box tests of vantorel.exe itself.
+vantorel_wine_test(program_e2e_tests tests/e2e/program_test.cpp)
+add_dependencies(program_e2e_tests vantorel)
+target_link_libraries(program_e2e_tests PRIVATE ws2_32)
+set_tests_properties(program_e2e_tests PROPERTIES FIXTURES_REQUIRED "wine;display" ENVIRONMENT DISPLAY=${VANTOREL_TEST_DISPLAY})
