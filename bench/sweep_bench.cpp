@@ -238,6 +238,7 @@ void BM_ExposureWindow(benchmark::State& state) {
         tornDown.emplace(static_cast<std::uint16_t>(row.localPort), when);
     };
     std::vector<double> sweepTimes;
+    int abortedInHandshake = 0;
 
     for (auto _ : state) {
         std::atomic<bool> done{false};
@@ -250,6 +251,10 @@ void BM_ExposureWindow(benchmark::State& state) {
                 Connection c = Connect(w.listed);
                 auto now = Clock::now();
                 std::lock_guard<std::mutex> hold(lock);
+                if (!c.client) {
+                    ++abortedInHandshake;  // torn down while still connecting: never exposed
+                    continue;
+                }
                 established[htons(c.clientPort)] = now;
                 listed.push_back(std::move(c));
             }
@@ -284,6 +289,7 @@ void BM_ExposureWindow(benchmark::State& state) {
     state.counters["sweep_p50_ms"] = Percentile(sweepTimes, 0.5);
     state.counters["sweep_p99_ms"] = Percentile(sweepTimes, 0.99);
     state.counters["torn_down"] = static_cast<double>(windows.size());
+    state.counters["aborted_connecting"] = abortedInHandshake;
     state.counters["exposure_p50_ms"] = Percentile(windows, 0.5);
     state.counters["exposure_p99_ms"] = Percentile(windows, 0.99);
     state.counters["exposure_max_ms"] = Percentile(windows, 1.0);
