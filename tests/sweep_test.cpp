@@ -193,7 +193,7 @@ TEST(SweepConnections, TablesLargerThanTheFirstBufferAreFetchedWhole) {
     EXPECT_TRUE(rig.sweep.LastSweep().fetched);
 }
 
-TEST(SweepConnections, FailedFetchExaminesNothing) {
+TEST(SweepConnections, FailedFetchExaminesNothingAndCountsAreNeverTrustedBeyondTheBuffer) {
     SweepRig rig;
     rig.list = ListOf({Ipv4(1, 2, 3, 4)});
     rig.table.rows = {Row(kTcpStateEstablished, Ipv4(1, 2, 3, 4))};
@@ -203,6 +203,13 @@ TEST(SweepConnections, FailedFetchExaminesNothing) {
     EXPECT_FALSE(rig.sweep.LastSweep().fetched);
     EXPECT_EQ(rig.pump.pumps, 0);
     EXPECT_TRUE(rig.table.entries.empty());
+
+    // A table whose count claims more rows than the buffer holds: only the buffer's rows are read.
+    rig.table.failWith = platform::kNoError;
+    rig.table.overstateCount = 1'000'000;
+    rig.sweep.SweepConnections();
+    EXPECT_EQ(rig.sweep.LastSweep().rows, 1001u);
+    EXPECT_EQ(rig.table.entries.size(), 1u);
 }
 
 TEST(SweepConnections, StopsWhenTheProgramQuitsMidSweep) {

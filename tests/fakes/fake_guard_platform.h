@@ -36,7 +36,7 @@ public:
             size = needed;
             return platform::kErrorInsufficientBuffer;
         }
-        auto count = static_cast<std::uint32_t>(rows.size());
+        auto count = static_cast<std::uint32_t>(rows.size()) + overstateCount;
         std::memcpy(table, &count, 4);
         if (!rows.empty()) std::memcpy(static_cast<char*>(table) + 4, rows.data(), rows.size() * sizeof(rows[0]));
         fetchedBytes.push_back(size);
@@ -61,6 +61,7 @@ public:
     std::uint32_t failWith = platform::kNoError;
     std::uint32_t teardownResult = platform::kNoError;
     bool removeOnTeardown = false;
+    std::uint32_t overstateCount = 0;  // a count larger than the rows written
     std::function<void()> beforeFetch;
 
     int fetches = 0;
