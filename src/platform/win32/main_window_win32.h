@@ -46,7 +46,7 @@ private:
 
 class Win32Timer final : public platform::Timer {
 public:
-    Win32Timer(UINT_PTR id) : id_(id) {}
+    explicit Win32Timer(UINT_PTR id) : id_(id) {}
     std::uint32_t Interval() const override { return interval_; }
     void Interval(std::uint32_t milliseconds) override;
     bool Enabled() const override { return enabled_; }
