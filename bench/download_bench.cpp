@@ -82,7 +82,7 @@ public:
 
 class NoPump final : public vantorel::platform::MessagePump {
 public:
-    void PumpMessages() override {}
+    bool PumpMessages() override { return true; }
 };
 
 void BM_FileDownloader50MB(benchmark::State& state) {

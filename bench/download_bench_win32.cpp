@@ -20,7 +20,7 @@
 #include "download/file_downloader.h"
 #include "platform/win32/file_system_win32.h"
 #include "platform/win32/http_transfer_win32.h"
-#include "platform/win32/message_pump_win32.h"
+#include "platform/win32/shell_win32.h"
 
 namespace {
 
@@ -120,7 +120,7 @@ int main(int argc, char** argv) {
     const std::string dest = std::string(temp) + "vantorel-bench-" + std::to_string(::GetCurrentProcessId()) + ".bin";
 
     struct NullPump final : vantorel::platform::MessagePump {
-        void PumpMessages() override {}
+        bool PumpMessages() override { return true; }
     } nullPump;
     vantorel::win32::Win32MessagePump realPump;
     vantorel::platform::MessagePump& pump =

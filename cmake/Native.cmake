@@ -1,9 +1,11 @@
 # Native (Linux) build: the portable core against fakes, the Linux platform pieces, benchmarks.
 find_package(GTest REQUIRED)
+find_package(Threads REQUIRED)
 include(GoogleTest)
 
 add_library(vantorel_native STATIC
     src/platform/std/files_std.cpp
+    src/platform/linux/connection_table_linux.cpp
 )
 target_link_libraries(vantorel_native PUBLIC vantorel_core)
 
@@ -21,11 +23,22 @@ add_executable(vantorel_tests
     tests/update_check_test.cpp
     tests/contract/file_system_contract.cpp
     tests/contract/file_system_contract_fake.cpp
+    tests/guard_test.cpp
+    tests/sweep_test.cpp
+    tests/tray_test.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )
 target_link_libraries(vantorel_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)
 gtest_discover_tests(vantorel_tests DISCOVERY_TIMEOUT 60)
+
+# Real teardown of real loopback connections through the Linux table; needs root, skips without.
+add_executable(teardown_linux_tests
+    tests/linux/loopback.cpp
+    tests/linux/teardown_test.cpp
+)
+target_link_libraries(teardown_linux_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)
+gtest_discover_tests(teardown_linux_tests DISCOVERY_TIMEOUT 60)
 
 # Benchmarks are not run by the tests; the sanitizer build leaves them out.
 if(NOT VANTOREL_SANITIZE)
@@ -36,4 +49,6 @@ if(NOT VANTOREL_SANITIZE)
     target_link_libraries(xpbutton_bench PRIVATE vantorel_fakes benchmark::benchmark)
     add_executable(download_bench bench/download_bench.cpp)
     target_link_libraries(download_bench PRIVATE vantorel_core benchmark::benchmark)
+    add_executable(sweep_bench bench/sweep_bench.cpp tests/linux/loopback.cpp)
+    target_link_libraries(sweep_bench PRIVATE vantorel_fakes vantorel_native benchmark::benchmark Threads::Threads)
 endif()

@@ -5,16 +5,18 @@ set(VANTOREL_WINEPREFIX ${CMAKE_BINARY_DIR}/wineprefix)
 set(CMAKE_CROSSCOMPILING_EMULATOR sh ${CMAKE_SOURCE_DIR}/tests/win32/wine-exec ${CMAKE_BINARY_DIR})
 
 add_library(vantorel_win32 STATIC
+    src/platform/win32/connection_table_win32.cpp
     src/platform/win32/controls_win32.cpp
     src/platform/win32/file_system_win32.cpp
     src/platform/win32/files_win32.cpp
     src/platform/win32/http_transfer_win32.cpp
-    src/platform/win32/message_pump_win32.cpp
+    src/platform/win32/main_window_win32.cpp
     src/platform/win32/options_window_win32.cpp
     src/platform/win32/picture_box_win32.cpp
     src/platform/win32/registry_win32.cpp
+    src/platform/win32/shell_win32.cpp
 )
-target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet user32 gdi32)
+target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet iphlpapi shell32 user32 gdi32)
 target_compile_definitions(vantorel_win32 PUBLIC WIN32_LEAN_AND_MEAN NOMINMAX)
 
 # Icons drawn at build time, the manifest and the version resource.
@@ -144,3 +146,17 @@ set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
 vantorel_wine_test(update_check_win32_tests tests/win32/update_check_win32_test.cpp)
 set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
     ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1")
+
+# The per-row yield's cost, run by hand under Wine (not a test).
+add_executable(pump_bench bench/win32/pump_bench.cpp)
+target_link_libraries(pump_bench PRIVATE vantorel_win32)
+
+vantorel_wine_test(connection_table_win32_tests tests/win32/connection_table_win32_test.cpp)
+target_link_libraries(connection_table_win32_tests PRIVATE ws2_32)
+
+vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
+
+# Black-box tests of vantorel.exe itself.
+vantorel_wine_test(program_e2e_tests tests/e2e/program_test.cpp)
+add_dependencies(program_e2e_tests vantorel)
+target_link_libraries(program_e2e_tests PRIVATE ws2_32)

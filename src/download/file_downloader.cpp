@@ -49,7 +49,7 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
         return false;
     }
     while (Inet_.StillExecuting()) {
-        pump_.PumpMessages();
+        pump_.YieldToMessages();
         if (cancel_) return false;
     }
 
@@ -103,7 +103,7 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
             return false;
         }
     }
-    pump_.PumpMessages();
+    pump_.YieldToMessages();
     return true;
 }
 
@@ -156,7 +156,7 @@ void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t a
         received += static_cast<std::int32_t>(buffer.size());
         double percent = std::nearbyint(static_cast<double>(received) / announced * 100.0);
         Raise(DownloadProgress, std::to_string(static_cast<long long>(percent)));
-        pump_.PumpMessages();
+        pump_.YieldToMessages();
         if (buffer.size() <= 1) break;
     }
 
@@ -175,7 +175,7 @@ bool FileDownloader::DownloadFile(const std::string& strURL, const std::string& 
     std::int32_t announced = 0;
 
     Raise(DownloadEvents, "Getting file information");
-    pump_.PumpMessages();
+    pump_.YieldToMessages();
     Inet_.SetURL(strURL);
     Inet_.SetUserName(UserName);
     Inet_.SetPassword(Password);

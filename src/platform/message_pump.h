@@ -1,8 +1,10 @@
-// Lets pending window messages run in the middle of long work on the window thread.
+// Lets pending window messages run in the middle of long work on the window thread (a sweep, a
+// download): clicks, timer ticks and the tray's notifications are handled between its steps.
 #pragma once
 
 namespace vantorel::platform {
 
+// Lets pending window messages run on the window thread (timer ticks and clicks included).
 class MessagePump {
 public:
     MessagePump() = default;
@@ -10,9 +12,14 @@ public:
     MessagePump& operator=(const MessagePump&) = delete;
     virtual ~MessagePump() = default;
 
-    // Handles the window messages waiting in the thread's queue, then returns. Handlers may call
-    // back into the code that pumps (a cancel button, a timer).
-    virtual void PumpMessages() = 0;
+    // Runs every message waiting now and returns. False when the program has been asked to quit:
+    // long work then stops at once.
+    virtual bool PumpMessages() = 0;
+
+    // The yield of a long loop, called once per step: lets waiting messages run, but may look at the
+    // queue less often than it is called (a message then waits a moment, never longer than a
+    // millisecond or so). Same result as PumpMessages.
+    virtual bool YieldToMessages() { return PumpMessages(); }
 };
 
 }  // namespace vantorel::platform

@@ -13,9 +13,10 @@ public:
     int pumps = 0;
     std::function<void(int pump)> onPump;
 
-    void PumpMessages() override {
+    bool PumpMessages() override {
         ++pumps;
         if (onPump) onPump(pumps);
+        return true;
     }
 };
 

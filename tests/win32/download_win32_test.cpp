@@ -18,7 +18,7 @@
 #include "download/file_downloader.h"
 #include "platform/win32/file_system_win32.h"
 #include "platform/win32/http_transfer_win32.h"
-#include "platform/win32/message_pump_win32.h"
+#include "platform/win32/shell_win32.h"
 
 namespace vantorel {
 namespace {

@@ -14,7 +14,7 @@
 #include "platform/win32/file_system_win32.h"
 #include "platform/win32/files_win32.h"
 #include "platform/win32/http_transfer_win32.h"
-#include "platform/win32/message_pump_win32.h"
+#include "platform/win32/shell_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/registry_routines.h"
 #include "settings/server_address.h"

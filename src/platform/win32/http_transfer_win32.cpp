@@ -77,7 +77,7 @@ void WinInetTransfer::WaitPumping(Ready ready) {
         HANDLE wake = shared_->wake.get();
         DWORD woke = ::MsgWaitForMultipleObjectsEx(1, &wake, INFINITE, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
         if (woke == WAIT_OBJECT_0 + 1) {
-            pump_.PumpMessages();
+            pump_.YieldToMessages();
             // The pump may hold messages back for a moment (it rate-limits its looks at the queue);
             // wait for the worker alone meanwhile instead of spinning on the same messages.
             ::WaitForSingleObject(wake, 1);

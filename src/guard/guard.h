@@ -1,0 +1,99 @@
+// The guard's on/off state and the order in which the main window brings the system up.
+//
+// The state lives in the ON/OFF switch's Value; Toggle applies it to everything else: the switch's
+// colours and caption, the "State" setting and the sweep timer Tmr. Start-up refuses a second
+// instance, places and shows the window, loads the settings, the definitions and the count, adds
+// the tray icon, applies the stored state and starts the status timer, in that order, so no sweep
+// can run before the list is loaded.
+#pragma once
+
+#include <cstdint>
+#include <functional>
+#include <string>
+
+#include "guard/sweep.h"
+#include "platform/connection_table.h"
+#include "platform/files.h"
+#include "platform/registry.h"
+#include "platform/tray.h"
+#include "platform/window.h"
+
+namespace vantorel {
+
+inline constexpr std::uint32_t kTmrInterval = 55;
+inline constexpr std::uint32_t kTimerInterval = 1000;
+inline constexpr std::uint32_t kOnColour = 0x00FF00;   // 65280, green
+inline constexpr std::uint32_t kOffColour = 0x0000C0;  // 192, dark red
+inline constexpr const char* kMutexName = "Vantorel";
+inline constexpr const char* kSettingsKey = "SOFTWARE\\Vantorel\\";
+
+struct GuardPlatform {
+    platform::Registry& registry;
+    platform::Files& files;
+    platform::ConnectionTable& table;
+    platform::NotifyArea& tray;
+    platform::WindowManager& windows;
+    platform::MessagePump& pump;
+    platform::Instance& instance;
+};
+
+// The parts of the main window the guard drives.
+struct GuardWindow {
+    platform::Window& frmMain;
+    platform::Switch& btnOnOff;
+    platform::Timer& tmr;    // the sweep timer
+    platform::Timer& timer;  // the status timer
+};
+
+// A setting read as a 32-bit integer: the value's number, or `fallback` when it is missing, cannot
+// be read or is not a whole number ("abc").
+std::int32_t ReadIntSetting(platform::Registry& registry, std::int32_t root, const std::string& name,
+                            std::int32_t fallback);
+
+class Guard {
+public:
+    // `onDefinitionsMissing` shows the "Definitions Error" message and the updates window.
+    Guard(GuardPlatform platform, GuardWindow window, std::string programFolder,
+          std::function<void()> onDefinitionsMissing);
+
+    // Window initialisation. False when another instance is already running: the caller then ends
+    // at once, having shown and changed nothing.
+    bool Initialize();
+
+    // Window load: the rest of start-up, ending with both timers set.
+    void Load();
+
+    // Applies the switch's Value to its look, to "State" and to Tmr.
+    void Toggle();
+
+    // A click on the switch, after it flipped its own Value.
+    void BtnOnOffClick() { Toggle(); }
+
+    // Tick of Tmr: one sweep. A tick that falls due while a sweep lets messages run is dropped, so
+    // sweeps never nest.
+    void TmrTick();
+
+    // The window's mouse-move handler with the raw low word of the position (the tray's code).
+    void MouseMove(std::uint32_t code);
+
+    // The icon came back to a fresh notification area (the taskbar restarted): add it again.
+    void TaskbarCreated();
+
+    // Unload: the tray icon goes, both timers stop.
+    void Unload();
+
+    ConnectionSweep& Sweep() { return sweep_; }
+    bool Sweeping() const { return sweeping_; }
+    std::uint64_t SweepsRun() const { return sweepsRun_; }
+
+private:
+    GuardPlatform platform_;
+    GuardWindow window_;
+    std::string programFolder_;
+    std::function<void()> onDefinitionsMissing_;
+    ConnectionSweep sweep_;
+    bool sweeping_ = false;
+    std::uint64_t sweepsRun_ = 0;
+};
+
+}  // namespace vantorel

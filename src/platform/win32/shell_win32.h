@@ -1,0 +1,61 @@
+// The notification area, window placement, the message pump and the instance test on Windows.
+#pragma once
+
+#include <windows.h>
+
+#include "platform/tray.h"
+#include "platform/window.h"
+#include "platform/win32/unique_handle.h"
+
+namespace vantorel::win32 {
+
+// Shell_NotifyIconA with the first version of the record (its size is the platform's own).
+class Win32NotifyArea final : public platform::NotifyArea {
+public:
+    bool ShellNotifyIcon(std::uint32_t message, const platform::NotifyIconData& data) override;
+};
+
+class Win32WindowManager final : public platform::WindowManager {
+public:
+    bool SetWindowPos(platform::WindowHandle window, platform::WindowHandle insertAfter, std::int32_t x, std::int32_t y,
+                      std::int32_t cx, std::int32_t cy, std::uint32_t flags) override;
+    std::int32_t ScreenWidth() const override;
+    std::int32_t ScreenHeight() const override;
+};
+
+// Runs the messages waiting on this thread. WM_QUIT is put back for the main loop and ends all
+// further pumping.
+//
+// The yield of a sweep runs once per row. Asking the queue costs one GetQueueStatus call (well under
+// a microsecond on Windows, but a wineserver round trip of tens of microseconds under Wine), so the
+// yield asks at most once per kYieldMicroseconds and otherwise only reads the performance counter.
+class Win32MessagePump final : public platform::MessagePump {
+public:
+    static constexpr long long kYieldMicroseconds = 1000;
+
+    Win32MessagePump();
+    bool PumpMessages() override;
+    bool YieldToMessages() override;
+    bool Quitting() const { return quitting_; }
+
+private:
+    bool quitting_ = false;
+    long long yieldTicks_ = 0;  // performance-counter ticks between two looks at the queue
+    long long lastLook_ = 0;
+};
+
+// The previous-instance test claims a mutex of its own, atomically, so of two programs started
+// together exactly one carries on; the named mutex "Vantorel" is created apart from it and kept.
+class Win32Instance final : public platform::Instance {
+public:
+    explicit Win32Instance(const char* instanceName = "Vantorel.Instance") : instanceName_(instanceName) {}
+    bool PreviousInstance() override;
+    void CreateNamedMutex(const std::string& name) override;
+
+private:
+    const char* instanceName_;
+    UniqueKernelHandle instanceMutex_;
+    UniqueKernelHandle namedMutex_;
+};
+
+}  // namespace vantorel::win32

@@ -1,0 +1,182 @@
+// Hand-written fakes of the platform pieces the guard, the sweep and the tray routines use: a
+// scripted connection table, a notification area and window manager that record their calls, a
+// window, the switch, timers, a message pump with a hook, and the instance test.
+#pragma once
+
+#include <cstring>
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "platform/connection_table.h"
+#include "platform/tray.h"
+#include "platform/window.h"
+
+namespace vantorel::testing {
+
+// 1.2.3.4 -> the row's address field (network order read little-endian).
+constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std::uint8_t d) {
+    return static_cast<std::uint32_t>(a) | static_cast<std::uint32_t>(b) << 8 | static_cast<std::uint32_t>(c) << 16 |
+           static_cast<std::uint32_t>(d) << 24;
+}
+
+inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint32_t remotePort = 0x5000) {
+    return platform::TcpRow{state, Ipv4(10, 0, 0, 1), 0x3930, remote, remotePort};
+}
+
+class FakeConnectionTable final : public platform::ConnectionTable {
+public:
+    std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool order) override {
+        ++fetches;
+        lastOrder = order;
+        if (beforeFetch) beforeFetch();
+        if (failWith != platform::kNoError) return failWith;
+        std::uint32_t needed = platform::TcpTableBytes(static_cast<std::uint32_t>(rows.size()));
+        if (size < needed) {
+            size = needed;
+            return platform::kErrorInsufficientBuffer;
+        }
+        auto count = static_cast<std::uint32_t>(rows.size()) + overstateCount;
+        std::memcpy(table, &count, 4);
+        if (!rows.empty()) std::memcpy(static_cast<char*>(table) + 4, rows.data(), rows.size() * sizeof(rows[0]));
+        fetchedBytes.push_back(size);
+        return platform::kNoError;
+    }
+
+    std::uint32_t SetTcpEntry(const platform::TcpRow& row) override {
+        entries.push_back(row);
+        if (teardownResult == platform::kNoError && removeOnTeardown) {
+            for (auto it = rows.begin(); it != rows.end(); ++it) {
+                if (it->remoteAddr == row.remoteAddr && it->remotePort == row.remotePort &&
+                    it->localAddr == row.localAddr && it->localPort == row.localPort) {
+                    rows.erase(it);
+                    break;
+                }
+            }
+        }
+        return teardownResult;
+    }
+
+    std::vector<platform::TcpRow> rows;
+    std::uint32_t failWith = platform::kNoError;
+    std::uint32_t teardownResult = platform::kNoError;
+    bool removeOnTeardown = false;
+    std::uint32_t overstateCount = 0;  // a count larger than the rows written
+    std::function<void()> beforeFetch;
+
+    int fetches = 0;
+    bool lastOrder = true;
+    std::vector<std::uint32_t> fetchedBytes;  // buffer size of each successful fetch
+    std::vector<platform::TcpRow> entries;    // every SetTcpEntry call
+};
+
+class FakeNotifyArea final : public platform::NotifyArea {
+public:
+    struct Call {
+        std::uint32_t message;
+        platform::NotifyIconData data;
+    };
+    bool ShellNotifyIcon(std::uint32_t message, const platform::NotifyIconData& data) override {
+        calls.push_back({message, data});
+        return true;
+    }
+    std::vector<Call> calls;
+};
+
+class FakeWindow final : public platform::Window {
+public:
+    platform::WindowHandle Handle() const override { return handle; }
+    platform::IconHandle Icon() const override { return icon; }
+    std::string Caption() const override { return caption; }
+    void SetCaption(const std::string& text) override {
+        caption = text;
+        ++captionChanges;
+    }
+    bool Visible() const override { return visible; }
+    void SetVisible(bool v) override { visible = v; }
+    platform::WindowState State() const override { return state; }
+    void SetState(platform::WindowState s) override { state = s; }
+    std::int32_t Width() const override { return width; }
+    std::int32_t Height() const override { return height; }
+    void Move(std::int32_t l, std::int32_t t) override {
+        left = l;
+        top = t;
+    }
+
+    platform::WindowHandle handle = 0x1234;
+    platform::IconHandle icon = 0x777;
+    std::string caption = "FrmMain";
+    int captionChanges = 0;
+    bool visible = false;
+    platform::WindowState state = platform::WindowState::Normal;
+    std::int32_t width = 616, height = 320, left = 0, top = 0;
+};
+
+class FakeSwitch final : public platform::Switch {
+public:
+    bool Value() const override { return value; }
+    void Value(bool v) override { value = v; }
+    std::string Caption() const override { return caption; }
+    void Caption(const std::string& c) override { caption = c; }
+    std::uint32_t BackColor() const override { return backColor; }
+    void BackColor(std::uint32_t c) override { backColor = c; }
+    std::uint32_t BackOver() const override { return backOver; }
+    void BackOver(std::uint32_t c) override { backOver = c; }
+
+    bool value = false;
+    std::string caption = "KirelXPButton1";
+    std::uint32_t backColor = 0x8000000F, backOver = 0x8000000F;
+};
+
+class FakeTimer final : public platform::Timer {
+public:
+    std::uint32_t Interval() const override { return interval; }
+    void Interval(std::uint32_t ms) override { interval = ms; }
+    bool Enabled() const override { return enabled; }
+    void Enabled(bool e) override { enabled = e; }
+    std::uint32_t interval = 0;
+    bool enabled = false;
+};
+
+class FakePump final : public platform::MessagePump {
+public:
+    bool PumpMessages() override {
+        ++pumps;
+        if (onPump) onPump();
+        return !quitting;
+    }
+    std::function<void()> onPump;
+    bool quitting = false;
+    int pumps = 0;
+};
+
+class FakeWindowManager final : public platform::WindowManager {
+public:
+    struct Call {
+        platform::WindowHandle window, insertAfter;
+        std::int32_t x, y, cx, cy;
+        std::uint32_t flags;
+    };
+    bool SetWindowPos(platform::WindowHandle window, platform::WindowHandle insertAfter, std::int32_t x, std::int32_t y,
+                      std::int32_t cx, std::int32_t cy, std::uint32_t flags) override {
+        calls.push_back({window, insertAfter, x, y, cx, cy, flags});
+        if (onSetWindowPos) onSetWindowPos(flags);
+        return true;
+    }
+    std::int32_t ScreenWidth() const override { return screenWidth; }
+    std::int32_t ScreenHeight() const override { return screenHeight; }
+
+    std::vector<Call> calls;
+    std::function<void(std::uint32_t)> onSetWindowPos;
+    std::int32_t screenWidth = 1024, screenHeight = 768;
+};
+
+class FakeInstance final : public platform::Instance {
+public:
+    bool PreviousInstance() override { return running; }
+    void CreateNamedMutex(const std::string& name) override { mutexes.push_back(name); }
+    bool running = false;
+    std::vector<std::string> mutexes;
+};
+
+}  // namespace vantorel::testing

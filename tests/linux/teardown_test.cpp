@@ -1,0 +1,227 @@
+// The real sweep against real loopback connections through the Linux connection table, in a private
+// network namespace: listed peers are aborted and counted once, unlisted ones keep working, and the
+// table's rows are laid out like the Windows table. Needs root; without it every test here skips and
+// says why.
+#include <gtest/gtest.h>
+
+#include <linux/capability.h>
+#include <netinet/in.h>
+#include <sys/syscall.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <memory>
+
+#include "fakes/fake_guard_platform.h"
+#include "fakes/fake_registry.h"
+#include "guard/sweep.h"
+#include "linux/loopback.h"
+#include "platform/linux/connection_table_linux.h"
+
+namespace vantorel {
+namespace {
+
+using namespace vantorel::testing;
+using linux_platform::LinuxConnectionTable;
+
+// Each test enters a namespace of its own, so it sees only its own sockets.
+class RealTeardown : public ::testing::Test {
+protected:
+    void SetUp() override {
+        std::string reason = TeardownUnavailableReason();
+        if (!reason.empty()) GTEST_SKIP() << reason;
+        std::string failed = EnterPrivateNetwork();
+        if (!failed.empty())
+            GTEST_SKIP() << "no private network namespace (" << failed
+                         << "); the sweep would touch other people's connections";
+        table_ = std::make_unique<LinuxConnectionTable>();
+        ASSERT_TRUE(table_->Ok());
+    }
+
+    std::vector<platform::TcpRow> Fetch() {
+        std::vector<std::uint32_t> words(1 + 5 * 4096);
+        auto size = static_cast<std::uint32_t>(words.size() * 4);
+        EXPECT_EQ(table_->GetTcpTable(words.data(), size, false), platform::kNoError);
+        std::vector<platform::TcpRow> rows(words[0]);
+        std::memcpy(rows.data(), words.data() + 1, rows.size() * sizeof(platform::TcpRow));
+        return rows;
+    }
+
+    std::unique_ptr<LinuxConnectionTable> table_;
+    FakePump pump_;
+    FakeRegistry registry_;
+    FakeWindow window_;
+    FakeNotifyArea tray_;
+};
+
+DefinitionList ListOf(std::vector<std::string> addresses) {
+    std::vector<std::string> keys;
+    for (const auto& a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(AddressField(a))));
+    std::sort(keys.begin(), keys.end());
+    std::string text;
+    for (const auto& k : keys) text += k + "\r\n";
+    return DefinitionList::FromText(text);
+}
+
+TEST_F(RealTeardown, RowsAreLaidOutLikeTheWindowsTable) {
+    Listener listener = Listen("127.0.0.3");
+    ASSERT_TRUE(listener.fd);
+    Connection connection = Connect(listener);
+    ASSERT_TRUE(connection.client && connection.server);
+    EXPECT_EQ(static_cast<std::int32_t>(AddressField("1.2.3.4")), 67305985);
+
+    std::vector<platform::TcpRow> rows = Fetch();
+    ASSERT_EQ(rows.size(), 3u) << "the listener and both ends, nothing else in this namespace";
+    auto find = [&](auto predicate) { return std::find_if(rows.begin(), rows.end(), predicate); };
+    auto listening = find([](const platform::TcpRow& r) { return r.state == platform::kTcpStateListen; });
+    ASSERT_NE(listening, rows.end());
+    EXPECT_EQ(listening->remoteAddr, 0u) << "a listening row's key is 0";
+    EXPECT_EQ(listening->localAddr, AddressField("127.0.0.3"));
+    EXPECT_EQ(listening->localPort, htons(listener.port));
+
+    auto client = find([&](const platform::TcpRow& r) { return r.localPort == htons(connection.clientPort); });
+    ASSERT_NE(client, rows.end());
+    EXPECT_EQ(client->state, platform::kTcpStateEstablished);
+    EXPECT_EQ(client->localAddr, 0x0100007Fu);
+    EXPECT_EQ(client->remoteAddr, 0x0300007Fu) << "127.0.0.3 in network order, read little-endian";
+    EXPECT_EQ(static_cast<std::int32_t>(client->remoteAddr), 50331775);
+    EXPECT_EQ(client->remotePort, htons(listener.port));
+
+    // A sorted table comes back in address and port order.
+    std::vector<std::uint32_t> words(1 + 5 * 16);
+    auto size = static_cast<std::uint32_t>(words.size() * 4);
+    ASSERT_EQ(table_->GetTcpTable(words.data(), size, true), platform::kNoError);
+    ASSERT_EQ(words[0], 3u);
+    EXPECT_EQ(words[1 + 1], 0x0100007Fu) << "127.0.0.1 sorts first";
+
+    // Too small a buffer: the size needed, nothing written.
+    std::uint32_t small = 4 + 20;
+    words[0] = 77;
+    EXPECT_EQ(table_->GetTcpTable(words.data(), small, false), platform::kErrorInsufficientBuffer);
+    EXPECT_EQ(small, 4u + 3 * 20);
+    EXPECT_EQ(words[0], 77u);
+}
+
+TEST_F(RealTeardown, ListedPeersAreAbortedAndCountedOnceUnlistedPeersKeepWorking) {
+    Listener listed = Listen("127.0.0.2");
+    Listener unlisted = Listen("127.0.0.3");
+    Listener high = Listen("127.0.0.200");  // last byte 200: a negative key
+    ASSERT_TRUE(listed.fd && unlisted.fd && high.fd);
+    ASSERT_LT(static_cast<std::int32_t>(AddressField("127.0.0.200")), 0);
+    Connection toListed = Connect(listed);
+    Connection toUnlisted = Connect(unlisted);
+    Connection toHigh = Connect(high);
+    ASSERT_TRUE(toListed.server && toUnlisted.server && toHigh.server);
+
+    DefinitionList list = ListOf({"127.0.0.2", "127.0.0.200", "192.0.2.1"});
+    std::int32_t count = 0;
+    ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, window_, tray_}, list, count);
+    sweep.SweepConnections();
+    EXPECT_EQ(sweep.LastSweep().rows, 9u);
+    EXPECT_EQ(sweep.LastSweep().requested, 2u);
+    EXPECT_EQ(sweep.LastSweep().intercepted, 2u);
+    EXPECT_EQ(count, 2);
+    EXPECT_EQ(window_.caption, "Vantorel - 2 attempts intercepted");
+
+    EXPECT_EQ(ReadError(toListed.client.get()), ECONNABORTED) << "the listed connection was aborted";
+    EXPECT_EQ(ReadError(toHigh.client.get()), ECONNABORTED) << "a negative key is torn down too";
+    EXPECT_NE(ReadError(toListed.server.get()), EAGAIN) << "the peer saw the connection end";
+    EXPECT_EQ(ReadError(toUnlisted.client.get()), EAGAIN) << "the unlisted connection is still open";
+    EXPECT_TRUE(Exchange(toUnlisted.client.get(), toUnlisted.server.get(), "still here"));
+    EXPECT_TRUE(Exchange(toUnlisted.server.get(), toUnlisted.client.get(), "and back"));
+
+    // The aborted sockets are gone from the table: later sweeps count nothing more.
+    sweep.SweepConnections();
+    sweep.SweepConnections();
+    EXPECT_EQ(sweep.LastSweep().requested, 0u);
+    EXPECT_EQ(count, 2);
+    EXPECT_TRUE(Exchange(toUnlisted.client.get(), toUnlisted.server.get(), "after three sweeps"));
+}
+
+TEST_F(RealTeardown, TablesBeyondTheFirstBufferAreSweptWhole) {
+    ASSERT_TRUE(AllowOpenFiles(8192));
+    Listener unlisted = Listen("127.0.0.3");
+    Listener listed = Listen("127.0.0.2");
+    std::vector<Connection> background;
+    for (int i = 0; i < 1200; ++i) {
+        background.push_back(Connect(unlisted));
+        ASSERT_TRUE(background.back().server);
+    }
+    Connection last = Connect(listed);  // its row comes well after row 1001
+    ASSERT_TRUE(last.server);
+
+    DefinitionList list = ListOf({"127.0.0.2"});
+    std::int32_t count = 0;
+    ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, window_, tray_}, list, count);
+    sweep.SweepConnections();
+    EXPECT_EQ(sweep.LastSweep().rows, 2u * 1201 + 2);
+    EXPECT_EQ(sweep.LastSweep().fetchCalls, 2);
+    EXPECT_EQ(count, 1);
+    EXPECT_EQ(ReadError(last.client.get()), ECONNABORTED);
+    EXPECT_EQ(ReadError(background.front().client.get()), EAGAIN);
+}
+
+TEST_F(RealTeardown, SetTcpEntryAnswersLikeTheSystem) {
+    Listener listed = Listen("127.0.0.2");
+    Connection connection = Connect(listed);
+    ASSERT_TRUE(connection.server);
+    platform::TcpRow row{platform::kTcpStateDeleteTcb, AddressField("127.0.0.1"), htons(connection.clientPort),
+                         AddressField("127.0.0.2"), htons(listed.port)};
+    platform::TcpRow wrongState = row;
+    wrongState.state = platform::kTcpStateEstablished;
+    EXPECT_EQ(table_->SetTcpEntry(wrongState), 87u) << "only the delete state is accepted";
+    platform::TcpRow nobody = row;
+    nobody.remotePort = htons(1);
+    EXPECT_EQ(table_->SetTcpEntry(nobody), 1168u) << "no such connection";
+    EXPECT_EQ(ReadError(connection.client.get()), EAGAIN);
+    // Found by its addresses alone, without a dump first.
+    EXPECT_EQ(table_->SetTcpEntry(row), platform::kNoError);
+    EXPECT_EQ(ReadError(connection.client.get()), ECONNABORTED);
+}
+
+// Drops CAP_NET_ADMIN from the calling process, as for a program run without administrator rights.
+bool DropNetAdmin() {
+    __user_cap_header_struct header{_LINUX_CAPABILITY_VERSION_3, 0};
+    __user_cap_data_struct data[2] = {};
+    if (::syscall(SYS_capget, &header, data) != 0) return false;
+    data[0].effective &= ~(1u << CAP_NET_ADMIN);
+    data[0].permitted &= ~(1u << CAP_NET_ADMIN);
+    return ::syscall(SYS_capset, &header, data) == 0;
+}
+
+TEST_F(RealTeardown, WithoutTheRightToTearDownNothingIsCounted) {
+    Listener listed = Listen("127.0.0.2");
+    Connection connection = Connect(listed);
+    ASSERT_TRUE(connection.server);
+    DefinitionList list = ListOf({"127.0.0.2"});
+
+    // In a child process without CAP_NET_ADMIN the kernel refuses every teardown; the child reports
+    // through its exit code: 0 all as expected, else the first check that failed.
+    pid_t child = ::fork();
+    ASSERT_GE(child, 0);
+    if (child == 0) {
+        if (!DropNetAdmin()) ::_exit(10);
+        LinuxConnectionTable table;
+        FakePump pump;
+        FakeRegistry registry;
+        FakeWindow window;
+        FakeNotifyArea tray;
+        std::int32_t count = 5;
+        ConnectionSweep sweep(SweepServices{table, pump, registry, window, tray}, list, count);
+        for (int i = 0; i < 3; ++i) sweep.SweepConnections();
+        if (sweep.LastSweep().requested != 1) ::_exit(11);
+        if (count != 5) ::_exit(12);
+        if (window.captionChanges != 0 || !tray.calls.empty()) ::_exit(13);
+        ::_exit(0);
+    }
+    int status = 0;
+    ASSERT_EQ(::waitpid(child, &status, 0), child);
+    ASSERT_TRUE(WIFEXITED(status));
+    EXPECT_EQ(WEXITSTATUS(status), 0) << "10 capset failed, 11 no request, 12 counted, 13 shown";
+    EXPECT_EQ(ReadError(connection.client.get()), EAGAIN) << "the connection is untouched";
+}
+
+}  // namespace
+}  // namespace vantorel
