@@ -1,6 +1,7 @@
 #include "platform/win32/options_window_win32.h"
 
 #include "platform/win32/files_win32.h"
+#include "platform/win32/registry_win32.h"
 
 namespace vantorel::win32 {
 
@@ -36,6 +37,12 @@ std::string AutostartPath() {
     std::size_t dot = base.find_last_of('.');
     if (dot != std::string::npos) base.erase(dot);
     return ProgramFolder() + "\\" + base + ".exe";
+}
+
+void ShowOptionsModal(HWND owner, int frameIndex) {
+    Win32Registry registry;
+    OptionsWindow window(owner, frameIndex, registry, AutostartPath());
+    window.ShowModal();
 }
 
 OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& registry,

@@ -47,6 +47,11 @@ private:
     std::unique_ptr<FrmOptions> form_;
 };
 
+// What the main window's "&Updates" and "&Options" buttons (and the missing-definitions start-up)
+// call: loads the options window on frame `frameIndex` (0 options, 1 updates), shows it modally
+// owned by `owner` and returns when it has closed.
+void ShowOptionsModal(HWND owner, int frameIndex);
+
 // The path written as the autostart entry: the program's folder + "\" + base name + ".exe".
 std::string AutostartPath();
 
