@@ -26,6 +26,7 @@ add_executable(vantorel_tests
     tests/guard_test.cpp
     tests/sweep_test.cpp
     tests/tray_test.cpp
+    tests/frm_main_test.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp
 )

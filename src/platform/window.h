@@ -24,8 +24,9 @@ public:
     virtual ~Window() = default;
 
     virtual WindowHandle Handle() const = 0;
-    // The icon the window shows now.
+    // The icon the window shows now (title bar and, through ModifyTrayIcon, the tray).
     virtual IconHandle Icon() const = 0;
+    virtual void SetIcon(IconHandle icon) = 0;
 
     virtual std::string Caption() const = 0;
     virtual void SetCaption(const std::string& caption) = 0;
@@ -88,7 +89,12 @@ public:
                               std::int32_t cx, std::int32_t cy, std::uint32_t flags) = 0;
     virtual std::int32_t ScreenWidth() const = 0;
     virtual std::int32_t ScreenHeight() const = 0;
+
+    // GetSystemMenu(window, revert = false), then DeleteMenu of `command` addressed by command.
+    virtual bool DeleteSystemMenuCommand(WindowHandle window, std::uint32_t command) = 0;
 };
+
+inline constexpr std::uint32_t kScSize = 0xF000;  // the system menu's size command
 
 inline constexpr WindowHandle kHwndTopmost = -1;
 inline constexpr WindowHandle kHwndNoTopmost = -2;

@@ -11,11 +11,13 @@ import os
 import shutil
 import sys
 import tempfile
+import time
 import unittest
 
 import harness
 
 BUILD = None
+ARTIFACTS = None
 SESSION = None
 
 
@@ -65,10 +67,131 @@ class StartUp(unittest.TestCase):
             gone = SESSION.find(lambda w: w.caption == "Definitions Error" and w.visible, timeout=3)
             self.assertIsNone(gone)
             self.assertIsNone(SESSION.program.poll(), "the program does not end silently")
+            # Then the updates window, modally; closed with the file still missing, a second message.
+            updates = SESSION.find(lambda w: w.caption == "Updates" and w.visible)
+            self.assertIsNotNone(updates, "the updates window opens")
+            SESSION.post(updates, 0x10)  # WM_CLOSE
+            second = SESSION.find(lambda w: w.caption == "Definitions Error" and w.visible)
+            self.assertIsNotNone(second, "the program says it carries on without definitions")
+            texts = [c.caption for c in SESSION.controls(second)]
+            self.assertTrue(any("still missing" in t for t in texts), texts)
+            self.click_button(second, "OK")
+            main = SESSION.find(lambda w: w.cls == "VantorelFrmMain" and w.visible)
+            self.assertIsNotNone(main, "start-up runs to its end")
+            self.assertEqual(main.caption.split(" - ")[0], "Vantorel")
+            self.assertIn("with 0 definitions", SESSION.program_output())
         finally:
             folder.remove()
 
 
+HKCU_KEY = r"HKEY_CURRENT_USER\SOFTWARE\Vantorel"
+HKLM_KEY = r"HKEY_LOCAL_MACHINE\SOFTWARE\Vantorel"
+DEFINITIONS = b"-939524086\r\n67305985"
+WM_CLOSE, WM_SYSCOMMAND, SC_MINIMIZE = 0x10, 0x112, 0xF020
+
+
+def is_main(w):
+    return w.cls == "VantorelFrmMain"
+
+
+def wait_for(condition, timeout=15):
+    deadline = time.time() + timeout
+    while time.time() < deadline:
+        value = condition()
+        if value:
+            return value
+        time.sleep(0.3)
+    return condition()
+
+
+class MainWindow(unittest.TestCase):
+    """The real program on an empty (or prepared) registry, driven with real clicks."""
+
+    def setUp(self):
+        SESSION.reg_delete_key(HKCU_KEY)
+        SESSION.reg_delete_key(HKLM_KEY)
+        self.folder = ProgramFolder(definitions=DEFINITIONS)
+
+    def tearDown(self):
+        SESSION.close_program()
+        self.folder.remove()
+
+    def start(self):
+        SESSION.start(self.folder.exe)
+        self.assertTrue(wait_for(lambda: "Started" in SESSION.program_output(), 60), SESSION.program_output())
+
+    def main_window(self, visible=True):
+        return SESSION.find(lambda w: is_main(w) and w.visible == visible, timeout=10)
+
+    def control(self, window, predicate):
+        return next((c for c in SESSION.controls(window) if predicate(c)), None)
+
+    def ended(self):
+        """The program has gone: its window no longer exists and it said it unloaded."""
+        return wait_for(lambda: "Unloaded" in SESSION.program_output()
+                        and not any(is_main(w) for w in SESSION.windows()), 20)
+
+    def test_first_start_shows_off_and_two_clicks_restore_state_and_registry(self):
+        self.start()
+        window = self.main_window()
+        self.assertIsNotNone(window, "the window is shown on a first start")
+        self.assertEqual(window.caption, "Vantorel -  0 attempts intercepted")
+        switch = self.control(window, lambda c: c.cls == "KirelXPButton")
+        self.assertIsNotNone(switch)
+        self.assertEqual(switch.caption, "OFF")
+        self.assertEqual(SESSION.reg_query(HKCU_KEY, "State"), "0")
+        captions = sorted(c.caption for c in SESSION.controls(window) if c.cls.lower() == "button")
+        self.assertEqual(captions, sorted(["&Tray", "&Exit", "&Help", "&Updates", "&Options"]))
+        time.sleep(1.2)
+        SESSION.screenshot(os.path.join(ARTIFACTS, "main-window-off.png"))
+
+        SESSION.click(*switch.centre())
+        self.assertTrue(wait_for(lambda: SESSION.reg_query(HKCU_KEY, "State") == "1"), "one click switches on")
+        self.assertEqual(self.control(window, lambda c: c.cls == "KirelXPButton").caption, "ON")
+        time.sleep(1.5)  # a status tick puts the padlock up
+        self.assertIn("Light: padlock", SESSION.program_output())
+        SESSION.click(switch.centre()[0] + 20, switch.centre()[1] + 40)  # the pointer leaves its hover look
+        time.sleep(0.5)
+        SESSION.screenshot(os.path.join(ARTIFACTS, "main-window-on.png"))
+
+        SESSION.click(*switch.centre())
+        self.assertTrue(wait_for(lambda: SESSION.reg_query(HKCU_KEY, "State") == "0"), "a second click switches off")
+        self.assertEqual(self.control(window, lambda c: c.cls == "KirelXPButton").caption, "OFF")
+        self.assertEqual(SESSION.program_output().count("Guard "), 3, SESSION.program_output())
+
+        exit_button = self.control(window, lambda c: c.caption == "&Exit")
+        SESSION.click(*exit_button.centre())
+        self.assertTrue(self.ended(), "\"&Exit\" ends the program")
+
+    def test_stored_state_on_starts_on(self):
+        SESSION.reg_add(HKCU_KEY, "State", "1")
+        self.start()
+        self.assertIn("guard on", SESSION.program_output())
+        window = self.main_window()
+        self.assertEqual(self.control(window, lambda c: c.cls == "KirelXPButton").caption, "ON")
+        self.assertEqual(SESSION.reg_query(HKCU_KEY, "State"), "1")
+        self.assertTrue(wait_for(lambda: "Swept the connection table" in SESSION.program_output()), "it sweeps")
+
+    def test_tray_setting_starts_hidden_and_the_close_button_ends_the_program(self):
+        SESSION.reg_add(HKLM_KEY, "Tray", "1")
+        self.start()
+        hidden = self.main_window(visible=False)
+        self.assertIsNotNone(hidden, "the window exists, hidden")
+        self.assertIsNone(SESSION.find(lambda w: is_main(w) and w.visible, timeout=2))
+        SESSION.post(hidden, WM_CLOSE)
+        self.assertTrue(self.ended(), "closing the window ends the program")
+
+    def test_minimising_hides_the_window_in_the_tray(self):
+        self.start()
+        window = self.main_window()
+        SESSION.post(window, WM_SYSCOMMAND, SC_MINIMIZE)
+        self.assertIsNotNone(SESSION.find(lambda w: is_main(w) and not w.visible, timeout=10),
+                             "minimised, the window goes to the tray")
+        self.assertIsNone(SESSION.find(lambda w: is_main(w) and w.visible, timeout=2))
+        self.assertIn("Hidden in the tray", SESSION.program_output())
+
+
 if __name__ == "__main__":
     BUILD = os.path.abspath(sys.argv.pop(1))
+    ARTIFACTS = os.path.dirname(BUILD)
     unittest.main(verbosity=2)

@@ -6,6 +6,7 @@
 #include <cstring>
 #include <functional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "platform/connection_table.h"
@@ -87,6 +88,10 @@ class FakeWindow final : public platform::Window {
 public:
     platform::WindowHandle Handle() const override { return handle; }
     platform::IconHandle Icon() const override { return icon; }
+    void SetIcon(platform::IconHandle i) override {
+        icon = i;
+        icons.push_back(i);
+    }
     std::string Caption() const override { return caption; }
     void SetCaption(const std::string& text) override {
         caption = text;
@@ -105,6 +110,7 @@ public:
 
     platform::WindowHandle handle = 0x1234;
     platform::IconHandle icon = 0x777;
+    std::vector<platform::IconHandle> icons;  // every icon set, in order
     std::string caption = "FrmMain";
     int captionChanges = 0;
     bool visible = false;
@@ -165,7 +171,12 @@ public:
     }
     std::int32_t ScreenWidth() const override { return screenWidth; }
     std::int32_t ScreenHeight() const override { return screenHeight; }
+    bool DeleteSystemMenuCommand(platform::WindowHandle window, std::uint32_t command) override {
+        deletedCommands.push_back({window, command});
+        return true;
+    }
 
+    std::vector<std::pair<platform::WindowHandle, std::uint32_t>> deletedCommands;
     std::vector<Call> calls;
     std::function<void(std::uint32_t)> onSetWindowPos;
     std::int32_t screenWidth = 1024, screenHeight = 768;

@@ -1,9 +1,11 @@
-// vantorel.exe: start-up of the guard on its main window, then the message loop.
+// vantorel.exe: the main window FrmMain, start-up of the guard on it, then the message loop.
 //
 // The program refuses to run twice, brings the guard up in its stored state, sweeps the connection
-// table every 55 ms while the guard is on, and keeps its icon in the notification area. It also
-// writes what it shows to standard output (the definitions it read, the caption whenever it has
-// changed, once a second, and each switch of the guard), so a run without a screen can be followed.
+// table every 55 ms while the guard is on, shows its state as the window's icon (a steady padlock
+// while on, a blinking bulb while off) and keeps its icon in the notification area. It also writes
+// what it shows to standard output (the definitions it read, the messages it shows, the caption
+// whenever it has changed, the light and each switch of the guard), so a run without a screen can be
+// followed.
 #include <windows.h>
 
 #include <chrono>
@@ -11,17 +13,16 @@
 #include <string>
 
 #include "guard/attempts.h"
-#include "guard/guard.h"
 #include "guard/read_definitions.h"
 #include "platform/win32/connection_table_win32.h"
 #include "platform/win32/files_win32.h"
 #include "platform/win32/main_window_win32.h"
+#include "platform/win32/options_window_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "platform/win32/shell_win32.h"
+#include "ui/main/frm_main.h"
 
 namespace {
-
-constexpr const char* kWebAddress = "http://www.vantorel.com/";
 
 void WriteStdout(const std::string& text) {
     HANDLE out = ::GetStdHandle(STD_OUTPUT_HANDLE);
@@ -30,59 +31,62 @@ void WriteStdout(const std::string& text) {
     ::WriteFile(out, text.data(), static_cast<DWORD>(text.size()), &written, nullptr);
 }
 
+// The shell, saying on standard output what it opens and shows.
+class ReportingShell final : public vantorel::win32::Win32Shell {
+public:
+    std::intptr_t Execute(vantorel::platform::WindowHandle owner, const std::string& operation, const std::string& file,
+                          const std::string& parameters, const std::string& directory, std::int32_t show) override {
+        WriteStdout("Open: " + file + "\n");
+        return Win32Shell::Execute(owner, operation, file, parameters, directory, show);
+    }
+    void ShowMessage(vantorel::platform::WindowHandle owner, const std::string& text, const std::string& title,
+                     std::uint32_t style) override {
+        WriteStdout(title + ": " + text + "\n");
+        Win32Shell::ShowMessage(owner, text, title, style);
+    }
+};
+
+class Program final : public vantorel::platform::Application {
+public:
+    explicit Program(vantorel::win32::MainWindow& window) : window_(window) {}
+    void ShowOptionsModal(vantorel::platform::WindowHandle owner, int frameIndex) override {
+        WriteStdout(frameIndex == 1 ? "Options window: Updates\n" : "Options window: Options\n");
+        vantorel::win32::ShowOptionsModal(reinterpret_cast<HWND>(owner), frameIndex);
+    }
+    void EndProgram() override {
+        window_.Destroy();
+        ::PostQuitMessage(0);
+    }
+
+private:
+    vantorel::win32::MainWindow& window_;
+};
+
+const char* LightName(const vantorel::win32::MainWindow& window) {
+    if (window.Icon() == window.Lights(vantorel::kLightPadlock)) return "padlock";
+    if (window.Icon() == window.Lights(vantorel::kLightBright)) return "bright bulb";
+    return "dark bulb";
+}
+
 }  // namespace
 
 int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     using namespace vantorel;
+    win32::Win32Instance previous;
+    // Initialisation: another instance running ends this one at once, before any window exists.
+    if (previous.PreviousInstance()) return 0;
+
     win32::Win32Registry registry;
     win32::Win32Files files;
     win32::Win32ConnectionTable table;
     win32::Win32NotifyArea tray;
     win32::Win32WindowManager windows;
     win32::Win32MessagePump pump;
-    win32::Win32Instance previous;
-    win32::MainWindow frmMain;
+    ReportingShell shell;
+    win32::MainWindow window;
+    Program program(window);
 
-    auto onMissing = [&frmMain] {
-        std::string text = std::string("Reading definitions, installation corrupted re-install at ") + kWebAddress;
-        WriteStdout("Definitions Error: " + text + "\n");
-        // Owned by the main window, so it stands in front of it.
-        ::MessageBoxA(reinterpret_cast<HWND>(frmMain.Handle()), text.c_str(), "Definitions Error",
-                      MB_OK | MB_ICONSTOP);
-    };
-    Guard guard(GuardPlatform{registry, files, table, tray, windows, pump, previous},
-                GuardWindow{frmMain, frmMain.BtnOnOff(), frmMain.Tmr(), frmMain.Timer()}, win32::ProgramFolder(),
-                onMissing);
-
-    if (!guard.Initialize()) return 0;  // another instance runs: leave without a trace
-
-    std::string reported;
-    std::uint64_t sweepsReported = 0;
-    auto report = [&] {
-        std::string caption = frmMain.Caption();
-        std::uint64_t sweeps = guard.SweepsRun();
-        if (caption != reported) WriteStdout("Caption: " + caption + "\n");
-        if (sweeps != sweepsReported) {
-            char line[160];
-            std::snprintf(line, sizeof line, "Swept the connection table %llu times; the last sweep examined %u rows.\n",
-                          static_cast<unsigned long long>(sweeps), guard.Sweep().LastSweep().examined);
-            WriteStdout(line);
-        }
-        reported = caption;
-        sweepsReported = sweeps;
-    };
-
-    win32::MainWindowHandlers handlers;
-    handlers.switchClick = [&] {
-        guard.BtnOnOffClick();
-        WriteStdout(std::string("Guard ") + (frmMain.BtnOnOff().Value() ? "on" : "off") + "\n");
-    };
-    handlers.tmrTick = [&] { guard.TmrTick(); };
-    handlers.timerTick = report;
-    handlers.mouseMove = [&](std::uint32_t code) { guard.MouseMove(code); };
-    handlers.taskbarCreated = [&] { guard.TaskbarCreated(); };
-    handlers.unload = [&] { guard.Unload(); };
-    if (!frmMain.Create(instance, handlers)) {
+    if (!window.Create(instance)) {
         char line[128];
         std::snprintf(line, sizeof line, "Vantorel: the main window could not be created (CreateWindowExA, error %lu).\n",
                       ::GetLastError());
@@ -90,18 +94,73 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
         return 1;
     }
 
+    FrmMain frmMain(FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, previous}, shell, program},
+                    FrmMainControls{window,
+                                    window.BtnOnOff(),
+                                    window.Tmr(),
+                                    window.Timer(),
+                                    {&window.BtnO(0), &window.BtnO(1), &window.BtnO(2), &window.BtnO(3), &window.BtnO(4)},
+                                    {&window.Uf(0), &window.Uf(1)},
+                                    {&window.L(0), &window.L(1)},
+                                    {window.Lights(0), window.Lights(1), window.Lights(2)}},
+                    win32::ProgramFolder());
+
+    std::string reportedCaption, reportedLight;
+    std::uint64_t sweepsReported = 0;
+    auto report = [&] {
+        std::string caption = window.Caption();
+        std::string light = LightName(window);
+        std::uint64_t sweeps = frmMain.guard().SweepsRun();
+        if (caption != reportedCaption) WriteStdout("Caption: " + caption + "\n");
+        if (light != reportedLight) WriteStdout("Light: " + light + "\n");
+        if (sweeps != sweepsReported) {
+            char line[160];
+            std::snprintf(line, sizeof line, "Swept the connection table %llu times; the last sweep examined %u rows.\n",
+                          static_cast<unsigned long long>(sweeps), frmMain.guard().Sweep().LastSweep().examined);
+            WriteStdout(line);
+        }
+        reportedCaption = caption;
+        reportedLight = light;
+        sweepsReported = sweeps;
+    };
+
+    win32::MainWindowHandlers handlers;
+    handlers.switchClick = [&] {
+        frmMain.BtnOnOffClick();
+        WriteStdout(std::string("Guard ") + (window.BtnOnOff().Value() ? "on" : "off") + "\n");
+    };
+    handlers.tmrTick = [&] { frmMain.TmrTick(); };
+    handlers.timerTick = [&] {
+        frmMain.TimerTick();
+        report();
+    };
+    handlers.resize = [&] {
+        frmMain.Resize();
+        if (!window.Visible()) WriteStdout("Hidden in the tray\n");
+    };
+    handlers.mouseMove = [&](std::uint32_t code) { frmMain.MouseMove(code); };
+    handlers.taskbarCreated = [&] { frmMain.TaskbarCreated(); };
+    handlers.close = [&] { frmMain.QueryUnload(); };
+    handlers.unload = [&] {
+        frmMain.Unload();
+        WriteStdout("Unloaded\n");
+    };
+    window.SetHandlers(handlers);
+
     auto started = std::chrono::steady_clock::now();
-    guard.Load();
+    frmMain.Load();
     double ms = std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - started).count();
     char line[512];
     std::snprintf(line, sizeof line, "Started in %.1f ms with %zu definitions from %s; guard %s.\n", ms,
                   Definitions.size(), DefinitionsPath(win32::ProgramFolder()).c_str(),
-                  frmMain.BtnOnOff().Value() ? "on" : "off");
+                  window.BtnOnOff().Value() ? "on" : "off");
     WriteStdout(line);
     report();
 
     MSG message;
     while (::GetMessageA(&message, nullptr, 0, 0) > 0) {
+        // Tab, the arrow keys and the access keys of the window's buttons.
+        if (window.Hwnd() != nullptr && ::IsDialogMessageA(window.Hwnd(), &message)) continue;
         ::TranslateMessage(&message);
         ::DispatchMessageA(&message);
     }

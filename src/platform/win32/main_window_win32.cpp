@@ -2,68 +2,65 @@
 
 #include <utility>
 
+#include "platform/win32/resource_ids.h"
+
 namespace vantorel::win32 {
 
 namespace {
 
 constexpr const char* kClassName = "VantorelFrmMain";
 constexpr int kSwitchId = 100;
-// The design layout in twips at 15 twips per pixel: client area 9120 x 4335, the switch at
-// (120, 120) sized 2415 x 4095.
-constexpr int kClientWidth = 9120 / 15, kClientHeight = 4335 / 15;
-constexpr int kSwitchLeft = 120 / 15, kSwitchTop = 120 / 15, kSwitchWidth = 2415 / 15, kSwitchHeight = 4095 / 15;
+constexpr DWORD kStyle = WS_OVERLAPPED | WS_CAPTION | WS_SYSMENU | WS_MINIMIZEBOX;
 
-COLORREF ToColorRef(std::uint32_t colour) {
-    // A colour with the high bit set refers to a system colour by its low byte.
-    if (colour & 0x80000000u) return ::GetSysColor(static_cast<int>(colour & 0xFF));
-    return static_cast<COLORREF>(colour & 0x00FFFFFF);
+// The design, in twips; panel contents relative to their panel.
+constexpr TwipsRect kBtnOnOffRect{120, 120, 2415, 4095};
+constexpr TwipsRect kUfRects[2] = {{2640, 1920, 6375, 1695}, {2640, 120, 6375, 1695}};  // "Update", "Options"
+constexpr const char* kUfCaptions[2] = {"Update", "Options"};
+constexpr TwipsRect kLRects[2] = {{480, 360, 4845, 255}, {480, 360, 3330, 255}};
+constexpr const char* kLCaptions[2] = {"Selectable options such as starting when windows boots...",
+                                       "Check for Vantorel updates..."};
+constexpr TwipsRect kPanelButtonRect{2400, 960, 3855, 495};
+constexpr TwipsRect kRowRects[3] = {{2640, 3720, 2055, 495}, {4800, 3720, 2055, 495}, {6960, 3720, 2055, 495}};
+constexpr const char* kBtnOCaptions[5] = {"&Tray", "&Exit", "&Help", "&Updates", "&Options"};
+
+// The window's DPI: GetDpiForWindow where the system has it (per-monitor awareness), else the
+// screen's.
+UINT DpiOf(HWND hwnd) {
+    using GetDpiForWindowFunction = UINT(WINAPI*)(HWND);
+    if (HMODULE user32 = ::GetModuleHandleA("user32.dll")) {
+        auto get = reinterpret_cast<GetDpiForWindowFunction>(
+            reinterpret_cast<void*>(::GetProcAddress(user32, "GetDpiForWindow")));
+        if (get != nullptr) {
+            UINT dpi = get(hwnd);
+            if (dpi != 0) return dpi;
+        }
+    }
+    HDC dc = ::GetDC(hwnd);
+    UINT dpi = static_cast<UINT>(::GetDeviceCaps(dc, LOGPIXELSY));
+    ::ReleaseDC(hwnd, dc);
+    return dpi == 0 ? 96 : dpi;
+}
+
+HICON LoadIconSized(HINSTANCE instance, int id, int size) {
+    return static_cast<HICON>(::LoadImageA(instance, MAKEINTRESOURCEA(id), IMAGE_ICON, size, size, LR_DEFAULTCOLOR));
 }
 
 }  // namespace
 
-void StandInSwitch::Redraw() {
-    if (hwnd_ != nullptr) ::InvalidateRect(hwnd_, nullptr, TRUE);
-}
-
-void StandInSwitch::Value(bool value) {
-    value_ = value;
-    Redraw();
-}
-
-void StandInSwitch::Caption(const std::string& caption) {
-    caption_ = caption;
-    if (hwnd_ != nullptr) ::SetWindowTextA(hwnd_, caption_.c_str());
-    Redraw();
-}
-
-void StandInSwitch::BackColor(std::uint32_t colour) {
-    backColor_ = colour;
-    Redraw();
-}
-
-void StandInSwitch::BackOver(std::uint32_t colour) {
-    backOver_ = colour;
-    Redraw();
-}
-
-void StandInSwitch::Draw(const DRAWITEMSTRUCT& item) const {
-    RECT box = item.rcItem;
-    HBRUSH brush = ::CreateSolidBrush(ToColorRef(over_ ? backOver_ : backColor_));
-    ::FillRect(item.hDC, &box, brush);
-    ::DeleteObject(brush);
-    ::DrawEdge(item.hDC, &box, (item.itemState & ODS_SELECTED) ? EDGE_SUNKEN : EDGE_RAISED, BF_RECT);
-    int oldMode = ::SetBkMode(item.hDC, TRANSPARENT);
-    COLORREF oldColour = ::SetTextColor(item.hDC, RGB(0, 0, 0));
-    RECT text = box;
-    ::DrawTextA(item.hDC, caption_.c_str(), static_cast<int>(caption_.size()), &text,
-                DT_CENTER | DT_VCENTER | DT_SINGLELINE);
-    ::SetTextColor(item.hDC, oldColour);
-    ::SetBkMode(item.hDC, oldMode);
-    if (item.itemState & ODS_FOCUS) {
-        RECT focus = box;
-        ::InflateRect(&focus, -4, -4);
-        ::DrawFocusRect(item.hDC, &focus);
-    }
+xpbutton::PropertyBag BtnOnOffDesign() {
+    xpbutton::PropertyBag design;
+    design.Write("BTYPE", std::int32_t{3});    // the rounded XP look with a gradient face
+    design.Write("TX", std::string("OFF"));
+    design.Write("FONT", platform::FontDesc{"Verdana", 14.25, true, false, false, false});
+    design.Write("COLTYPE", std::int32_t{2});  // colours from BackColor
+    design.Write("FOCUSR", true);
+    design.Write("BCOL", std::int32_t{0x0000C0});
+    design.Write("BCOLO", std::int32_t{0x0000C0});
+    design.Write("FCOL", std::int32_t{0xFFFFFF});
+    design.Write("FCOLO", std::int32_t{0xFFFFFF});
+    design.Write("CHECK", true);
+    design.Write("VALUE", false);
+    return design;
 }
 
 void Win32Timer::Apply() {
@@ -85,37 +82,74 @@ void Win32Timer::Enabled(bool enabled) {
 MainWindow::MainWindow() = default;
 
 MainWindow::~MainWindow() {
-    if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
+    Destroy();
+    for (IconPair& pair : lights_) {
+        if (pair.large != nullptr) ::DestroyIcon(pair.large);
+        if (pair.small != nullptr) ::DestroyIcon(pair.small);
+    }
+    if (font_ != nullptr) ::DeleteObject(font_);
 }
 
-bool MainWindow::Create(HINSTANCE instance, MainWindowHandlers handlers) {
-    handlers_ = std::move(handlers);
-    icon_ = ::LoadIconA(nullptr, reinterpret_cast<LPCSTR>(IDI_APPLICATION));
+void MainWindow::Destroy() {
+    if (hwnd_ != nullptr && !destroying_) ::DestroyWindow(hwnd_);
+}
+
+bool MainWindow::Create(HINSTANCE instance) {
+    const int largeSize = ::GetSystemMetrics(SM_CXICON), smallSize = ::GetSystemMetrics(SM_CXSMICON);
+    const int ids[3] = {IDI_BULB_DARK, IDI_BULB_LIT, IDI_PADLOCK};
+    for (int i = 0; i < 3; ++i) {
+        lights_[static_cast<std::size_t>(i)] = {LoadIconSized(instance, ids[i], largeSize),
+                                                LoadIconSized(instance, ids[i], smallSize)};
+    }
+    icon_ = lights_[2].large;  // the design icon: the padlock
+
     WNDCLASSEXA windowClass{};
     windowClass.cbSize = sizeof windowClass;
     windowClass.lpfnWndProc = &MainWindow::WindowProc;
     windowClass.hInstance = instance;
-    windowClass.hIcon = icon_;
+    windowClass.hIcon = lights_[2].large;
+    windowClass.hIconSm = lights_[2].small;
     windowClass.hCursor = ::LoadCursorA(nullptr, reinterpret_cast<LPCSTR>(IDC_ARROW));
     windowClass.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
     windowClass.lpszClassName = kClassName;
     if (::RegisterClassExA(&windowClass) == 0 && ::GetLastError() != ERROR_CLASS_ALREADY_EXISTS) return false;
+    if (!XPButtonWindow::RegisterWindowClass(instance)) return false;
 
-    constexpr DWORD kStyle = WS_OVERLAPPED | WS_CAPTION | WS_SYSMENU | WS_MINIMIZEBOX;
-    RECT outer{0, 0, kClientWidth, kClientHeight};
-    ::AdjustWindowRectEx(&outer, kStyle, FALSE, 0);
-    HWND hwnd = ::CreateWindowExA(0, kClassName, "Vantorel", kStyle, CW_USEDEFAULT, CW_USEDEFAULT,
-                                  outer.right - outer.left, outer.bottom - outer.top, nullptr, nullptr, instance, this);
+    HWND hwnd = ::CreateWindowExA(WS_EX_CONTROLPARENT, kClassName, "Vantorel", kStyle, CW_USEDEFAULT, CW_USEDEFAULT,
+                                  100, 100, nullptr, nullptr, instance, this);
     if (hwnd == nullptr) return false;
+    dpi_ = DpiOf(hwnd);
+    RECT outer{0, 0, TwipsToPixels(kClientWidth, dpi_), TwipsToPixels(kClientHeight, dpi_)};
+    ::AdjustWindowRectEx(&outer, kStyle, FALSE, WS_EX_CONTROLPARENT);
+    ::SetWindowPos(hwnd, nullptr, 0, 0, outer.right - outer.left, outer.bottom - outer.top,
+                   SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
+    font_ = CreateDesignFont(dpi_);
+    ::SendMessageA(hwnd, WM_SETFONT, reinterpret_cast<WPARAM>(font_), FALSE);
+    ::SendMessageA(hwnd, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(lights_[2].large));
+    ::SendMessageA(hwnd, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(lights_[2].small));
 
-    HWND button = ::CreateWindowExA(0, "BUTTON", btnOnOff_.caption_.c_str(), WS_CHILD | WS_VISIBLE | WS_TABSTOP | BS_OWNERDRAW,
-                                    kSwitchLeft, kSwitchTop, kSwitchWidth, kSwitchHeight, hwnd,
-                                    reinterpret_cast<HMENU>(static_cast<INT_PTR>(kSwitchId)), instance, nullptr);
-    if (button == nullptr) return false;
-    btnOnOff_.hwnd_ = button;
-    ::SetWindowLongPtrA(button, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(&btnOnOff_));
-    btnOnOff_.buttonProc_ = reinterpret_cast<WNDPROC>(
-        ::SetWindowLongPtrA(button, GWLP_WNDPROC, reinterpret_cast<LONG_PTR>(&MainWindow::SwitchProc)));
+    RECT r = ToPixels(kBtnOnOffRect, dpi_);
+    xpbutton::PropertyBag design = BtnOnOffDesign();
+    if (!onOff_.Create(hwnd, kSwitchId, r.left, r.top, r.right - r.left, r.bottom - r.top, "BtnOnOff", &design))
+        return false;
+    onOff_.events().Click = [this] {
+        if (handlers_.switchClick) handlers_.switchClick();
+    };
+    onOff_.Show();
+
+    for (int i = 1; i >= 0; --i) {  // "Options" above "Update"
+        auto index = static_cast<std::size_t>(i);
+        uf_[index] = std::make_unique<Win32Frame>(hwnd, kUfCaptions[i], kUfRects[i], dpi_, font_);
+        HWND panel = uf_[index]->hwnd();
+        l_[static_cast<std::size_t>(1 - i)] =
+            std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_);
+        const int buttonIndex = i == 1 ? 4 : 3;
+        btnO_[static_cast<std::size_t>(buttonIndex)] =
+            std::make_unique<Win32Button>(panel, kBtnOCaptions[buttonIndex], kPanelButtonRect, dpi_, font_);
+    }
+    for (int i = 0; i < 3; ++i) {
+        btnO_[static_cast<std::size_t>(i)] = std::make_unique<Win32Button>(hwnd, kBtnOCaptions[i], kRowRects[i], dpi_, font_);
+    }
 
     // Explorer announces a restart with this message; the program runs elevated, so it has to be let
     // through the window's message filter to arrive at all.
@@ -134,7 +168,17 @@ bool MainWindow::Create(HINSTANCE instance, MainWindowHandlers handlers) {
     return true;
 }
 
-platform::IconHandle MainWindow::Icon() const { return reinterpret_cast<platform::IconHandle>(icon_); }
+void MainWindow::SetIcon(platform::IconHandle icon) {
+    HICON large = reinterpret_cast<HICON>(icon), small = large;
+    for (const IconPair& pair : lights_) {
+        if (pair.large == large && pair.small != nullptr) small = pair.small;
+    }
+    if (large == icon_) return;
+    icon_ = large;
+    if (hwnd_ == nullptr) return;
+    ::SendMessageA(hwnd_, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(large));
+    ::SendMessageA(hwnd_, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(small));
+}
 
 std::string MainWindow::Caption() const {
     if (hwnd_ == nullptr) return std::string();
@@ -199,20 +243,6 @@ LRESULT CALLBACK MainWindow::WindowProc(HWND hwnd, UINT message, WPARAM wParam, 
     return self->HandleMessage(message, wParam, lParam);
 }
 
-LRESULT CALLBACK MainWindow::SwitchProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
-    auto* button = reinterpret_cast<StandInSwitch*>(::GetWindowLongPtrA(hwnd, GWLP_USERDATA));
-    if (message == WM_MOUSEMOVE && !button->over_) {
-        button->over_ = true;
-        TRACKMOUSEEVENT track{sizeof track, TME_LEAVE, hwnd, 0};
-        ::TrackMouseEvent(&track);
-        button->Redraw();
-    } else if (message == WM_MOUSELEAVE) {
-        button->over_ = false;
-        button->Redraw();
-    }
-    return ::CallWindowProcA(button->buttonProc_, hwnd, message, wParam, lParam);
-}
-
 LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
     HWND hwnd = hwnd_;
     if (message == taskbarCreated_ && taskbarCreated_ != 0) {
@@ -225,34 +255,27 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             else if (wParam == timer_.id_ && handlers_.timerTick) handlers_.timerTick();
             return 0;
         case WM_COMMAND:
-            if (LOWORD(wParam) == kSwitchId && HIWORD(wParam) == BN_CLICKED) {
-                btnOnOff_.Value(!btnOnOff_.Value());  // a two-state button flips itself
-                if (handlers_.switchClick) handlers_.switchClick();
-            }
-            return 0;
-        case WM_DRAWITEM: {
-            const auto* item = reinterpret_cast<const DRAWITEMSTRUCT*>(lParam);
-            if (item->CtlID == static_cast<UINT>(kSwitchId)) {
-                btnOnOff_.Draw(*item);
-                return TRUE;
-            }
+            if (RouteCommand(wParam, lParam)) return 0;
             break;
-        }
+        case WM_SIZE:
+            if (handlers_.resize) handlers_.resize();
+            return 0;
         case WM_MOUSEMOVE:
             // The tray icon's notifications arrive as this message with the event code in the low
             // word: taken raw, not as a signed coordinate.
             if (handlers_.mouseMove) handlers_.mouseMove(LOWORD(lParam));
             return 0;
         case WM_CLOSE:
-            ::DestroyWindow(hwnd_);
+            if (handlers_.close) handlers_.close();
+            else Destroy();
             return 0;
         case WM_DESTROY:
+            destroying_ = true;
             if (handlers_.unload) handlers_.unload();
             ::PostQuitMessage(0);
             return 0;
         case WM_NCDESTROY:
             hwnd_ = nullptr;
-            btnOnOff_.hwnd_ = nullptr;
             tmr_.hwnd_ = nullptr;
             timer_.hwnd_ = nullptr;
             break;

@@ -1,47 +1,42 @@
-// The main window's Win32 host for now: a top-level window with the ON/OFF switch (a plain
-// owner-drawn stand-in until the custom push button takes its place behind the same Switch
-// interface), the two timers, and the messages the guard and the tray need. The window's other
-// controls come later.
+// FrmMain on Windows: the main window laid out in twips and scaled to its DPI, with the ON/OFF
+// switch (a KirelXPButton in check-box behaviour whose design properties come from the window's
+// property store), the "Options" and "Update" panels, the "&Tray", "&Exit", "&Help" row, the three
+// status icons, the two timers, and the messages the window logic needs.
 #pragma once
 
 #include <windows.h>
 
+#include <array>
 #include <functional>
+#include <memory>
 #include <string>
+#include <utility>
 
+#include "controls/xpbutton/property_bag.h"
 #include "platform/window.h"
+#include "platform/win32/controls_win32.h"
+#include "platform/win32/xpbutton_window.h"
 
 namespace vantorel::win32 {
 
 class MainWindow;
 
-// The stand-in switch: a push button that flips its Value when clicked and paints its caption on
-// its BackColor (BackOver while the pointer is over it).
-class StandInSwitch final : public platform::Switch {
+// BtnOnOff as the guard sees it: the KirelXPButton's Value, Caption, BackColor and BackOver.
+class XPSwitch final : public platform::Switch {
 public:
-    bool Value() const override { return value_; }
-    void Value(bool value) override;
-    std::string Caption() const override { return caption_; }
-    void Caption(const std::string& caption) override;
-    std::uint32_t BackColor() const override { return backColor_; }
-    void BackColor(std::uint32_t colour) override;
-    std::uint32_t BackOver() const override { return backOver_; }
-    void BackOver(std::uint32_t colour) override;
-
-    HWND Handle() const { return hwnd_; }
+    explicit XPSwitch(XPButtonWindow& window) : window_(window) {}
+    bool Value() const override { return window_.button().Value(); }
+    void Value(bool value) override { window_.button().SetValue(value); }
+    std::string Caption() const override { return window_.button().Caption(); }
+    void Caption(const std::string& caption) override { window_.button().SetCaption(caption); }
+    std::uint32_t BackColor() const override { return window_.button().BackColor(); }
+    void BackColor(std::uint32_t colour) override { window_.button().SetBackColor(colour); }
+    std::uint32_t BackOver() const override { return window_.button().BackOver(); }
+    void BackOver(std::uint32_t colour) override { window_.button().SetBackOver(colour); }
+    HWND Handle() const { return window_.hwnd(); }
 
 private:
-    friend class MainWindow;
-    void Redraw();
-    void Draw(const DRAWITEMSTRUCT& item) const;
-
-    HWND hwnd_ = nullptr;
-    WNDPROC buttonProc_ = nullptr;  // the button class's own procedure, under ours
-    bool value_ = false;
-    bool over_ = false;
-    std::string caption_;
-    std::uint32_t backColor_ = 0x8000000F;  // the system's button face
-    std::uint32_t backOver_ = 0x8000000F;
+    XPButtonWindow& window_;
 };
 
 class Win32Timer final : public platform::Timer {
@@ -65,22 +60,40 @@ struct MainWindowHandlers {
     std::function<void()> switchClick;
     std::function<void()> tmrTick;
     std::function<void()> timerTick;
+    std::function<void()> resize;
     std::function<void(std::uint32_t)> mouseMove;  // the raw low word of the position
     std::function<void()> taskbarCreated;
-    std::function<void()> unload;
+    std::function<void()> close;   // a close request; without a handler the window is destroyed
+    std::function<void()> unload;  // the window is being destroyed
 };
+
+// The switch's design: the look, scheme and font stored for BtnOnOff in the window's design.
+xpbutton::PropertyBag BtnOnOffDesign();
 
 class MainWindow final : public platform::Window {
 public:
+    // Design layout in twips.
+    static constexpr int kClientWidth = 9120, kClientHeight = 4335;
+
     MainWindow();
     ~MainWindow() override;
 
-    // Creates the window, hidden, with its switch. False (and GetLastError set) when there is no
-    // window station or display to create it on.
-    bool Create(HINSTANCE instance, MainWindowHandlers handlers);
+    // Creates the window, hidden, with all its controls. False (and GetLastError set) when there is
+    // no window station or display to create it on.
+    bool Create(HINSTANCE instance);
+    bool Create(HINSTANCE instance, MainWindowHandlers handlers) {
+        handlers_ = std::move(handlers);
+        return Create(instance);
+    }
+    // Handlers may be set after the window exists; messages before that go unhandled.
+    void SetHandlers(MainWindowHandlers handlers) { handlers_ = std::move(handlers); }
+
+    // Destroys the window (once); safe while it is already being destroyed.
+    void Destroy();
 
     platform::WindowHandle Handle() const override { return reinterpret_cast<platform::WindowHandle>(hwnd_); }
-    platform::IconHandle Icon() const override;
+    platform::IconHandle Icon() const override { return reinterpret_cast<platform::IconHandle>(icon_); }
+    void SetIcon(platform::IconHandle icon) override;
     std::string Caption() const override;
     void SetCaption(const std::string& caption) override;
     bool Visible() const override;
@@ -91,24 +104,44 @@ public:
     std::int32_t Height() const override;
     void Move(std::int32_t left, std::int32_t top) override;
 
-    StandInSwitch& BtnOnOff() { return btnOnOff_; }
+    XPSwitch& BtnOnOff() { return switch_; }
+    XPButtonWindow& BtnOnOffWindow() { return onOff_; }
     Win32Timer& Tmr() { return tmr_; }
     Win32Timer& Timer() { return timer_; }
+    Win32Button& BtnO(int index) { return *btnO_[static_cast<std::size_t>(index)]; }
+    Win32Frame& Uf(int index) { return *uf_[static_cast<std::size_t>(index)]; }
+    Win32Label& L(int index) { return *l_[static_cast<std::size_t>(index)]; }
+    // Lights(0) dark bulb, (1) lit bulb, (2) padlock: each the large icon; the small one goes with it.
+    platform::IconHandle Lights(int index) const {
+        return reinterpret_cast<platform::IconHandle>(lights_[static_cast<std::size_t>(index)].large);
+    }
     HWND Hwnd() const { return hwnd_; }
+    UINT Dpi() const { return dpi_; }
 
     // The registered "TaskbarCreated" message.
     UINT TaskbarCreatedMessage() const { return taskbarCreated_; }
 
 private:
+    struct IconPair {
+        HICON large = nullptr;
+        HICON small = nullptr;
+    };
     static LRESULT CALLBACK WindowProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
-    static LRESULT CALLBACK SwitchProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
     LRESULT HandleMessage(UINT message, WPARAM wParam, LPARAM lParam);
 
     HWND hwnd_ = nullptr;
+    bool destroying_ = false;
+    UINT dpi_ = 96;
+    HFONT font_ = nullptr;
     HICON icon_ = nullptr;
+    std::array<IconPair, 3> lights_{};
     UINT taskbarCreated_ = 0;
     MainWindowHandlers handlers_;
-    StandInSwitch btnOnOff_;
+    XPButtonWindow onOff_;
+    XPSwitch switch_{onOff_};
+    std::array<std::unique_ptr<Win32Frame>, 2> uf_;
+    std::array<std::unique_ptr<Win32Label>, 2> l_;
+    std::array<std::unique_ptr<Win32Button>, 5> btnO_;
     Win32Timer tmr_{1};
     Win32Timer timer_{2};
 };

@@ -30,6 +30,25 @@ bool Win32WindowManager::SetWindowPos(platform::WindowHandle window, platform::W
 std::int32_t Win32WindowManager::ScreenWidth() const { return ::GetSystemMetrics(SM_CXSCREEN); }
 std::int32_t Win32WindowManager::ScreenHeight() const { return ::GetSystemMetrics(SM_CYSCREEN); }
 
+bool Win32WindowManager::DeleteSystemMenuCommand(platform::WindowHandle window, std::uint32_t command) {
+    HMENU menu = ::GetSystemMenu(reinterpret_cast<HWND>(window), FALSE);
+    return menu != nullptr && ::DeleteMenu(menu, command, MF_BYCOMMAND) != FALSE;
+}
+
+std::intptr_t Win32Shell::Execute(platform::WindowHandle owner, const std::string& operation,
+                                       const std::string& file, const std::string& parameters,
+                                       const std::string& directory, std::int32_t show) {
+    HINSTANCE result = ::ShellExecuteA(reinterpret_cast<HWND>(owner), operation.c_str(), file.c_str(),
+                                       parameters.empty() ? nullptr : parameters.c_str(),
+                                       directory.empty() ? nullptr : directory.c_str(), show);
+    return reinterpret_cast<std::intptr_t>(result);
+}
+
+void Win32Shell::ShowMessage(platform::WindowHandle owner, const std::string& text, const std::string& title,
+                            std::uint32_t style) {
+    ::MessageBoxA(reinterpret_cast<HWND>(owner), text.c_str(), title.c_str(), style);
+}
+
 Win32MessagePump::Win32MessagePump() {
     LARGE_INTEGER frequency;
     ::QueryPerformanceFrequency(&frequency);

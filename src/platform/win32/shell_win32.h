@@ -3,6 +3,7 @@
 
 #include <windows.h>
 
+#include "platform/shell.h"
 #include "platform/tray.h"
 #include "platform/window.h"
 #include "platform/win32/unique_handle.h"
@@ -21,6 +22,17 @@ public:
                       std::int32_t cx, std::int32_t cy, std::uint32_t flags) override;
     std::int32_t ScreenWidth() const override;
     std::int32_t ScreenHeight() const override;
+    bool DeleteSystemMenuCommand(platform::WindowHandle window, std::uint32_t command) override;
+};
+
+// ShellExecuteA and MessageBoxA.
+class Win32Shell : public platform::Shell {
+public:
+    std::intptr_t Execute(platform::WindowHandle owner, const std::string& operation, const std::string& file,
+                               const std::string& parameters, const std::string& directory,
+                               std::int32_t show) override;
+    void ShowMessage(platform::WindowHandle owner, const std::string& text, const std::string& title,
+                    std::uint32_t style) override;
 };
 
 // Runs the messages waiting on this thread. WM_QUIT is put back for the main loop and ends all
