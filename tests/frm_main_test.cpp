@@ -67,7 +67,9 @@ public:
     void EndProgram() override {
         ++ends;
         events.push_back("End");
+        if (onEnd) onEnd();
     }
+    std::function<void()> onEnd;
     std::vector<std::pair<platform::WindowHandle, int>> options;
     std::function<void()> onOptions;
     int ends = 0;
@@ -167,14 +169,17 @@ TEST(FrmMainUnload, ExitRemovesTheIconStopsBothTimersThenEndsOnce) {
     rig.Start();
     ASSERT_TRUE(rig.tmr.enabled);
     ASSERT_TRUE(rig.timer.enabled);
-    bool endedWithTimersStopped = false;
+    // What has happened by the time the program is asked to end.
+    bool timersStoppedAtEnd = false;
     std::size_t deletesAtEnd = 0;
+    rig.application.onEnd = [&] {
+        timersStoppedAtEnd = !rig.tmr.enabled && !rig.timer.enabled;
+        deletesAtEnd = rig.TrayCalls(platform::kNimDelete);
+    };
     rig.events.clear();
     rig.btnO[kBtnExit].UserClick();
     EXPECT_EQ(rig.application.ends, 1);
-    endedWithTimersStopped = !rig.tmr.enabled && !rig.timer.enabled;
-    deletesAtEnd = rig.TrayCalls(platform::kNimDelete);
-    EXPECT_TRUE(endedWithTimersStopped);
+    EXPECT_TRUE(timersStoppedAtEnd);
     EXPECT_EQ(deletesAtEnd, 1u);
     EXPECT_EQ(rig.tray.calls.back().message, platform::kNimDelete);
     EXPECT_EQ(rig.events, std::vector<std::string>{"End"});
@@ -216,7 +221,8 @@ TEST(FrmMainResize, MinimisingGoesToTheTrayAndEveryResizeDropsTheSizeCommand) {
     rig.frm.state = platform::WindowState::Minimized;
     rig.form.Resize();
     ASSERT_EQ(rig.TrayCalls(platform::kNimAdd), adds + 1);
-    const auto& add = rig.tray.calls.back().message == platform::kNimAdd ? rig.tray.calls.back() : rig.tray.calls[0];
+    const auto& add = rig.tray.calls.back();
+    ASSERT_EQ(add.message, platform::kNimAdd);
     EXPECT_EQ(add.data.tip, "Vantorel");
     EXPECT_EQ(add.data.icon, rig.frm.icon);
     EXPECT_EQ(add.data.callbackMessage, 512u);

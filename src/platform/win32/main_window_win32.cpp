@@ -141,8 +141,12 @@ bool MainWindow::Create(HINSTANCE instance) {
         auto index = static_cast<std::size_t>(i);
         uf_[index] = std::make_unique<Win32Frame>(hwnd, kUfCaptions[i], kUfRects[i], dpi_, font_);
         HWND panel = uf_[index]->hwnd();
-        l_[static_cast<std::size_t>(1 - i)] =
-            std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_);
+        auto& label = l_[static_cast<std::size_t>(1 - i)];
+        label = std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_);
+        // One line of the design's height: a text wider than its label ends in an ellipsis instead
+        // of wrapping into a second line that is cut in half.
+        LONG_PTR style = ::GetWindowLongPtrA(label->hwnd(), GWL_STYLE);
+        ::SetWindowLongPtrA(label->hwnd(), GWL_STYLE, (style & ~LONG_PTR{SS_TYPEMASK}) | SS_LEFTNOWORDWRAP | SS_ENDELLIPSIS);
         const int buttonIndex = i == 1 ? 4 : 3;
         btnO_[static_cast<std::size_t>(buttonIndex)] =
             std::make_unique<Win32Button>(panel, kBtnOCaptions[buttonIndex], kPanelButtonRect, dpi_, font_);
