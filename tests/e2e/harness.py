@@ -110,6 +110,10 @@ class Session:
         """A real left click at screen coordinates of the Wine desktop."""
         subprocess.run(["xdotool", "mousemove", str(x), str(y), "click", "1"], env=self.env, check=False)
 
+    def move(self, x, y):
+        """Moves the real pointer to screen coordinates of the Wine desktop."""
+        subprocess.run(["xdotool", "mousemove", str(x), str(y)], env=self.env, check=False)
+
     def key(self, *keys):
         subprocess.run(["xdotool", "key", *keys], env=self.env, check=False)
 
