@@ -198,6 +198,37 @@ class MainWindow(unittest.TestCase):
         self.assertIn("Hidden in the tray", SESSION.program_output())
 
 
+    def test_the_layout_scales_with_the_screen_density(self):
+        """At 144 DPI (150 %) the declared DPI awareness gives the design's twips at 10 per pixel."""
+        desktop = r"HKEY_CURRENT_USER\Control Panel\Desktop"
+        harness._run(["wine", "reg", "add", desktop, "/v", "LogPixels", "/t", "REG_DWORD", "/d", "144", "/f"],
+                     SESSION.env)
+        SESSION.close_program()  # the density is read when the Wine session starts
+        try:
+            self.start()
+            window = self.main_window()
+            self.assertIsNotNone(window)
+
+            def size(c):
+                return c.rect[2] - c.rect[0], c.rect[3] - c.rect[1]
+
+            def px(twips):
+                return (twips * 144 + 720) // 1440
+
+            switch = self.control(window, lambda c: c.cls == "KirelXPButton")
+            self.assertEqual(size(switch), (px(2415), px(4095)))
+            controls = SESSION.controls(window)
+            row = [c for c in controls if c.caption in ("&Tray", "&Exit", "&Help")]
+            self.assertEqual([size(c) for c in row], [(px(2055), px(495))] * 3, controls)
+            exit_button = self.control(window, lambda c: c.caption == "&Exit")
+            self.assertEqual(exit_button.rect[0] - switch.rect[0], px(4800) - px(120))
+            time.sleep(1.2)
+            SESSION.screenshot(os.path.join(ARTIFACTS, "main-window-150.png"))
+        finally:
+            harness._run(["wine", "reg", "delete", desktop, "/v", "LogPixels", "/f"], SESSION.env)
+            SESSION.close_program()
+
+
 if __name__ == "__main__":
     BUILD = os.path.abspath(sys.argv.pop(1))
     ARTIFACTS = os.path.dirname(BUILD)
