@@ -50,6 +50,9 @@ class FrmMain {
 public:
     // Wires the buttons' clicks to BtnOClick.
     FrmMain(FrmMainPlatform platform, FrmMainControls controls, std::string programFolder);
+    // The controls' handlers hold on to this object.
+    FrmMain(const FrmMain&) = delete;
+    FrmMain& operator=(const FrmMain&) = delete;
 
     // Start-up: false when another instance runs (the caller then ends, having shown nothing).
     bool Initialize() { return guard_.Initialize(); }
