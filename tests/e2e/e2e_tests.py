@@ -9,6 +9,7 @@ settings with `wine reg`. One Wine prefix and display serve the whole run.
 """
 import os
 import shutil
+import socket
 import sys
 import tempfile
 import time
@@ -227,6 +228,51 @@ class MainWindow(unittest.TestCase):
         finally:
             harness._run(["wine", "reg", "delete", desktop, "/v", "LogPixels", "/f"], SESSION.env)
             SESSION.close_program()
+
+
+    def test_a_second_instance_exits_silently(self):
+        self.start()
+        SESSION.reg_add(HKCU_KEY, "State", "1")  # a second start that read it would write it back
+        code, said = SESSION.run(self.folder.exe)
+        self.assertEqual((code, said), (0, ""), "ends at once, saying nothing")
+        time.sleep(1)
+        self.assertEqual(len([w for w in SESSION.windows() if is_main(w)]), 1, "no second window")
+        self.assertEqual(SESSION.reg_query(HKCU_KEY, "State"), "1")
+
+    def test_the_access_key_of_a_button_works(self):
+        self.start()
+        window = self.main_window()
+        SESSION.click(window.rect[0] + 100, window.rect[1] + 10)  # activate it by its title bar
+        time.sleep(0.5)
+        SESSION.key("alt+t")
+        self.assertIsNotNone(SESSION.find(lambda w: is_main(w) and not w.visible, timeout=10),
+                             "Alt+T presses \"&Tray\"")
+
+    def test_a_listed_loopback_connection_makes_the_count_grow(self):
+        """127.0.0.2 is listed (key 33554559). Under Wine SetTcpEntry is a stub that answers success
+        and closes nothing, so every sweep counts the connection again."""
+        self.folder.remove()
+        self.folder = ProgramFolder(definitions=b"-939524086\r\n33554559")
+        SESSION.reg_add(HKCU_KEY, "State", "1")
+        listener = socket.socket()
+        listener.bind(("127.0.0.2", 0))
+        listener.listen(1)
+        client = socket.create_connection(listener.getsockname())
+        server, _ = listener.accept()
+        try:
+            self.start()
+
+            def count():
+                w = SESSION.find(is_main, timeout=5)
+                return int(w.caption.split()[2]) if w is not None else 0
+
+            first = wait_for(count, 20)
+            self.assertGreater(first, 0, "the connection is counted")
+            self.assertTrue(wait_for(lambda: count() > first, 20), "and the count keeps growing")
+            self.assertGreater(int(SESSION.reg_query(HKCU_KEY, "Attempts")), 0)
+        finally:
+            for s in (client, server, listener):
+                s.close()
 
 
 if __name__ == "__main__":
