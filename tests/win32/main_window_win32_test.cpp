@@ -1,0 +1,198 @@
+// FrmMain's Win32 window under Wine on a virtual display, with the program's own resources linked
+// in: the icons as compiled (padlock 48 x 48 in 24-bit colour, bulbs 32 x 32 and 16 x 16 in 16
+// colours), the version resource, the layout in twips at the window's DPI, the switch's design, and
+// the window logic on the real window (the size command leaves the system menu, the status light
+// changes the window's real icon, "&Tray" hides it, Unload ends the message loop).
+#include <windows.h>
+
+#include <gtest/gtest.h>
+
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "fakes/fake_files.h"
+#include "fakes/fake_guard_platform.h"
+#include "guard/attempts.h"
+#include "platform/win32/connection_table_win32.h"
+#include "platform/win32/main_window_win32.h"
+#include "platform/win32/registry_win32.h"
+#include "platform/win32/resource_ids.h"
+#include "platform/win32/shell_win32.h"
+#include "ui/main/frm_main.h"
+#include "version.h"
+
+namespace vantorel {
+namespace {
+
+using namespace vantorel::testing;
+
+#pragma pack(push, 2)
+struct GroupIconEntry {
+    BYTE width, height, colourCount, reserved;
+    WORD planes, bitCount;
+    DWORD bytes;
+    WORD id;
+};
+#pragma pack(pop)
+
+// The entries of an icon group resource: (width, height, bits per pixel).
+std::vector<std::vector<int>> IconGroup(int id) {
+    HRSRC found = ::FindResourceA(nullptr, MAKEINTRESOURCEA(id), MAKEINTRESOURCEA(14) /* RT_GROUP_ICON */);
+    if (found == nullptr) return {};
+    const auto* data = static_cast<const BYTE*>(::LockResource(::LoadResource(nullptr, found)));
+    WORD count = 0;
+    std::memcpy(&count, data + 4, 2);
+    std::vector<std::vector<int>> entries;
+    for (WORD i = 0; i < count; ++i) {
+        GroupIconEntry entry;
+        std::memcpy(&entry, data + 6 + i * sizeof entry, sizeof entry);
+        entries.push_back({entry.width == 0 ? 256 : entry.width, entry.height == 0 ? 256 : entry.height, entry.bitCount});
+    }
+    return entries;
+}
+
+TEST(ResourcesWin32, IconsAndVersionAsCompiledIn) {
+    using Entries = std::vector<std::vector<int>>;
+    EXPECT_EQ(IconGroup(IDI_PADLOCK), (Entries{{48, 48, 24}}));
+    EXPECT_EQ(IconGroup(IDI_BULB_DARK), (Entries{{32, 32, 4}, {16, 16, 4}}));
+    EXPECT_EQ(IconGroup(IDI_BULB_LIT), (Entries{{32, 32, 4}, {16, 16, 4}}));
+
+    char path[MAX_PATH];
+    ::GetModuleFileNameA(nullptr, path, sizeof path);
+    DWORD ignored = 0;
+    DWORD size = ::GetFileVersionInfoSizeA(path, &ignored);
+    ASSERT_GT(size, 0u);
+    std::vector<char> info(size);
+    ASSERT_TRUE(::GetFileVersionInfoA(path, 0, size, info.data()));
+    VS_FIXEDFILEINFO* fixed = nullptr;
+    UINT length = 0;
+    ASSERT_TRUE(::VerQueryValueA(info.data(), "\\", reinterpret_cast<void**>(&fixed), &length));
+    EXPECT_EQ(HIWORD(fixed->dwFileVersionMS), static_cast<WORD>(kVersionMajor));
+    EXPECT_EQ(LOWORD(fixed->dwFileVersionMS), static_cast<WORD>(kVersionMinor));
+}
+
+class RecordingApplication final : public platform::Application {
+public:
+    void ShowOptionsModal(platform::WindowHandle, int frameIndex) override { frames.push_back(frameIndex); }
+    void EndProgram() override {
+        ++ends;
+        if (window != nullptr) window->Destroy();
+    }
+    std::vector<int> frames;
+    int ends = 0;
+    win32::MainWindow* window = nullptr;
+};
+
+RECT ChildRect(HWND child, HWND relativeTo) {
+    RECT r;
+    ::GetWindowRect(child, &r);
+    ::MapWindowPoints(nullptr, relativeTo, reinterpret_cast<POINT*>(&r), 2);
+    return r;
+}
+
+TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
+    win32::MainWindow window;
+    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
+    const UINT dpi = window.Dpi();
+    HWND hwnd = window.Hwnd();
+
+    // The client area and the controls where the design puts them, at this DPI.
+    RECT client;
+    ::GetClientRect(hwnd, &client);
+    EXPECT_EQ(client.right, ::MulDiv(9120, static_cast<int>(dpi), 1440));
+    EXPECT_EQ(client.bottom, ::MulDiv(4335, static_cast<int>(dpi), 1440));
+    RECT onOff = ChildRect(window.BtnOnOff().Handle(), hwnd);
+    EXPECT_EQ(onOff.left, ::MulDiv(120, static_cast<int>(dpi), 1440));
+    EXPECT_EQ(onOff.bottom - onOff.top, ::MulDiv(4095, static_cast<int>(dpi), 1440));
+    RECT options = ChildRect(window.BtnO(kBtnOptions).hwnd(), hwnd);
+    RECT panel = ChildRect(window.Uf(1).hwnd(), hwnd);
+    EXPECT_EQ(options.left - panel.left, ::MulDiv(2400, static_cast<int>(dpi), 1440)) << "placed on its panel";
+    EXPECT_EQ(window.Uf(1).Caption(), "Options");
+    EXPECT_EQ(window.Uf(0).Caption(), "Update");
+    EXPECT_EQ(window.BtnO(kBtnExit).Caption(), "&Exit");
+
+    // The switch: a KirelXPButton in check-box behaviour, read from the window's design.
+    char className[64] = {};
+    ::GetClassNameA(window.BtnOnOff().Handle(), className, sizeof className);
+    EXPECT_STREQ(className, "KirelXPButton");
+    EXPECT_TRUE(window.BtnOnOffWindow().button().CheckBoxBehaviour());
+    EXPECT_EQ(window.BtnOnOffWindow().button().Font().name, "Verdana");
+    EXPECT_EQ(window.BtnOnOff().Caption(), "OFF");
+
+    // The three lights are different icons; the design icon is the padlock.
+    EXPECT_NE(window.Lights(0), 0);
+    EXPECT_NE(window.Lights(0), window.Lights(1));
+    EXPECT_NE(window.Lights(1), window.Lights(2));
+    EXPECT_EQ(window.Icon(), window.Lights(kLightPadlock));
+
+    // The window logic on it, with the real registry, tray and window manager.
+    ::RegDeleteKeyA(HKEY_CURRENT_USER, "SOFTWARE\\Vantorel");
+    ::RegDeleteKeyA(HKEY_LOCAL_MACHINE, "SOFTWARE\\Vantorel");
+    win32::Win32Registry registry;
+    FakeFiles files;
+    files.Put("C:\\vt\\sw2.def", "67305985");
+    win32::Win32ConnectionTable table;
+    win32::Win32NotifyArea tray;
+    win32::Win32WindowManager windows;
+    win32::Win32MessagePump pump;
+    FakeInstance instance;
+    win32::Win32Shell shell;
+    RecordingApplication application;
+    application.window = &window;
+    FrmMain form(FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, instance}, shell,
+                                 application},
+                 FrmMainControls{window,
+                                 window.BtnOnOff(),
+                                 window.Tmr(),
+                                 window.Timer(),
+                                 {&window.BtnO(0), &window.BtnO(1), &window.BtnO(2), &window.BtnO(3), &window.BtnO(4)},
+                                 {&window.Uf(0), &window.Uf(1)},
+                                 {&window.L(0), &window.L(1)},
+                                 {window.Lights(0), window.Lights(1), window.Lights(2)}},
+                 "C:\\vt");
+    win32::MainWindowHandlers handlers;
+    handlers.resize = [&] { form.Resize(); };
+    handlers.close = [&] { form.QueryUnload(); };
+    handlers.unload = [&] { form.Unload(); };
+    window.SetHandlers(handlers);
+    ASSERT_TRUE(form.Initialize());
+    form.Load();
+    ASSERT_TRUE(window.Visible());
+
+    HMENU menu = ::GetSystemMenu(hwnd, FALSE);
+    ::SendMessageA(hwnd, WM_SIZE, SIZE_RESTORED, MAKELPARAM(client.right, client.bottom));
+    EXPECT_EQ(::GetMenuState(menu, SC_SIZE, MF_BYCOMMAND), static_cast<UINT>(-1)) << "no size command";
+    EXPECT_NE(::GetMenuState(menu, SC_CLOSE, MF_BYCOMMAND), static_cast<UINT>(-1));
+
+    // The status light is the window's real icon, big and small.
+    form.TimerTick();
+    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), window.Lights(kLightBright));
+    EXPECT_NE(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0), 0);
+    form.TimerTick();
+    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), window.Lights(kLightDark));
+
+    // Real clicks on the Win32 buttons reach the handler by index.
+    ::SendMessageA(window.BtnO(kBtnUpdates).hwnd(), BM_CLICK, 0, 0);
+    ::SendMessageA(window.BtnO(kBtnOptions).hwnd(), BM_CLICK, 0, 0);
+    EXPECT_EQ(application.frames, (std::vector<int>{1, 0}));
+    ::SendMessageA(window.BtnO(kBtnTray).hwnd(), BM_CLICK, 0, 0);
+    EXPECT_FALSE(window.Visible());
+
+    // Minimised: the window goes to the tray and stays hidden.
+    window.SetVisible(true);
+    ::ShowWindow(hwnd, SW_MINIMIZE);
+    pump.PumpMessages();
+    EXPECT_FALSE(window.Visible()) << "minimising ends hidden";
+
+    // The close request: tray icon gone, timers stopped, the window destroyed once.
+    ::SendMessageA(hwnd, WM_CLOSE, 0, 0);
+    EXPECT_EQ(application.ends, 1);
+    EXPECT_FALSE(window.Timer().Enabled());
+    EXPECT_EQ(window.Hwnd(), nullptr);
+    MSG quit;
+    EXPECT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE)) << "the message loop is told to end";
+}
+
+}  // namespace
+}  // namespace vantorel
