@@ -170,6 +170,23 @@ TEST(UpdateCheck, ProgramDownloadErrorsHaveTheirOwnMessage) {
     EXPECT_EQ(rig.disk.files.count(kFolder + "\\VTSetup.exe"), 0u);
 }
 
+// A definitions answer that does not say its size cannot be told from a cut one: the check reports
+// an error instead of "Complete", keeps the installed files and so tries again next time.
+TEST(UpdateCheck, DefinitionsWithoutASizeAreNotReportedComplete) {
+    Rig rig;
+    rig.server.PutFile(kServer + "/vt/defver", "21");
+    rig.server.responses[kServer + "/vt/sw2.def"] = {"HTTP/1.1 200 OK\r\nConnection: close\r\n\r\n",
+                                                      std::string(3000, 'd')};
+    rig.Click();
+    EXPECT_EQ(rig.frame.log,
+              (Log{"disable",
+                   "msgbox[Updates]:Error downloading definition updates Error: Missing size (the server did not say "
+                   "how long the file is) occurred.",
+                   "L1:Program Updates: No Updates", "enable"}));
+    EXPECT_EQ(rig.File("sw2.def"), "old definitions");
+    EXPECT_EQ(rig.File("defver"), "20\r\n") << "the version stays, so the next check fetches the file again";
+}
+
 // The window closes while a download runs: the check stops there and touches the window no more
 // (no caption, no message box, no button), nothing further is fetched and the installed files stay.
 TEST(UpdateCheck, ClosingTheWindowStopsTheCheckWithoutTouchingTheWindow) {

@@ -295,7 +295,8 @@ TEST_F(OptionsUpdatesTest, ClosingTheWindowDuringADownloadLeavesTheInstalledFile
         EXPECT_EQ(window.hwnd(), nullptr);
     }
     EXPECT_TRUE(returned) << "the check returned after the window closed";
-    EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
+    const std::string installed = Local("sw2.def");
+    EXPECT_TRUE(installed == "installed definitions\r\n") << "sw2.def holds " << installed.size() << " bytes";
     EXPECT_EQ(Local("defver"), "20\r\n");
     EXPECT_EQ(::GetFileAttributesA((folder_ + "\\sw2.def.part").c_str()), INVALID_FILE_ATTRIBUTES);
     EXPECT_EQ(::GetFileAttributesA((folder_ + "\\VTSetup.exe").c_str()), INVALID_FILE_ATTRIBUTES);
