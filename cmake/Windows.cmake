@@ -145,7 +145,14 @@ set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
 
 vantorel_wine_test(update_check_win32_tests tests/win32/update_check_win32_test.cpp)
 set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
-    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1")
+    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1"
+    RESOURCE_LOCK nginx_www)
+
+# The real options window's updates panel against the same nginx.
+vantorel_wine_test(options_updates_win32_tests tests/win32/options_updates_win32_test.cpp)
+set_tests_properties(options_updates_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
+    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1"
+    RESOURCE_LOCK nginx_www)
 
 # The per-row yield's cost, run by hand under Wine (not a test).
 add_executable(pump_bench bench/win32/pump_bench.cpp)

@@ -125,16 +125,31 @@ TEST(FileDownloader, RefusedRequestsReportTheirMessageAndLeaveTheInstalledFileAl
     }
 }
 
-TEST(FileDownloader, NoAnnouncedSizeCountsAsCompleteWithoutWritingAnything) {
-    for (const char* fields : {"", "Content-Length: 0\r\n", "Content-Length: abc\r\n"}) {
+TEST(FileDownloader, AnswerWithoutAUsableSizeIsRefusedNotCountedAsComplete) {
+    // Without a size a cut transfer cannot be told from a whole one: "Complete" with nothing
+    // written would report a failure as a success.
+    const std::pair<const char*, const char*> cases[] = {
+        {"", "error:Error: Missing size (the server did not say how long the file is) occurred."},
+        {"Content-Length: abc\r\n", "error:Error: Invalid size (the server announced \"abc\" bytes) occurred."},
+        {"Content-Length: \r\n", "error:Error: Missing size (the server did not say how long the file is) occurred."},
+    };
+    for (const auto& [fields, message] : cases) {
         SCOPED_TRACE(fields);
         Rig rig;
         rig.inet.Respond("HTTP/1.1 200 OK", fields, 3000);
-        EXPECT_TRUE(rig.Run());
-        EXPECT_EQ(rig.Without("event:"), (Events{"complete"}));
+        EXPECT_FALSE(rig.Run());
+        EXPECT_EQ(rig.Without("event:"), (Events{message}));
         EXPECT_EQ(rig.disk.files, (std::map<std::string, std::string>{{kDest, kOld}}));
         EXPECT_EQ(rig.inet.chunkCalls, 0);
+        EXPECT_EQ(rig.inet.cancels, 1);
     }
+
+    // An announced size of 0 is an empty file: complete at once, nothing written.
+    Rig empty;
+    empty.inet.Respond("HTTP/1.1 200 OK", "Content-Length: 0\r\n", 0);
+    EXPECT_TRUE(empty.Run());
+    EXPECT_EQ(empty.Without("event:"), (Events{"complete"}));
+    EXPECT_EQ(empty.disk.files, (std::map<std::string, std::string>{{kDest, kOld}}));
 }
 
 TEST(FileDownloader, ConnectionResetAfterThreeChunksKeepsTheOldFileAndLeavesNothingBehind) {

@@ -170,6 +170,57 @@ TEST(UpdateCheck, ProgramDownloadErrorsHaveTheirOwnMessage) {
     EXPECT_EQ(rig.disk.files.count(kFolder + "\\VTSetup.exe"), 0u);
 }
 
+// A definitions answer that does not say its size cannot be told from a cut one: the check reports
+// an error instead of "Complete", keeps the installed files and so tries again next time.
+TEST(UpdateCheck, DefinitionsWithoutASizeAreNotReportedComplete) {
+    Rig rig;
+    rig.server.PutFile(kServer + "/vt/defver", "21");
+    rig.server.responses[kServer + "/vt/sw2.def"] = {"HTTP/1.1 200 OK\r\nConnection: close\r\n\r\n",
+                                                      std::string(3000, 'd')};
+    rig.Click();
+    EXPECT_EQ(rig.frame.log,
+              (Log{"disable",
+                   "msgbox[Updates]:Error downloading definition updates Error: Missing size (the server did not say "
+                   "how long the file is) occurred.",
+                   "L1:Program Updates: No Updates", "enable"}));
+    EXPECT_EQ(rig.File("sw2.def"), "old definitions");
+    EXPECT_EQ(rig.File("defver"), "20\r\n") << "the version stays, so the next check fetches the file again";
+}
+
+// The window closes while a download runs: the check stops there and touches the window no more
+// (no caption, no message box, no button), nothing further is fetched and the installed files stay.
+TEST(UpdateCheck, ClosingTheWindowStopsTheCheckWithoutTouchingTheWindow) {
+    for (const std::string stage : {"sw2.def", "VTSetup.exe"}) {
+        Rig rig;
+        rig.server.PutFile(kServer + "/vt/defver", stage == "sw2.def" ? "21" : "20");
+        rig.server.PutFile(kServer + "/vt/sw2.def", std::string(5000, 'd'));
+        rig.server.PutFile(kServer + "/vt/mainver", "2");
+        rig.server.PutFile(kServer + "/vt/VTSetup.exe", std::string(5000, 's'));
+        UpdateCheck check(rig.frame, rig.inet, rig.pump, rig.disk, rig.FD1, rig.FD2, rig.FD3, kFolder, rig.version,
+                          kServer);
+        check.ConnectEvents();
+        std::size_t painted = 0;
+        rig.pump.onPump = [&](int) {
+            // The second chunk of the download has been painted: the user closes the window.
+            if (rig.frame.box.printed.size() == 2 && painted == 0) {
+                painted = rig.frame.box.printed.size();
+                check.Cancel();
+            }
+        };
+        check.BtnUpdate_Click();
+        EXPECT_EQ(painted, 2u) << stage;
+        EXPECT_EQ(rig.frame.box.printed.size(), painted) << stage << ": nothing painted after the close";
+        EXPECT_EQ(rig.frame.log, (stage == "sw2.def" ? Log{"disable"} : Log{"disable", "L0:Definitions Updates: No Updates"}))
+            << stage << ": the button stays as it was and no message box appears";
+        const std::string last = rig.server.requests.back();
+        EXPECT_EQ(last, kServer + "/vt/" + stage) << "nothing fetched after the close";
+        EXPECT_EQ(rig.File("sw2.def"), "old definitions");
+        EXPECT_EQ(rig.File("defver"), "20\r\n");
+        EXPECT_EQ(rig.disk.files.count(kFolder + "\\VTSetup.exe"), 0u);
+        EXPECT_EQ(rig.disk.files.count(kFolder + "\\" + stage + ".part"), 0u) << "the partial file is removed";
+    }
+}
+
 TEST(ServerAddress, IsASettingWithABuiltInDefault) {
     testing::FakeRegistry registry;
     EXPECT_EQ(ServerAddress(registry), kDefaultServerAddress);

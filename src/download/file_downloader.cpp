@@ -18,6 +18,15 @@ std::string SplitPath(const std::string& path, bool wantFile, bool isAddress) {
     return wantFile ? path.substr(last + 1) : path.substr(0, last + 1);
 }
 
+// True when `text` opens (after blanks) with a number: a size field that says something.
+bool HoldsNumber(const std::string& text) {
+    std::size_t i = text.find_first_not_of(" \t");
+    if (i == std::string::npos) return false;
+    if (text[i] == '+' || text[i] == '-') ++i;
+    if (i < text.size() && text[i] == '.') ++i;
+    return i < text.size() && text[i] >= '0' && text[i] <= '9';
+}
+
 std::string WithTrailingBackslash(const std::string& path) {
     return !path.empty() && path.back() == '\\' ? path : path + "\\";
 }
@@ -81,6 +90,13 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
     std::string length;
     if (!Inet_.GetHeader("Content-Length", length, error)) {
         RequestError(error.description);
+        return false;
+    }
+    // Without a size there is no telling a whole file from a cut one: such an answer is refused
+    // rather than counted as complete with nothing written.
+    if (!HoldsNumber(length)) {
+        RequestError(length.empty() ? "Missing size (the server did not say how long the file is)"
+                                    : "Invalid size (the server announced \"" + length + "\" bytes)");
         return false;
     }
     std::int32_t size = 0;

@@ -6,7 +6,9 @@
 // bytes, each written at once, with one progress event and one message pump per chunk. The data
 // goes into a partial file beside the destination ("<destination>.part"), which takes the
 // destination's place in one step only when the whole announced body has arrived: a download that
-// fails, is refused or is cancelled leaves an existing destination exactly as it was. Every problem
+// fails, is refused or is cancelled leaves an existing destination exactly as it was. An answer
+// that does not say how long the file is (no Content-Length, or one without a number) is refused:
+// it cannot be told from a cut transfer. An announced size of 0 counts as complete at once. Every problem
 // is reported through `DownloadErrors`; nothing is thrown to the caller.
 #pragma once
 

@@ -146,10 +146,11 @@ TEST_F(WinInetDownload, ConnectionClosedAfterThreeChunksIsAResetAndLeavesNothing
 }
 
 TEST_F(WinInetDownload, MissingOrUnusableSizes) {
-    // No Content-Length: complete at once, nothing written.
-    EXPECT_TRUE(Get("/nolength/3000"));
-    EXPECT_EQ(events_, (Events{"complete"}));
+    // No Content-Length (the body ends when the server closes): refused, the old file kept.
+    EXPECT_FALSE(Get("/nolength/3000"));
+    EXPECT_EQ(events_, (Events{"error:Error: Missing size (the server did not say how long the file is) occurred."}));
     EXPECT_EQ(ReadFile(dest_), kOld);
+    EXPECT_FALSE(Exists(dest_ + ".part"));
 
     // A size beyond 32 bits, and a negative one: refused with a clear error before any data.
     for (const std::string length : {"99999999999", "-5"}) {

@@ -1,6 +1,7 @@
 // The options window on the real registry under Wine: its load step on an empty registry, its
 // boxes writing the settings Windows and Internet Explorer read, and the modal loop ending on
-// "&Close". Runs on the virtual display; the values it touches are removed afterwards.
+// "&Close"; once with queued BM_CLICKs, once with the real pointer (SendInput, hit-tested by the
+// system, pressed and released on the control). Runs on the virtual display; the values it touches are removed afterwards.
 #include <windows.h>
 
 #include <gtest/gtest.h>
@@ -8,6 +9,7 @@
 #include "platform/win32/options_window_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/registry_routines.h"
+#include "win32/ui_input.h"
 
 namespace vantorel::win32 {
 namespace {
@@ -86,6 +88,46 @@ TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
     again.ShowModal();
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kRunKey, "Vantorel"))) << "unchecking removes the autostart entry";
     EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
+}
+
+TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsWriteAndRemoveTheAutostartEntry) {
+    const std::string exe = AutostartPath();
+    OptionsWindow window(nullptr, 0, registry_, exe);
+    ASSERT_NE(window.hwnd(), nullptr) << "no display?";
+    ASSERT_FALSE(window.box(0).Value()) << "an empty registry: the program does not start with Windows";
+
+    Variant runAfterCheck, startAfterCheck, runAfterUncheck, startAfterUncheck;
+    int step = 0;
+    Ticker user(30, [&] {
+        switch (step) {
+            case 0:  // the window is up: check the box
+                if (!::IsWindowVisible(window.hwnd())) return false;
+                PointerClick(window.box(0).hwnd());
+                break;
+            case 1:  // checked: look at the registry, uncheck it
+                if (!window.box(0).Value()) return false;
+                runAfterCheck = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
+                startAfterCheck = Read(kHkeyLocalMachine, kVantorelKey, "Start");
+                PointerClick(window.box(0).hwnd());
+                break;
+            case 2:  // unchecked: look again, then "&Close"
+                if (window.box(0).Value()) return false;
+                runAfterUncheck = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
+                startAfterUncheck = Read(kHkeyLocalMachine, kVantorelKey, "Start");
+                PointerClick(window.closeButton().hwnd());
+                return true;
+        }
+        ++step;
+        return false;
+    });
+    window.ShowModal();
+    EXPECT_EQ(window.hwnd(), nullptr) << "the pointer click on \"&Close\" closed the window";
+    EXPECT_EQ(runAfterCheck, Variant(exe)) << "checking writes the running executable's path";
+    EXPECT_EQ(startAfterCheck, Variant(std::string("1")));
+    EXPECT_TRUE(IsEmpty(runAfterUncheck)) << "unchecking removes the Run value";
+    EXPECT_EQ(startAfterUncheck, Variant(std::string("0")));
+    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kVantorelKey, "Tray"))) << "the other boxes wrote nothing";
+    EXPECT_TRUE(IsEmpty(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger")));
 }
 
 }  // namespace

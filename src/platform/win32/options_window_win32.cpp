@@ -2,12 +2,15 @@
 
 #include "platform/win32/files_win32.h"
 #include "platform/win32/registry_win32.h"
+#include "settings/server_address.h"
+#include "version.h"
 
 namespace vantorel::win32 {
 
 namespace {
 
 constexpr const char* kOptionsClass = "VantorelOptions";
+constexpr const char* kPictureClass = "VantorelPictureBox";
 
 // Layout in twips.
 constexpr TwipsRect kFrameRect{120, 120, 6375, 2295};
@@ -28,6 +31,8 @@ UINT WindowDpi(HWND hwnd) {
 
 }  // namespace
 
+UpdateTarget InstalledProgram() { return {ProgramFolder(), {kVersionMajor, kVersionMinor}}; }
+
 std::string AutostartPath() {
     char module[MAX_PATH * 4] = {0};
     ::GetModuleFileNameA(nullptr, module, sizeof module);
@@ -46,10 +51,11 @@ void ShowOptionsModal(HWND owner, int frameIndex) {
 }
 
 OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& registry,
-                             const std::string& executablePath)
+                             const std::string& executablePath, const UpdateTarget& target)
     : owner_(owner) {
     HINSTANCE instance = ::GetModuleHandleA(nullptr);
     RegisterWindowClass(instance, kOptionsClass, Proc);
+    RegisterWindowClass(instance, kPictureClass, PictureProc);
     const DWORD style = WS_CAPTION | WS_SYSMENU | WS_POPUP | WS_CLIPCHILDREN;
     hwnd_ = ::CreateWindowExA(WS_EX_DLGMODALFRAME | WS_EX_CONTROLPARENT, kOptionsClass, "Options", style,
                               CW_USEDEFAULT, CW_USEDEFAULT, 100, 100, owner, nullptr, instance, this);
@@ -75,10 +81,15 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     update_ = std::make_unique<Win32Button>(frames_[1]->hwnd(), "&Check for Updates", kUpdateRect, dpi, font_);
     labels_[0] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Definitions Updates:", kLabelRects[0], dpi, font_);
     labels_[1] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Program Updates:", kLabelRects[1], dpi, font_);
+    // pb: a sunken white box whose inside shows the picture box's image.
     RECT pb = ToPixels(kProgressRect, dpi);
-    progress_ = ::CreateWindowExA(WS_EX_CLIENTEDGE, "STATIC", "", WS_CHILD | SS_WHITERECT, pb.left, pb.top,
+    pbWindow_ = ::CreateWindowExA(WS_EX_CLIENTEDGE, kPictureClass, "", WS_CHILD, pb.left, pb.top,
                                   pb.right - pb.left, pb.bottom - pb.top, frames_[1]->hwnd(), nullptr, instance,
                                   nullptr);
+    RECT inside{};
+    ::GetClientRect(pbWindow_, &inside);
+    pb_ = std::make_unique<GdiPictureBox>(inside.right, inside.bottom, pbWindow_);
+    ::SetWindowLongPtrA(pbWindow_, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(pb_.get()));
     close_ = std::make_unique<Win32Button>(hwnd_, "&Close", kCloseRect, dpi, font_);
     if (frameIndex == 1) ::SetWindowTextA(hwnd_, "Updates");
 
@@ -91,10 +102,45 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
         if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
     });
     form_->Form_Load();
+
+    check_ = std::make_unique<UpdateCheck>(*this, inet_, pump_, files_, FD1_, FD2_, FD3_, target.programFolder,
+                                           target.version, ServerAddress(registry));
+    check_->ConnectEvents();
+    update_->Click = [this] { check_->BtnUpdate_Click(); };
+}
+
+void OptionsWindow::SetBtnUpdateEnabled(bool enabled) {
+    if (hwnd_ != nullptr) update_->SetEnabled(enabled);
+}
+
+void OptionsWindow::SetLCaption(int index, const std::string& caption) {
+    if (hwnd_ != nullptr && (index == 0 || index == 1)) labels_[index]->SetCaption(caption);
+}
+
+void OptionsWindow::ShowPb() {
+    if (hwnd_ != nullptr) ::ShowWindow(pbWindow_, SW_SHOW);
+}
+
+void OptionsWindow::MsgBoxExclamation(const std::string& prompt, const std::string& title) {
+    if (hwnd_ != nullptr) ::MessageBoxA(hwnd_, prompt.c_str(), title.c_str(), MB_OK | MB_ICONEXCLAMATION);
+}
+
+LRESULT CALLBACK OptionsWindow::PictureProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_PAINT) {
+        PAINTSTRUCT paint;
+        HDC dc = ::BeginPaint(hwnd, &paint);
+        auto* picture = reinterpret_cast<GdiPictureBox*>(::GetWindowLongPtrA(hwnd, GWLP_USERDATA));
+        if (picture != nullptr) picture->Show(dc, 0, 0);
+        ::EndPaint(hwnd, &paint);
+        return 0;
+    }
+    if (message == WM_ERASEBKGND) return 1;  // the image covers the whole inside
+    return ::DefWindowProcA(hwnd, message, wParam, lParam);
 }
 
 OptionsWindow::~OptionsWindow() {
     if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
+    pbWindow_ = nullptr;
     if (font_ != nullptr) ::DeleteObject(font_);
 }
 
@@ -143,6 +189,8 @@ LRESULT CALLBACK OptionsWindow::Proc(HWND hwnd, UINT message, WPARAM wParam, LPA
             if (self != nullptr) {
                 self->closed_ = true;
                 self->hwnd_ = nullptr;
+                // A check running below this message (it pumps messages) stops at its next step.
+                if (self->check_) self->check_->Cancel();
             }
             return 0;
         default:

@@ -1,5 +1,8 @@
 // The options window on Windows: the controls of FrmOptions laid out in twips, a modal loop that
 // keeps the owner's timers running, and the window procedure that hands clicks to the controls.
+// The window is the updates panel of the update check: "&Check for Updates" runs the check with
+// the window's own downloaders FD1 to FD3 (WinINet), painting progress into the picture box pb.
+// Closing the window while a check runs stops the check at its next step.
 #pragma once
 
 #include <windows.h>
@@ -7,18 +10,36 @@
 #include <memory>
 #include <string>
 
+#include "download/file_downloader.h"
 #include "platform/registry.h"
 #include "platform/win32/controls_win32.h"
+#include "platform/win32/file_system_win32.h"
+#include "platform/win32/files_win32.h"
+#include "platform/win32/http_transfer_win32.h"
+#include "platform/win32/picture_box_win32.h"
+#include "platform/win32/shell_win32.h"
 #include "ui/options/frm_options.h"
+#include "ui/options/update_check.h"
 
 namespace vantorel::win32 {
 
-class OptionsWindow {
+// Where the update check puts what it downloads and which program version it compares.
+struct UpdateTarget {
+    std::string programFolder;  // without a trailing backslash
+    ProgramVersion version;
+};
+
+// The running program's folder and version.
+UpdateTarget InstalledProgram();
+
+class OptionsWindow final : public UpdatesFrame {
 public:
     // Creates the window (hidden) owned by `owner`, with frame `frameIndex` (0 options, 1 updates)
-    // visible; the updates frame also sets the caption "Updates". Runs the load step.
-    OptionsWindow(HWND owner, int frameIndex, platform::Registry& registry, const std::string& executablePath);
-    ~OptionsWindow();
+    // visible; the updates frame also sets the caption "Updates". Runs the load step. The update
+    // server's address is read from `registry` when the window is created.
+    OptionsWindow(HWND owner, int frameIndex, platform::Registry& registry, const std::string& executablePath,
+                  const UpdateTarget& target = InstalledProgram());
+    ~OptionsWindow() override;
     OptionsWindow(const OptionsWindow&) = delete;
     OptionsWindow& operator=(const OptionsWindow&) = delete;
 
@@ -30,9 +51,21 @@ public:
     const OptionsControls& controls() const { return controls_; }
     Win32Button& closeButton() { return *close_; }
     Win32CheckBox& box(int index) { return *boxes_[index]; }
+    Win32Button& updateButton() { return *update_; }
+    Win32Label& label(int index) { return *labels_[index]; }
+    HWND pbWindow() const { return pbWindow_; }
+    GdiPictureBox& picture() { return *pb_; }
+
+    // UpdatesFrame: what the update check does to the window.
+    void SetBtnUpdateEnabled(bool enabled) override;
+    void SetLCaption(int index, const std::string& caption) override;
+    void ShowPb() override;
+    platform::PictureBox& pb() override { return *pb_; }
+    void MsgBoxExclamation(const std::string& prompt, const std::string& title) override;
 
 private:
     static LRESULT CALLBACK Proc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
+    static LRESULT CALLBACK PictureProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
 
     HWND owner_;
     HWND hwnd_ = nullptr;
@@ -42,9 +75,19 @@ private:
     std::unique_ptr<Win32CheckBox> boxes_[3];
     std::unique_ptr<Win32Button> close_, update_;
     std::unique_ptr<Win32Label> hint_, labels_[2];
-    HWND progress_ = nullptr;  // pb: white, shown while a download runs
+    HWND pbWindow_ = nullptr;  // pb's window: hidden until a download starts
+    std::unique_ptr<GdiPictureBox> pb_;
     OptionsControls controls_;
     std::unique_ptr<FrmOptions> form_;
+
+    // The update check's transfers, downloaders and the check itself: they live while the window
+    // is loaded.
+    Win32MessagePump pump_;
+    Win32FileSystem disk_;
+    Win32Files files_;
+    WinInetTransfer inet_{pump_}, transfer1_{pump_}, transfer2_{pump_}, transfer3_{pump_};
+    FileDownloader FD1_{transfer1_, disk_, pump_}, FD2_{transfer2_, disk_, pump_}, FD3_{transfer3_, disk_, pump_};
+    std::unique_ptr<UpdateCheck> check_;
 };
 
 // What the main window's "&Updates" and "&Options" buttons (and the missing-definitions start-up)

@@ -30,11 +30,11 @@ UpdateCheck::UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, plat
 
 void UpdateCheck::ConnectEvents() {
     FD1_.DownloadErrors = [this](const std::string& strError) {
-        frame_.MsgBoxExclamation("Error downloading definition updates " + strError, kTitle);
+        if (!cancelled_) frame_.MsgBoxExclamation("Error downloading definition updates " + strError, kTitle);
     };
     FD1_.DowloadComplete = [this] { frame_.SetLCaption(0, "Definitions Updates: Complete"); };
     FD2_.DownloadErrors = [this](const std::string& strError) {
-        frame_.MsgBoxExclamation("Error downloading program updates " + strError, kTitle);
+        if (!cancelled_) frame_.MsgBoxExclamation("Error downloading program updates " + strError, kTitle);
     };
     FD2_.DowloadComplete = [this] { frame_.SetLCaption(1, "Program Updates: Complete"); };
     FD3_.DownloadErrors = nullptr;
@@ -46,6 +46,7 @@ void UpdateCheck::ConnectEvents() {
 }
 
 void UpdateCheck::Progress(const std::string& intPercent) {
+    if (cancelled_) return;
     std::int32_t percent = 0;
     if (!RoundToInt32(LeadingNumber(intPercent), percent)) return;
     percent = std::clamp<std::int32_t>(percent, -32768, 32767);
@@ -70,6 +71,7 @@ bool UpdateCheck::RemoteVersion(const std::string& path, double& version) {
     std::string text;
     platform::TransferError error;
     if (!OpenURL(Inet_, pump_, server_ + path, text, error)) {
+        if (cancelled_) return false;
         frame_.MsgBoxExclamation("Cannot check for updates: the update server " + server_ +
                                      " could not be reached.\r\r" + error.description,
                                  kTitle);
@@ -79,35 +81,47 @@ bool UpdateCheck::RemoteVersion(const std::string& path, double& version) {
     return true;
 }
 
+void UpdateCheck::Cancel() {
+    cancelled_ = true;
+    FD1_.Cancel();
+    FD2_.Cancel();
+    FD3_.Cancel();
+}
+
 void UpdateCheck::BtnUpdate_Click() {
+    cancelled_ = false;
     frame_.SetBtnUpdateEnabled(false);
 
     const double localDefinitions = LocalDefinitionsVersion();
     double remote = 0;
     if (!RemoteVersion("/vt/defver", remote)) {
-        frame_.SetBtnUpdateEnabled(true);
+        if (!cancelled_) frame_.SetBtnUpdateEnabled(true);
         return;
     }
+    if (cancelled_) return;
     if (remote <= localDefinitions) {
         frame_.SetLCaption(0, "Definitions Updates: No Updates");
     } else {
         frame_.ShowPb();
-        if (FD1_.DownloadFile(server_ + "/vt/sw2.def", folder_ + "\\sw2.def")) {
+        if (FD1_.DownloadFile(server_ + "/vt/sw2.def", folder_ + "\\sw2.def") && !cancelled_) {
             FD3_.DownloadFile(server_ + "/vt/defver", folder_ + "\\defver");
         }
+        if (cancelled_) return;
     }
 
     const double localProgram =
         LeadingNumber(std::to_string(version_.major) + "." + std::to_string(version_.minor));
     if (!RemoteVersion("/vt/mainver", remote)) {
-        frame_.SetBtnUpdateEnabled(true);
+        if (!cancelled_) frame_.SetBtnUpdateEnabled(true);
         return;
     }
+    if (cancelled_) return;
     if (remote <= localProgram) {
         frame_.SetLCaption(1, "Program Updates: No Updates");
     } else {
         frame_.ShowPb();
         FD2_.DownloadFile(server_ + "/vt/VTSetup.exe", folder_ + "\\VTSetup.exe");
+        if (cancelled_) return;
     }
 
     frame_.SetBtnUpdateEnabled(true);

@@ -55,6 +55,10 @@ public:
 
     void BtnUpdate_Click();
 
+    // The window is going away: the running check stops at its next step without touching the
+    // window again (the running download stops at its next check of its cancel flag).
+    void Cancel();
+
 private:
     double LocalDefinitionsVersion();
     // The version in the server's text file at `path`; false after reporting a request that failed
@@ -72,6 +76,7 @@ private:
     std::string folder_;
     ProgramVersion version_;
     std::string server_;
+    bool cancelled_ = false;
 };
 
 }  // namespace vantorel
