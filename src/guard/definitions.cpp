@@ -6,6 +6,10 @@
 #include <cstdlib>
 #include <cstring>
 
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
+
 namespace vantorel {
 
 DefinitionList Definitions;
@@ -265,10 +269,11 @@ std::size_t DefinitionList::BucketFor(std::int32_t key) const {
     return static_cast<std::size_t>((static_cast<unsigned __int128>(h) * buckets_.size()) >> 64);
 }
 
-DefinitionList::Slot& DefinitionList::SlotOf(std::int32_t key) {
+std::pair<std::size_t, std::size_t> DefinitionList::SlotOf(std::int32_t key) const {
     for (std::size_t b = BucketFor(key);; b = b + 1 == buckets_.size() ? 0 : b + 1) {
-        for (Slot& slot : buckets_[b].slots)
-            if (slot.positionPlusOne == 0 || slot.key == key) return slot;
+        const Bucket& bucket = buckets_[b];
+        for (std::size_t i = 0; i < kSlotsPerBucket; ++i)
+            if (bucket.positionsPlusOne[i] == 0 || bucket.keys[i] == key) return {b, i};
     }
 }
 
@@ -282,27 +287,49 @@ void DefinitionList::BuildIndex() {
             ++oddIt;
             continue;
         }
-        Slot& slot = SlotOf(values_[i]);
-        if (slot.positionPlusOne == 0) slot = Slot{values_[i], static_cast<std::uint32_t>(i + 1)};
-        else repeated.push_back(values_[i]);
+        auto [b, slot] = SlotOf(values_[i]);
+        Bucket& bucket = buckets_[b];
+        if (bucket.positionsPlusOne[slot] == 0) {
+            bucket.keys[slot] = values_[i];
+            bucket.positionsPlusOne[slot] = static_cast<std::uint32_t>(i + 1);
+        } else {
+            repeated.push_back(values_[i]);
+        }
     }
     if (sorted_ && !repeated.empty()) {
         // A key listed on several lines: the halving search stops on one of them, not always the
         // first. Record where it stops so both searches answer alike.
         char buffer[12];
-        for (std::int32_t key : repeated)
-            SlotOf(key).positionPlusOne = static_cast<std::uint32_t>(FindText(FormatKey(key, buffer)) + 1);
+        for (std::int32_t key : repeated) {
+            auto [b, slot] = SlotOf(key);
+            buckets_[b].positionsPlusOne[slot] = static_cast<std::uint32_t>(FindText(FormatKey(key, buffer)) + 1);
+        }
     }
 }
 
 std::int32_t DefinitionList::FindKey(std::int32_t key) const {
     if (buckets_.empty()) return kNoDefinition;
+#if defined(__SSE2__)
+    const __m128i wanted = _mm_set1_epi32(key);
+    const __m128i zero = _mm_setzero_si128();
     for (std::size_t b = BucketFor(key);; b = b + 1 == buckets_.size() ? 0 : b + 1) {
-        for (const Slot& slot : buckets_[b].slots) {
-            if (slot.positionPlusOne == 0) return kNoDefinition;
-            if (slot.key == key) return static_cast<std::int32_t>(slot.positionPlusOne - 1);
-        }
+        const Bucket& bucket = buckets_[b];
+        auto mask = [](__m128i equal) { return _mm_movemask_ps(_mm_castsi128_ps(equal)); };
+        const auto* keys = reinterpret_cast<const __m128i*>(bucket.keys);
+        const auto* positions = reinterpret_cast<const __m128i*>(bucket.positionsPlusOne);
+        int free = mask(_mm_cmpeq_epi32(_mm_load_si128(positions), zero)) |
+                   mask(_mm_cmpeq_epi32(_mm_load_si128(positions + 1), zero)) << 4;
+        int match = (mask(_mm_cmpeq_epi32(_mm_load_si128(keys), wanted)) |
+                     mask(_mm_cmpeq_epi32(_mm_load_si128(keys + 1), wanted)) << 4) &
+                    ~free;
+        if (match != 0) return static_cast<std::int32_t>(bucket.positionsPlusOne[__builtin_ctz(match)] - 1);
+        if (free != 0) return kNoDefinition;
     }
+#else
+    auto [b, slot] = SlotOf(key);
+    std::uint32_t positionPlusOne = buckets_[b].positionsPlusOne[slot];
+    return positionPlusOne == 0 ? kNoDefinition : static_cast<std::int32_t>(positionPlusOne - 1);
+#endif
 }
 
 std::size_t DefinitionList::MemoryBytes() const {

@@ -102,20 +102,20 @@ public:
 
 private:
     // The index: open addressing over buckets of one cache line each, filled to about three
-    // quarters. A key's bucket is picked by its hash; a full bucket spills into the next. Nearly
-    // every lookup, listed or not, reads one cache line.
-    struct Slot {
-        std::int32_t key;
-        std::uint32_t positionPlusOne;  // 0 marks an empty slot
-    };
+    // quarters. A key's bucket is picked by its hash; a full bucket spills into the next. A bucket
+    // holds eight keys and, beside them, their positions plus one (0 marks a free slot; slots fill
+    // from the left and are never freed), so one lookup compares the eight keys at once and nearly
+    // always reads a single cache line, listed key or not.
     static constexpr std::size_t kSlotsPerBucket = 8;
     struct alignas(64) Bucket {
-        Slot slots[kSlotsPerBucket];
+        std::int32_t keys[kSlotsPerBucket];
+        std::uint32_t positionsPlusOne[kSlotsPerBucket];
     };
 
     std::string_view TextAt(std::size_t position, char* buffer) const;
     std::size_t BucketFor(std::int32_t key) const;
-    Slot& SlotOf(std::int32_t key);  // the key's slot, or the empty slot where it belongs
+    // The key's slot, or the free slot where it belongs, as (bucket, index in the bucket).
+    std::pair<std::size_t, std::size_t> SlotOf(std::int32_t key) const;
     void BuildIndex();
 
     std::vector<std::int32_t> values_;                        // every line; 0 for the odd ones
