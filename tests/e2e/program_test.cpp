@@ -12,29 +12,14 @@
 #include <string>
 
 #include "platform/win32/files_win32.h"
+#include "win32/vantorel_settings.h"
 
 namespace vantorel {
 namespace {
 
-void DeleteSettings() {
-    ::RegDeleteKeyA(HKEY_CURRENT_USER, "SOFTWARE\\Vantorel");
-    ::RegDeleteKeyA(HKEY_LOCAL_MACHINE, "SOFTWARE\\Vantorel");
-}
-
-std::string ReadSetting(HKEY root, const char* name) {
-    char data[64] = {};
-    DWORD size = sizeof data;
-    if (::RegGetValueA(root, "SOFTWARE\\Vantorel", name, RRF_RT_REG_SZ, nullptr, data, &size) != ERROR_SUCCESS)
-        return "<missing>";
-    return data;
-}
-
-void WriteSetting(HKEY root, const char* name, const char* value) {
-    HKEY key = nullptr;
-    ASSERT_EQ(::RegCreateKeyExA(root, "SOFTWARE\\Vantorel", 0, nullptr, 0, KEY_WRITE, nullptr, &key, nullptr), 0);
-    ::RegSetValueExA(key, name, 0, REG_SZ, reinterpret_cast<const BYTE*>(value), static_cast<DWORD>(strlen(value) + 1));
-    ::RegCloseKey(key);
-}
+using testing::DeleteSettings;
+using testing::ReadSetting;
+using testing::WriteSetting;
 
 // A copy of vantorel.exe in a folder of its own, with its own definitions file.
 struct ProgramCopy {

@@ -15,6 +15,7 @@
 #include "guard/guard.h"
 #include "platform/win32/connection_table_win32.h"
 #include "platform/win32/files_win32.h"
+#include "win32/vantorel_settings.h"
 #include "platform/win32/main_window_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "platform/win32/shell_win32.h"
@@ -22,6 +23,10 @@
 
 namespace vantorel {
 namespace {
+
+using testing::DeleteSettings;
+using testing::ReadSetting;
+using testing::WriteSetting;
 
 using namespace vantorel::testing;
 
@@ -42,26 +47,6 @@ public:
 };
 
 bool Topmost(HWND hwnd) { return (::GetWindowLongPtrA(hwnd, GWL_EXSTYLE) & WS_EX_TOPMOST) != 0; }
-
-void DeleteSettings() {
-    ::RegDeleteKeyA(HKEY_CURRENT_USER, "SOFTWARE\\Vantorel");
-    ::RegDeleteKeyA(HKEY_LOCAL_MACHINE, "SOFTWARE\\Vantorel");
-}
-
-std::string ReadSetting(HKEY root, const char* name) {
-    char data[64] = {};
-    DWORD size = sizeof data;
-    if (::RegGetValueA(root, "SOFTWARE\\Vantorel", name, RRF_RT_REG_SZ, nullptr, data, &size) != ERROR_SUCCESS)
-        return "<missing>";
-    return data;
-}
-
-void WriteSetting(HKEY root, const char* name, const char* value) {
-    HKEY key = nullptr;
-    ASSERT_EQ(::RegCreateKeyExA(root, "SOFTWARE\\Vantorel", 0, nullptr, 0, KEY_WRITE, nullptr, &key, nullptr), 0);
-    ::RegSetValueExA(key, name, 0, REG_SZ, reinterpret_cast<const BYTE*>(value), static_cast<DWORD>(strlen(value) + 1));
-    ::RegCloseKey(key);
-}
 
 TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     win32::MainWindow window;

@@ -6,6 +6,8 @@
 // picture box pb and its pixels, the button's enabled state and the "Updates" message box.
 #include <windows.h>
 
+#include "win32/update_server.h"
+
 #include <gtest/gtest.h>
 
 #include <cstdlib>
@@ -21,16 +23,8 @@
 namespace vantorel::win32 {
 namespace {
 
-std::string ReadFile(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream content;
-    content << in.rdbuf();
-    return content.str();
-}
-
-void WriteFile(const std::string& path, const std::string& content) {
-    std::ofstream(path, std::ios::binary) << content;
-}
+using testing::ReadFile;
+using testing::WriteFile;
 
 std::string Text(HWND hwnd) {
     char text[512] = {0};
@@ -72,42 +66,9 @@ MessageBoxSeen FindMessageBox() {
     return seen;
 }
 
-class OptionsUpdatesTest : public ::testing::Test {
+class OptionsUpdatesTest : public testing::UpdateServerTest {
 protected:
-    void SetUp() override {
-        const char* dir = std::getenv("VANTOREL_NGINX_DIR");
-        ASSERT_NE(dir, nullptr) << "VANTOREL_NGINX_DIR is not set";
-        std::string port = ReadFile(std::string("Z:") + dir + "/server.port");
-        while (!port.empty() && (port.back() == '\n' || port.back() == '\r')) port.pop_back();
-        ASSERT_FALSE(port.empty()) << "nginx is not running";
-        www_ = std::string("Z:") + dir + "/www/vt/";
-        for (const char* name : {"defver", "sw2.def", "mainver", "VTSetup.exe"}) ::DeleteFileA((www_ + name).c_str());
-        SetServer("http://127.0.0.1:" + port);
-
-        char temp[MAX_PATH];
-        ::GetTempPathA(MAX_PATH, temp);
-        folder_ = std::string(temp) + "vtopt-" + std::to_string(::GetCurrentProcessId());
-        ::CreateDirectoryA(folder_.c_str(), nullptr);
-        WriteFile(folder_ + "\\defver", "20\r\n");
-        WriteFile(folder_ + "\\sw2.def", "installed definitions\r\n");
-    }
-    void TearDown() override {
-        for (const char* name : {"\\defver", "\\sw2.def", "\\VTSetup.exe"}) ::DeleteFileA((folder_ + name).c_str());
-        EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
-        RegistryRoutines reg(registry_);
-        reg.hkey(platform::kHkeyLocalMachine);
-        reg.KeyRoot("SOFTWARE\\Vantorel\\");
-        reg.DeleteValue("Server");
-    }
-    void SetServer(const std::string& address) {
-        RegistryRoutines reg(registry_);
-        reg.hkey(platform::kHkeyLocalMachine);
-        reg.KeyRoot("SOFTWARE\\Vantorel\\");
-        reg.CreateKey();
-        ASSERT_TRUE(reg.SetRegistryValue("Server", address, platform::kRegSz));
-    }
-    void Serve(const std::string& name, const std::string& content) { WriteFile(www_ + name, content); }
-    std::string Local(const std::string& name) { return ReadFile(folder_ + "\\" + name); }
+    OptionsUpdatesTest() : UpdateServerTest("vtopt-") {}
 
     // Opens the updates panel, lets `click` start the check once the modal loop runs, and closes
     // the window when the check has returned; `after` looks at the window before it closes.
@@ -132,8 +93,6 @@ protected:
         EXPECT_EQ(window.hwnd(), nullptr);
     }
 
-    Win32Registry registry_;
-    std::string www_, folder_;
     int clicks_ = 0;
 };
 

@@ -4,6 +4,8 @@
 // recording fake: the options window itself is not part of this test.
 #include <windows.h>
 
+#include "win32/update_server.h"
+
 #include <gtest/gtest.h>
 
 #include <cstdlib>
@@ -23,66 +25,24 @@
 namespace vantorel {
 namespace {
 
-std::string ReadFile(const std::string& path) {
-    std::ifstream in(path, std::ios::binary);
-    std::stringstream content;
-    content << in.rdbuf();
-    return content.str();
-}
+using testing::ReadFile;
+using testing::WriteFile;
 
-void WriteFile(const std::string& path, const std::string& content) {
-    std::ofstream(path, std::ios::binary) << content;
-}
-
-class NginxUpdateCheck : public ::testing::Test {
+class NginxUpdateCheck : public testing::UpdateServerTest {
 protected:
-    void SetUp() override {
-        const char* dir = std::getenv("VANTOREL_NGINX_DIR");
-        ASSERT_NE(dir, nullptr) << "VANTOREL_NGINX_DIR is not set";
-        std::string port = ReadFile(std::string("Z:") + dir + "/server.port");
-        while (!port.empty() && (port.back() == '\n' || port.back() == '\r')) port.pop_back();
-        ASSERT_FALSE(port.empty()) << "nginx is not running";
-        www_ = std::string("Z:") + dir + "/www/vt/";
-        for (const char* name : {"defver", "sw2.def", "mainver", "VTSetup.exe"}) ::DeleteFileA((www_ + name).c_str());
-
-        // The address goes through the setting, as the program reads it.
-        RegistryRoutines reg(registry_);
-        reg.hkey(platform::kHkeyLocalMachine);
-        reg.KeyRoot("SOFTWARE\\Vantorel\\");
-        reg.CreateKey();
-        ASSERT_TRUE(reg.SetRegistryValue("Server", std::string("http://127.0.0.1:" + port + "/"), platform::kRegSz));
-
-        char temp[MAX_PATH];
-        ::GetTempPathA(MAX_PATH, temp);
-        folder_ = std::string(temp) + "vtupd-" + std::to_string(::GetCurrentProcessId());
-        ::CreateDirectoryA(folder_.c_str(), nullptr);
-        WriteFile(folder_ + "\\defver", "20\r\n");
-        WriteFile(folder_ + "\\sw2.def", "installed definitions\r\n");
-    }
-    void TearDown() override {
-        for (const char* name : {"\\defver", "\\sw2.def", "\\VTSetup.exe"}) ::DeleteFileA((folder_ + name).c_str());
-        EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
-        RegistryRoutines reg(registry_);
-        reg.hkey(platform::kHkeyLocalMachine);
-        reg.KeyRoot("SOFTWARE\\Vantorel\\");
-        reg.DeleteValue("Server");
-    }
-    void Serve(const std::string& name, const std::string& content) { WriteFile(www_ + name, content); }
+    NginxUpdateCheck() : UpdateServerTest("vtupd-") {}
     void Click(ProgramVersion version = {1, 0}) {
         UpdateCheck check(frame_, inet_, pump_, files_, FD1_, FD2_, FD3_, folder_, version, ServerAddress(registry_));
         check.ConnectEvents();
         check.BtnUpdate_Click();
     }
-    std::string Local(const std::string& name) { return ReadFile(folder_ + "\\" + name); }
 
-    win32::Win32Registry registry_;
     win32::Win32MessagePump pump_;
     win32::WinInetTransfer inet_{pump_}, t1_{pump_}, t2_{pump_}, t3_{pump_};
     win32::Win32FileSystem disk_;
     win32::Win32Files files_;
     FileDownloader FD1_{t1_, disk_, pump_}, FD2_{t2_, disk_, pump_}, FD3_{t3_, disk_, pump_};
     testing::FakeUpdatesFrame frame_;
-    std::string www_, folder_;
 };
 
 using Log = std::vector<std::string>;
