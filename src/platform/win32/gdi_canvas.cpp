@@ -40,15 +40,8 @@ void GdiCanvas::Resize(std::int32_t w, std::int32_t h) {
     bits_ = nullptr;
     w_ = std::max(w, 0);
     h_ = std::max(h, 0);
-    BITMAPINFO info{};
-    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
-    info.bmiHeader.biWidth = std::max(w_, 1);
-    info.bmiHeader.biHeight = -std::max(h_, 1);  // top-down
-    info.bmiHeader.biPlanes = 1;
-    info.bmiHeader.biBitCount = 32;
-    info.bmiHeader.biCompression = BI_RGB;
     void* bits = nullptr;
-    bitmap_.reset(::CreateDIBSection(dc_.get(), &info, DIB_RGB_COLORS, &bits, nullptr, 0));
+    bitmap_.reset(CreateDib(dc_.get(), std::max(w_, 1), -std::max(h_, 1), 32, &bits));
     if (!bitmap_) {
         w_ = h_ = 0;
         return;

@@ -19,6 +19,19 @@ using UniqueHrgn = UniqueHandle<NullInvalid<HRGN, DeleteGdiObject>>;
 using UniqueHdc = UniqueHandle<NullInvalid<HDC, ::DeleteDC>>;
 using UniqueHicon = UniqueHandle<NullInvalid<HICON, ::DestroyIcon>>;
 
+// A device-independent RGB bitmap of `width` x `height` pixels at 24 or 32 bits a pixel; a negative
+// height makes it top-down. `bits` receives the pixels. The caller owns the bitmap.
+inline HBITMAP CreateDib(HDC dc, int width, int height, WORD bitsPerPixel, void** bits) {
+    BITMAPINFO info{};
+    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
+    info.bmiHeader.biWidth = width;
+    info.bmiHeader.biHeight = height;
+    info.bmiHeader.biPlanes = 1;
+    info.bmiHeader.biBitCount = bitsPerPixel;
+    info.bmiHeader.biCompression = BI_RGB;
+    return ::CreateDIBSection(dc, &info, DIB_RGB_COLORS, bits, nullptr, 0);
+}
+
 class SelectGuard {
 public:
     SelectGuard(HDC dc, HGDIOBJ object) : dc_(dc), previous_(object ? ::SelectObject(dc, object) : nullptr) {}

@@ -60,15 +60,8 @@ bool GdiPicture::Render(std::int32_t w, std::int32_t h, platform::Rgb fill, std:
     if (w <= 0 || h <= 0) return false;
     UniqueHdc dc(::CreateCompatibleDC(nullptr));
     if (!dc) return false;
-    BITMAPINFO info{};
-    info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
-    info.bmiHeader.biWidth = w;
-    info.bmiHeader.biHeight = h;  // bottom-up
-    info.bmiHeader.biPlanes = 1;
-    info.bmiHeader.biBitCount = 24;
-    info.bmiHeader.biCompression = BI_RGB;
     void* bits = nullptr;
-    UniqueHbitmap surface(::CreateDIBSection(dc.get(), &info, DIB_RGB_COLORS, &bits, nullptr, 0));
+    UniqueHbitmap surface(CreateDib(dc.get(), w, h, 24, &bits));
     if (!surface) return false;
     {
         SelectGuard select(dc.get(), surface.get());

@@ -1,5 +1,7 @@
 #include "platform/win32/picture_box_win32.h"
 
+#include "platform/win32/gdi_objects.h"
+
 #include <algorithm>
 #include <cmath>
 
@@ -26,15 +28,8 @@ GdiPictureBox::GdiPictureBox(int width, int height, HWND window)
         ::ReleaseDC(nullptr, screen);
     }
     dc_ = ::CreateCompatibleDC(nullptr);
-    BITMAPINFO info{};
-    info.bmiHeader.biSize = sizeof info.bmiHeader;
-    info.bmiHeader.biWidth = width;
-    info.bmiHeader.biHeight = -height;  // top-down
-    info.bmiHeader.biPlanes = 1;
-    info.bmiHeader.biBitCount = 32;
-    info.bmiHeader.biCompression = BI_RGB;
     void* bits = nullptr;
-    bitmap_ = ::CreateDIBSection(dc_, &info, DIB_RGB_COLORS, &bits, nullptr, 0);
+    bitmap_ = CreateDib(dc_, width, -height, 32, &bits);
     oldBitmap_ = ::SelectObject(dc_, bitmap_);
     oldFont_ = ::SelectObject(dc_, ::GetStockObject(DEFAULT_GUI_FONT));
     SetBackColor(0xFFFFFFu);

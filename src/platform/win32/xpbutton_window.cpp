@@ -325,15 +325,8 @@ bool XPButtonWindow::CaptureParentPixels(std::int32_t w, std::int32_t h, std::ve
     {
         WindowDc parentDc(parent_);
         UniqueHdc memory(::CreateCompatibleDC(parentDc.get()));
-        BITMAPINFO info{};
-        info.bmiHeader.biSize = sizeof(BITMAPINFOHEADER);
-        info.bmiHeader.biWidth = w;
-        info.bmiHeader.biHeight = h;
-        info.bmiHeader.biPlanes = 1;
-        info.bmiHeader.biBitCount = 24;
-        info.bmiHeader.biCompression = BI_RGB;
         void* bits = nullptr;
-        UniqueHbitmap copy(memory ? ::CreateDIBSection(memory.get(), &info, DIB_RGB_COLORS, &bits, nullptr, 0)
+        UniqueHbitmap copy(memory ? CreateDib(memory.get(), w, h, 24, &bits)
                                   : nullptr);
         if (parentDc.get() && copy) {
             SelectGuard select(memory.get(), copy.get());
