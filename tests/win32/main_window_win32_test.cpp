@@ -142,14 +142,7 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     application.window = &window;
     FrmMain form(FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, instance}, shell,
                                  application},
-                 FrmMainControls{window,
-                                 window.BtnOnOff(),
-                                 window.Tmr(),
-                                 window.Timer(),
-                                 {&window.BtnO(0), &window.BtnO(1), &window.BtnO(2), &window.BtnO(3), &window.BtnO(4)},
-                                 {&window.Uf(0), &window.Uf(1)},
-                                 {&window.L(0), &window.L(1)},
-                                 {window.Lights(0), window.Lights(1), window.Lights(2)}},
+                 window.Controls(),
                  "C:\\vt");
     win32::MainWindowHandlers handlers;
     handlers.resize = [&] { form.Resize(); };

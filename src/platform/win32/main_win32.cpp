@@ -95,14 +95,7 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     }
 
     FrmMain frmMain(FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, previous}, shell, program},
-                    FrmMainControls{window,
-                                    window.BtnOnOff(),
-                                    window.Tmr(),
-                                    window.Timer(),
-                                    {&window.BtnO(0), &window.BtnO(1), &window.BtnO(2), &window.BtnO(3), &window.BtnO(4)},
-                                    {&window.Uf(0), &window.Uf(1)},
-                                    {&window.L(0), &window.L(1)},
-                                    {window.Lights(0), window.Lights(1), window.Lights(2)}},
+                    window.Controls(),
                     win32::ProgramFolder());
 
     std::string reportedCaption, reportedLight;

@@ -289,4 +289,15 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
     return ::DefWindowProcA(hwnd, message, wParam, lParam);
 }
 
+FrmMainControls MainWindow::Controls() {
+    return FrmMainControls{*this,
+                           BtnOnOff(),
+                           Tmr(),
+                           Timer(),
+                           {&BtnO(0), &BtnO(1), &BtnO(2), &BtnO(3), &BtnO(4)},
+                           {&Uf(0), &Uf(1)},
+                           {&L(0), &L(1)},
+                           {Lights(0), Lights(1), Lights(2)}};
+}
+
 }  // namespace vantorel::win32

@@ -16,6 +16,7 @@
 #include "platform/window.h"
 #include "platform/win32/controls_win32.h"
 #include "platform/win32/xpbutton_window.h"
+#include "ui/main/frm_main.h"
 
 namespace vantorel::win32 {
 
@@ -117,6 +118,9 @@ public:
     }
     HWND Hwnd() const { return hwnd_; }
     UINT Dpi() const { return dpi_; }
+
+    // The window and its controls as the window logic takes them.
+    FrmMainControls Controls();
 
     // The registered "TaskbarCreated" message.
     UINT TaskbarCreatedMessage() const { return taskbarCreated_; }
