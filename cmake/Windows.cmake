@@ -10,8 +10,6 @@ add_library(vantorel_win32 STATIC
     src/platform/win32/file_system_win32.cpp
     src/platform/win32/files_win32.cpp
     src/platform/win32/http_transfer_win32.cpp
-    src/platform/win32/main_window_win32.cpp
-    src/platform/win32/options_window_win32.cpp
     src/platform/win32/picture_box_win32.cpp
     src/platform/win32/registry_win32.cpp
     src/platform/win32/shell_win32.cpp
@@ -32,8 +30,15 @@ set_source_files_properties(${CMAKE_BINARY_DIR}/vantorel.rc PROPERTIES
     OBJECT_DEPENDS "${VANTOREL_ICONS};${CMAKE_SOURCE_DIR}/resources/vantorel.manifest")
 set(CMAKE_RC_FLAGS "${CMAKE_RC_FLAGS} -I${CMAKE_BINARY_DIR}/icons -I${CMAKE_SOURCE_DIR}/src")
 
-add_executable(vantorel WIN32 src/platform/win32/main_win32.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
-target_link_libraries(vantorel PRIVATE vantorel_win32)
+# The top floor: the Win32 classes of the two windows; WinMain builds the object graph on them.
+add_library(vantorel_app STATIC
+    src/app/main_window.cpp
+    src/app/options_window.cpp
+)
+target_link_libraries(vantorel_app PUBLIC vantorel_win32)
+
+add_executable(vantorel WIN32 src/app/main.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
+target_link_libraries(vantorel PRIVATE vantorel_app)
 
 # Reads windows from inside a Wine desktop for the end-to-end tests.
 add_executable(vtprobe tests/e2e/vtprobe.cpp)
@@ -59,7 +64,7 @@ set_tests_properties(wine_stop PROPERTIES FIXTURES_CLEANUP wine)
 
 function(vantorel_wine_test name)
     add_executable(${name} ${ARGN})
-    target_link_libraries(${name} PRIVATE vantorel_win32 vantorel_fakes gtest_main)
+    target_link_libraries(${name} PRIVATE vantorel_app vantorel_fakes gtest_main)
     add_test(NAME ${name} COMMAND ${name} --gtest_brief=1)
     set_tests_properties(${name} PROPERTIES FIXTURES_REQUIRED wine TIMEOUT 300)
 endfunction()
@@ -77,14 +82,14 @@ vantorel_wine_test(registry_win32_tests
 target_sources(vantorel_win32 PRIVATE
     src/platform/win32/gdi_canvas.cpp
     src/platform/win32/gdi_picture.cpp
-    src/platform/win32/xpbutton_window.cpp
+    src/controls/xpbutton/xpbutton_window_win32.cpp
 )
 
 vantorel_wine_test(xpbutton_win32_tests tests/win32/xpbutton_win32_test.cpp)
 
 # The push button's visual test bench. A test runs it on the private Xvfb, saves the gallery as an
 # image and a screenshot of the display under build/ (CI artifacts).
-add_executable(xpbutton-gallery src/platform/win32/xpbutton_gallery_main.cpp)
+add_executable(xpbutton-gallery tools/xpbutton_gallery.cpp)
 target_link_libraries(xpbutton-gallery PRIVATE vantorel_win32)
 set(VANTOREL_ARTIFACTS ${CMAKE_SOURCE_DIR}/build)
 add_test(NAME xpbutton_gallery COMMAND sh -c

@@ -16,7 +16,7 @@
 #include "platform/win32/connection_table_win32.h"
 #include "platform/win32/files_win32.h"
 #include "win32/vantorel_settings.h"
-#include "platform/win32/main_window_win32.h"
+#include "app/main_window.h"
 #include "platform/win32/registry_win32.h"
 #include "platform/win32/shell_win32.h"
 #include "ui/main/tray.h"

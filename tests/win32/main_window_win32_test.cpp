@@ -15,7 +15,7 @@
 #include "fakes/fake_guard_platform.h"
 #include "guard/attempts.h"
 #include "platform/win32/connection_table_win32.h"
-#include "platform/win32/main_window_win32.h"
+#include "app/main_window.h"
 #include "platform/win32/registry_win32.h"
 #include "platform/win32/resource_ids.h"
 #include "platform/win32/shell_win32.h"

@@ -15,7 +15,7 @@
 #include <functional>
 #include <sstream>
 
-#include "platform/win32/options_window_win32.h"
+#include "app/options_window.h"
 #include "platform/win32/registry_win32.h"
 #include "win32/ui_input.h"
 #include "settings/registry_routines.h"

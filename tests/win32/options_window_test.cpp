@@ -6,7 +6,7 @@
 
 #include <gtest/gtest.h>
 
-#include "platform/win32/options_window_win32.h"
+#include "app/options_window.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/registry_routines.h"
 #include "win32/ui_input.h"

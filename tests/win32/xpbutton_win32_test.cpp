@@ -17,7 +17,7 @@
 #include "fakes/raster_canvas.h"
 #include "platform/win32/gdi_canvas.h"
 #include "platform/win32/gdi_picture.h"
-#include "platform/win32/xpbutton_window.h"
+#include "controls/xpbutton/xpbutton_window_win32.h"
 
 namespace vantorel {
 namespace {

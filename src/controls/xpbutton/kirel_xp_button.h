@@ -3,7 +3,7 @@
 // pointer/keyboard/focus state machine and its events, the palette, the caption and window-shape
 // geometry, the fourteen looks and the picture compositing. It draws on a platform::Canvas and
 // asks its window and container for the rest through platform::ButtonHost; the Win32 window class
-// (platform/win32/xpbutton_window) feeds it messages.
+// (xpbutton_window_win32) feeds it messages.
 #pragma once
 
 #include <cstdint>

@@ -20,7 +20,7 @@
 #include "controls/xpbutton/kirel_xp_button.h"
 #include "platform/win32/gdi_canvas.h"
 #include "platform/win32/gdi_picture.h"
-#include "platform/win32/xpbutton_window.h"
+#include "controls/xpbutton/xpbutton_window_win32.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "platform/win32/options_window_win32.h"
+#include "app/options_window.h"
 
 #include "platform/win32/files_win32.h"
 #include "platform/win32/registry_win32.h"

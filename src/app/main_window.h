@@ -15,7 +15,7 @@
 #include "controls/xpbutton/property_bag.h"
 #include "platform/window.h"
 #include "platform/win32/controls_win32.h"
-#include "platform/win32/xpbutton_window.h"
+#include "controls/xpbutton/xpbutton_window_win32.h"
 #include "ui/main/frm_main.h"
 
 namespace vantorel::win32 {

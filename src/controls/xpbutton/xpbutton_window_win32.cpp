@@ -1,4 +1,4 @@
-#include "platform/win32/xpbutton_window.h"
+#include "controls/xpbutton/xpbutton_window_win32.h"
 
 #include <windowsx.h>
 
