@@ -179,8 +179,7 @@ World& WorldOf(int connections) {
 
 struct Services {
     FakeRegistry registry;
-    FakeWindow window;
-    FakeNotifyArea tray;
+    FakeGuardView view;
     IdlePump pump;
 };
 
@@ -190,7 +189,7 @@ void BM_Sweep(benchmark::State& state) {
     TimedTable table(*w.table);
     Services s;
     std::int32_t count = 0;
-    ConnectionSweep sweep(SweepServices{table, s.pump, s.registry, s.window, s.tray}, list, count);
+    ConnectionSweep sweep(SweepServices{table, s.pump, s.registry, s.view}, list, count);
     sweep.SweepConnections();  // the buffer grows once, as in the first sweep of a running guard
     std::vector<double> total, own, fetch;
     for (auto _ : state) {
@@ -227,7 +226,7 @@ void BM_ExposureWindow(benchmark::State& state) {
     TimedTable table(*w.table);
     Services s;
     std::int32_t count = 0;
-    ConnectionSweep sweep(SweepServices{table, s.pump, s.registry, s.window, s.tray}, list, count);
+    ConnectionSweep sweep(SweepServices{table, s.pump, s.registry, s.view}, list, count);
 
     std::mutex lock;
     // Connections by client port (network order). An aborted connection frees its port at once, so a

@@ -15,7 +15,7 @@
 #include "fakes/fake_widgets.h"
 #include "guard/attempts.h"
 #include "guard/definitions.h"
-#include "settings/registry_routines.h"
+#include "settings/settings.h"
 
 namespace vantorel {
 namespace {
@@ -95,7 +95,7 @@ struct MainRig {
     FakeFrame uf[2] = {FakeFrame("Update"), FakeFrame("Options")};
     FakeLabel l[2] = {FakeLabel("Selectable options such as starting when windows boots..."),
                       FakeLabel("Check for Vantorel updates...")};
-    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, instance}, shell,
+    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, shell,
                                  application},
                  FrmMainControls{frm, btnOnOff, tmr, timer, {&btnO[0], &btnO[1], &btnO[2], &btnO[3], &btnO[4]},
                                  {&uf[0], &uf[1]}, {&l[0], &l[1]}, {kDark, kBright, kPadlock}},
@@ -103,7 +103,6 @@ struct MainRig {
 
     MainRig() {
         files.Put(kDefinitionsPath, "-939524086\r\n67305985");  // 67305985 is 1.2.3.4
-        AttemptCount = 0;
     }
     void Put(std::int32_t root, const std::string& name, const std::string& value) {
         RegistryRoutines reg(registry);
@@ -279,15 +278,17 @@ TEST(StatusDisplay, GuardOnFromStartShowsThePadlockAndTheTipGetsItsBlankBackAfte
 
     rig.table.rows = {Row(5, Ipv4(1, 2, 3, 4))};  // an established connection to a listed address
     rig.form.TmrTick();
-    ASSERT_EQ(AttemptCount, 42);
+    ASSERT_EQ(rig.form.guard().AttemptCount(), 42);
     EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel - 42 attempts intercepted");
     rig.form.TimerTick();
     EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel -  42 attempts intercepted");
     EXPECT_EQ(rig.frm.icons, (std::vector<platform::IconHandle>{kPadlock, kPadlock}));
 
-    AttemptCount = -5;  // past the wrap: no blank before a negative count
-    rig.form.TimerTick();
-    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel - -5 attempts intercepted");
+    MainRig negative;  // past the wrap: no blank before a negative count
+    negative.Put(platform::kHkeyCurrentUser, "Attempts", "-5");
+    negative.Start();
+    negative.form.TimerTick();
+    EXPECT_EQ(negative.tray.calls.back().data.tip, "Vantorel - -5 attempts intercepted");
 }
 
 TEST(MissingDefinitions, MessageThenUpdatesThenASecondMessageAndTheProgramCarriesOn) {

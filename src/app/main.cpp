@@ -94,7 +94,7 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
         return 1;
     }
 
-    FrmMain frmMain(FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, previous}, shell, program},
+    FrmMain frmMain(FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, previous}, tray, shell, program},
                     window.Controls(),
                     win32::ProgramFolder());
 

@@ -2,7 +2,7 @@
 
 #include "platform/win32/files_win32.h"
 #include "platform/win32/registry_win32.h"
-#include "settings/server_address.h"
+#include "settings/settings.h"
 #include "version.h"
 
 namespace vantorel::win32 {

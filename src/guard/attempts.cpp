@@ -2,8 +2,6 @@
 
 namespace vantorel {
 
-std::int32_t AttemptCount = 0;
-
 std::string StatusText(std::int32_t count, CountForm form) {
     std::string number = std::to_string(count);
     if (form == CountForm::BlankBeforeSign && count >= 0) number.insert(0, 1, ' ');

@@ -6,9 +6,6 @@
 
 namespace vantorel {
 
-// Program-wide count of attempts intercepted, loaded at start and grown by the sweep.
-extern std::int32_t AttemptCount;
-
 // count + 1, wrapping from 2,147,483,647 to -2,147,483,648.
 constexpr std::int32_t NextCount(std::int32_t count) {
     return static_cast<std::int32_t>(static_cast<std::uint32_t>(count) + 1u);

@@ -2,20 +2,22 @@
 //
 // The state lives in the ON/OFF switch's Value; Toggle applies it to everything else: the switch's
 // colours and caption, the "State" setting and the sweep timer Tmr. Start-up refuses a second
-// instance, places and shows the window, loads the settings, the definitions and the count, adds
-// the tray icon, applies the stored state and starts the status timer, in that order, so no sweep
-// can run before the list is loaded.
+// instance, places and shows the window, loads the settings, the definitions and the count (shown
+// through the view, which also adds the tray icon), applies the stored state and starts the status
+// timer, in that order, so no sweep can run before the list is loaded. The guard owns the count of
+// attempts intercepted.
 #pragma once
 
 #include <cstdint>
 #include <functional>
 #include <string>
 
+#include "guard/guard_view.h"
 #include "guard/sweep.h"
 #include "platform/connection_table.h"
 #include "platform/files.h"
+#include "platform/message_pump.h"
 #include "platform/registry.h"
-#include "platform/tray.h"
 #include "platform/window.h"
 
 namespace vantorel {
@@ -25,13 +27,11 @@ inline constexpr std::uint32_t kTimerInterval = 1000;
 inline constexpr std::uint32_t kOnColour = 0x00FF00;   // 65280, green
 inline constexpr std::uint32_t kOffColour = 0x0000C0;  // 192, dark red
 inline constexpr const char* kMutexName = "Vantorel";
-inline constexpr const char* kSettingsKey = "SOFTWARE\\Vantorel\\";
 
 struct GuardPlatform {
     platform::Registry& registry;
     platform::Files& files;
     platform::ConnectionTable& table;
-    platform::NotifyArea& tray;
     platform::WindowManager& windows;
     platform::MessagePump& pump;
     platform::Instance& instance;
@@ -45,16 +45,14 @@ struct GuardWindow {
     platform::Timer& timer;  // the status timer
 };
 
-// A setting read as a 32-bit integer: the value's number, or `fallback` when it is missing, cannot
-// be read or is not a whole number ("abc").
-std::int32_t ReadIntSetting(platform::Registry& registry, std::int32_t root, const std::string& name,
-                            std::int32_t fallback);
-
 class Guard {
 public:
-    // `onDefinitionsMissing` shows the "Definitions Error" message and the updates window.
-    Guard(GuardPlatform platform, GuardWindow window, std::string programFolder,
+    // `view` shows the count; `onDefinitionsMissing` shows the "Definitions Error" message and the
+    // updates window.
+    Guard(GuardPlatform platform, GuardWindow window, GuardView& view, std::string programFolder,
           std::function<void()> onDefinitionsMissing);
+    Guard(const Guard&) = delete;
+    Guard& operator=(const Guard&) = delete;
 
     // Window initialisation. False when another instance is already running: the caller then ends
     // at once, having shown and changed nothing.
@@ -73,14 +71,11 @@ public:
     // sweeps never nest.
     void TmrTick();
 
-    // The window's mouse-move handler with the raw low word of the position (the tray's code).
-    void MouseMove(std::uint32_t code);
-
-    // The icon came back to a fresh notification area (the taskbar restarted): add it again.
-    void TaskbarCreated();
-
-    // Unload: the tray icon goes, both timers stop.
+    // Unload: both timers stop.
     void Unload();
+
+    // The count of attempts intercepted: the stored count from start-up on, grown by the sweeps.
+    std::int32_t AttemptCount() const { return attemptCount_; }
 
     ConnectionSweep& Sweep() { return sweep_; }
     bool Sweeping() const { return sweeping_; }
@@ -91,6 +86,8 @@ private:
     GuardWindow window_;
     std::string programFolder_;
     std::function<void()> onDefinitionsMissing_;
+    GuardView& view_;
+    std::int32_t attemptCount_ = 0;
     ConnectionSweep sweep_;
     bool sweeping_ = false;
     std::uint64_t sweepsRun_ = 0;

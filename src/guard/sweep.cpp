@@ -4,8 +4,7 @@
 #include <cstring>
 
 #include "guard/attempts.h"
-#include "settings/registry_routines.h"
-#include "ui/main/tray.h"
+#include "settings/settings.h"
 
 namespace vantorel {
 
@@ -16,8 +15,6 @@ constexpr std::size_t kWordsPerRow = sizeof(platform::TcpRow) / sizeof(std::uint
 std::size_t WordsFor(std::uint32_t rows) { return 1 + static_cast<std::size_t>(rows) * kWordsPerRow; }
 
 }  // namespace
-
-ConnectionSweep::ConnectionSweep(SweepServices services) : ConnectionSweep(services, Definitions, AttemptCount) {}
 
 ConnectionSweep::ConnectionSweep(SweepServices services, const DefinitionList& definitions, std::int32_t& count)
     : services_(services), definitions_(definitions), count_(count), buffer_(WordsFor(kInitialTableRows), 0) {}
@@ -47,14 +44,8 @@ std::uint32_t ConnectionSweep::FetchTable() {
 
 void ConnectionSweep::Intercepted() {
     count_ = NextCount(count_);
-    std::string text = StatusText(count_, CountForm::Plain);
-    services_.window.SetCaption(text);
-    RegistryRoutines reg(services_.registry);
-    reg.hkey(platform::kHkeyCurrentUser);
-    reg.KeyRoot("SOFTWARE\\Vantorel\\");
-    if (!reg.KeyExists()) reg.CreateKey();
-    reg.SetRegistryValue("Attempts", count_, platform::kRegSz);
-    ModifyTrayIcon(services_.tray, services_.window, text, kTrayCallbackMessage);
+    OpenSettings(services_.registry, platform::kHkeyCurrentUser).SetRegistryValue(kAttemptsValue, count_, platform::kRegSz);
+    services_.view.CountIntercepted(count_);
 }
 
 void ConnectionSweep::SweepConnections() {

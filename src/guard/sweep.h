@@ -2,8 +2,8 @@
 //
 // A sweep fetches the system's TCP connection table, looks every row's remote address up in the
 // definitions, and asks the system to tear down each listed connection that is not already being
-// torn down. A teardown the system accepts counts as one attempt intercepted and is shown at once:
-// the main window's caption, the persisted "Attempts" value and the tray tip. The sweep lets pending
+// torn down. A teardown the system accepts counts as one attempt intercepted: the count is stored
+// ("Attempts") and shown at once through the guard's view. The sweep lets pending
 // window messages run before every row, so the window stays responsive while it works.
 #pragma once
 
@@ -12,10 +12,10 @@
 #include <vector>
 
 #include "guard/definitions.h"
+#include "guard/guard_view.h"
 #include "platform/connection_table.h"
+#include "platform/message_pump.h"
 #include "platform/registry.h"
-#include "platform/tray.h"
-#include "platform/window.h"
 
 namespace vantorel {
 
@@ -31,8 +31,7 @@ struct SweepServices {
     platform::ConnectionTable& table;
     platform::MessagePump& pump;
     platform::Registry& registry;
-    platform::Window& window;  // the main window: its caption and icon
-    platform::NotifyArea& tray;
+    GuardView& view;
 };
 
 // What one sweep did.
@@ -47,9 +46,8 @@ struct SweepResult {
 
 class ConnectionSweep {
 public:
-    // `definitions` and `count` are the program-wide list and AttemptCount unless a test hands in
-    // its own.
-    explicit ConnectionSweep(SweepServices services);
+    // `definitions` is the list looked up; `count` the count of attempts intercepted, owned by the
+    // caller and grown here.
     ConnectionSweep(SweepServices services, const DefinitionList& definitions, std::int32_t& count);
 
     // One run over the table.

@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "guard/guard_view.h"
 #include "platform/connection_table.h"
 #include "platform/tray.h"
 #include "platform/window.h"
@@ -24,6 +25,14 @@ constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std
 inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint32_t remotePort = 0x5000) {
     return platform::TcpRow{state, Ipv4(10, 0, 0, 1), 0x3930, remote, remotePort};
 }
+
+// The guard's view as a recorder: the count loaded at start-up and each count shown after it.
+class FakeGuardView final : public GuardView {
+public:
+    void CountLoaded(std::int32_t count) override { loaded.push_back(count); }
+    void CountIntercepted(std::int32_t count) override { shown.push_back(count); }
+    std::vector<std::int32_t> loaded, shown;
+};
 
 class FakeConnectionTable final : public platform::ConnectionTable {
 public:

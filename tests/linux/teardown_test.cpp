@@ -52,8 +52,7 @@ protected:
     std::unique_ptr<LinuxConnectionTable> table_;
     FakePump pump_;
     FakeRegistry registry_;
-    FakeWindow window_;
-    FakeNotifyArea tray_;
+    FakeGuardView view_;
 };
 
 DefinitionList ListOf(std::vector<std::string> addresses) {
@@ -117,13 +116,13 @@ TEST_F(RealTeardown, ListedPeersAreAbortedAndCountedOnceUnlistedPeersKeepWorking
 
     DefinitionList list = ListOf({"127.0.0.2", "127.0.0.200", "192.0.2.1"});
     std::int32_t count = 0;
-    ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, window_, tray_}, list, count);
+    ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, view_}, list, count);
     sweep.SweepConnections();
     EXPECT_EQ(sweep.LastSweep().rows, 9u);
     EXPECT_EQ(sweep.LastSweep().requested, 2u);
     EXPECT_EQ(sweep.LastSweep().intercepted, 2u);
     EXPECT_EQ(count, 2);
-    EXPECT_EQ(window_.caption, "Vantorel - 2 attempts intercepted");
+    EXPECT_EQ(view_.shown, (std::vector<std::int32_t>{1, 2}));
 
     EXPECT_EQ(ReadError(toListed.client.get()), ECONNABORTED) << "the listed connection was aborted";
     EXPECT_EQ(ReadError(toHigh.client.get()), ECONNABORTED) << "a negative key is torn down too";
@@ -154,7 +153,7 @@ TEST_F(RealTeardown, TablesBeyondTheFirstBufferAreSweptWhole) {
 
     DefinitionList list = ListOf({"127.0.0.2"});
     std::int32_t count = 0;
-    ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, window_, tray_}, list, count);
+    ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, view_}, list, count);
     sweep.SweepConnections();
     EXPECT_EQ(sweep.LastSweep().rows, 2u * 1201 + 2);
     EXPECT_EQ(sweep.LastSweep().fetchCalls, 2);
@@ -206,14 +205,13 @@ TEST_F(RealTeardown, WithoutTheRightToTearDownNothingIsCounted) {
         LinuxConnectionTable table;
         FakePump pump;
         FakeRegistry registry;
-        FakeWindow window;
-        FakeNotifyArea tray;
+        FakeGuardView view;
         std::int32_t count = 5;
-        ConnectionSweep sweep(SweepServices{table, pump, registry, window, tray}, list, count);
+        ConnectionSweep sweep(SweepServices{table, pump, registry, view}, list, count);
         for (int i = 0; i < 3; ++i) sweep.SweepConnections();
         if (sweep.LastSweep().requested != 1) ::_exit(11);
         if (count != 5) ::_exit(12);
-        if (window.captionChanges != 0 || !tray.calls.empty()) ::_exit(13);
+        if (!view.shown.empty()) ::_exit(13);
         ::_exit(0);
     }
     int status = 0;

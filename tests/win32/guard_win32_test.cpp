@@ -156,24 +156,28 @@ protected:
         win32::Win32MessagePump pump;
         win32::Win32Instance instance{"Vantorel.StartUpTest"};
         win32::MainWindow frmMain;
-        int missing = 0;
-        Guard guard;
+        win32::Win32Shell shell;
+        struct : platform::Application {
+            void ShowOptionsModal(platform::WindowHandle, int) override {}
+            void EndProgram() override {}
+        } application;
+        FrmMain form;
         explicit Program(const std::string& folder)
-            : guard(GuardPlatform{registry, files, table, tray, windows, pump, instance},
-                    GuardWindow{frmMain, frmMain.BtnOnOff(), frmMain.Tmr(), frmMain.Timer()}, folder,
-                    [this] { ++missing; }) {}
+            : form(FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, shell,
+                                   application},
+                   frmMain.Controls(), folder) {}
         void Start() {
             // Windows of earlier tests on this thread posted their quit message when destroyed.
             MSG stale;
             while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {
             }
-            ASSERT_TRUE(guard.Initialize());
+            ASSERT_TRUE(form.Initialize());
             win32::MainWindowHandlers handlers;
-            handlers.switchClick = [this] { guard.BtnOnOffClick(); };
-            handlers.tmrTick = [this] { guard.TmrTick(); };
-            handlers.unload = [this] { guard.Unload(); };
+            handlers.switchClick = [this] { form.BtnOnOffClick(); };
+            handlers.tmrTick = [this] { form.TmrTick(); };
+            handlers.unload = [this] { form.Unload(); };
             ASSERT_TRUE(frmMain.Create(::GetModuleHandleA(nullptr), handlers));
-            guard.Load();
+            form.Load();
         }
     };
 
@@ -183,7 +187,6 @@ protected:
 TEST_F(StartUpWin32, FirstStartOnAnEmptyRegistryThenTwoClicks) {
     Program program(folder_);
     program.Start();
-    EXPECT_EQ(program.missing, 0);
     EXPECT_EQ(Definitions.size(), 2u);
     EXPECT_TRUE(program.frmMain.Visible());
     EXPECT_EQ(program.frmMain.Caption(), "Vantorel -  0 attempts intercepted");
@@ -210,11 +213,11 @@ TEST_F(StartUpWin32, FirstStartOnAnEmptyRegistryThenTwoClicks) {
 
     // While on, the sweep timer really ticks and sweeps.
     DWORD until = ::GetTickCount() + 2000;
-    while (program.guard.SweepsRun() < 3 && ::GetTickCount() < until) {
+    while (program.form.guard().SweepsRun() < 3 && ::GetTickCount() < until) {
         ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
         program.pump.PumpMessages();
     }
-    EXPECT_GE(program.guard.SweepsRun(), 3u);
+    EXPECT_GE(program.form.guard().SweepsRun(), 3u);
 
     ::SendMessageA(button, BM_CLICK, 0, 0);
     EXPECT_EQ(program.frmMain.BtnOnOff().Caption(), "OFF");

@@ -140,7 +140,7 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     win32::Win32Shell shell;
     RecordingApplication application;
     application.window = &window;
-    FrmMain form(FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, instance}, shell,
+    FrmMain form(FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, shell,
                                  application},
                  window.Controls(),
                  "C:\\vt");

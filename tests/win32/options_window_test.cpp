@@ -8,7 +8,7 @@
 
 #include "app/options_window.h"
 #include "platform/win32/registry_win32.h"
-#include "settings/registry_routines.h"
+#include "settings/settings.h"
 #include "win32/ui_input.h"
 
 namespace vantorel::win32 {
@@ -35,8 +35,8 @@ protected:
         reg.DeleteValue(name);
     }
     void Clean() {
-        Remove(kHkeyLocalMachine, kVantorelKey, "Start");
-        Remove(kHkeyLocalMachine, kVantorelKey, "Tray");
+        Remove(kHkeyLocalMachine, kSettingsKey, "Start");
+        Remove(kHkeyLocalMachine, kSettingsKey, "Tray");
         Remove(kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel");
         Remove(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger");
     }
@@ -58,7 +58,7 @@ TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
     EXPECT_FALSE(window.box(0).Value());
     EXPECT_FALSE(window.box(1).Value());
     EXPECT_TRUE(window.box(2).Value());
-    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kVantorelKey, "Start"))) << "loading writes nothing";
+    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kSettingsKey, "Start"))) << "loading writes nothing";
     EXPECT_TRUE(IsEmpty(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger")));
 
     // The user checks "Boot when Windows boots", then unchecks it, then closes the window; the
@@ -70,8 +70,8 @@ TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
     window.ShowModal();
     EXPECT_EQ(window.hwnd(), nullptr) << "closed";
     EXPECT_EQ(Read(kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(exe));
-    EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("1")));
-    EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Tray"), Variant(std::string("1")));
+    EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("1")));
+    EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("1")));
     EXPECT_EQ(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"),
               Variant(std::string("no")));
 
@@ -87,7 +87,7 @@ TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
     ::PostMessageA(again.hwnd(), WM_CLOSE, 0, 0);
     again.ShowModal();
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kRunKey, "Vantorel"))) << "unchecking removes the autostart entry";
-    EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
+    EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
 }
 
 TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsWriteAndRemoveTheAutostartEntry) {
@@ -107,13 +107,13 @@ TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsWriteAndRemoveTheAu
             case 1:  // checked: look at the registry, uncheck it
                 if (!window.box(0).Value()) return false;
                 runAfterCheck = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
-                startAfterCheck = Read(kHkeyLocalMachine, kVantorelKey, "Start");
+                startAfterCheck = Read(kHkeyLocalMachine, kSettingsKey, "Start");
                 PointerClick(window.box(0).hwnd());
                 break;
             case 2:  // unchecked: look again, then "&Close"
                 if (window.box(0).Value()) return false;
                 runAfterUncheck = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
-                startAfterUncheck = Read(kHkeyLocalMachine, kVantorelKey, "Start");
+                startAfterUncheck = Read(kHkeyLocalMachine, kSettingsKey, "Start");
                 PointerClick(window.closeButton().hwnd());
                 return true;
         }
@@ -126,7 +126,7 @@ TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsWriteAndRemoveTheAu
     EXPECT_EQ(startAfterCheck, Variant(std::string("1")));
     EXPECT_TRUE(IsEmpty(runAfterUncheck)) << "unchecking removes the Run value";
     EXPECT_EQ(startAfterUncheck, Variant(std::string("0")));
-    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kVantorelKey, "Tray"))) << "the other boxes wrote nothing";
+    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kSettingsKey, "Tray"))) << "the other boxes wrote nothing";
     EXPECT_TRUE(IsEmpty(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger")));
 }
 

@@ -19,7 +19,7 @@
 #include "platform/win32/shell_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/registry_routines.h"
-#include "settings/server_address.h"
+#include "settings/settings.h"
 #include "ui/options/update_check.h"
 
 namespace vantorel {

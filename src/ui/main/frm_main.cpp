@@ -4,7 +4,7 @@
 
 #include "guard/attempts.h"
 #include "guard/read_definitions.h"
-#include "settings/server_address.h"
+#include "settings/settings.h"
 #include "ui/main/tray.h"
 
 namespace vantorel {
@@ -13,7 +13,7 @@ FrmMain::FrmMain(FrmMainPlatform platform, FrmMainControls controls, std::string
     : platform_(platform),
       controls_(controls),
       programFolder_(std::move(programFolder)),
-      guard_(platform.guard, GuardWindow{controls.frmMain, controls.btnOnOff, controls.tmr, controls.timer},
+      guard_(platform.guard, GuardWindow{controls.frmMain, controls.btnOnOff, controls.tmr, controls.timer}, *this,
              programFolder_, [this] { DefinitionsMissing(); }) {
     for (int i = 0; i < static_cast<int>(controls_.btnO.size()); ++i) {
         if (controls_.btnO[i] != nullptr) controls_.btnO[i]->Click = [this, i] { BtnOClick(i); };
@@ -56,14 +56,36 @@ void FrmMain::TimerTick() {
     } else {
         frm.SetIcon(controls_.lights[kLightPadlock]);
     }
-    ModifyTrayIcon(platform_.guard.tray, frm, StatusText(AttemptCount, CountForm::BlankBeforeSign),
+    ModifyTrayIcon(platform_.tray, frm, StatusText(guard_.AttemptCount(), CountForm::BlankBeforeSign),
                    kTrayCallbackMessage);
+}
+
+void FrmMain::CountLoaded(std::int32_t count) {
+    platform::Window& frm = controls_.frmMain;
+    std::string status = StatusText(count, CountForm::BlankBeforeSign);
+    frm.SetCaption(status);
+    AddTrayIcon(platform_.tray, frm, frm.Icon(), status, kTrayCallbackMessage);
+}
+
+void FrmMain::CountIntercepted(std::int32_t count) {
+    std::string status = StatusText(count, CountForm::Plain);
+    controls_.frmMain.SetCaption(status);
+    ModifyTrayIcon(platform_.tray, controls_.frmMain, status, kTrayCallbackMessage);
+}
+
+void FrmMain::MouseMove(std::uint32_t code) {
+    TrayMouseNotification(controls_.frmMain, platform_.guard.windows, platform_.guard.pump, code);
+}
+
+void FrmMain::TaskbarCreated() {
+    platform::Window& frm = controls_.frmMain;
+    AddTrayIcon(platform_.tray, frm, frm.Icon(), frm.Caption(), kTrayCallbackMessage);
 }
 
 void FrmMain::Resize() {
     platform::Window& frm = controls_.frmMain;
     if (frm.State() == platform::WindowState::Minimized) {
-        AddTrayIcon(platform_.guard.tray, frm, frm.Icon(), kTrayTipMinimised, kTrayCallbackMessage);
+        AddTrayIcon(platform_.tray, frm, frm.Icon(), kTrayTipMinimised, kTrayCallbackMessage);
         // BringToFront shows the window it raises (SWP_SHOWWINDOW), so the window is hidden after
         // it: minimising must end with the window in the tray, not back on the taskbar.
         BringToFront(platform_.guard.windows, platform_.guard.pump, frm.Handle());
@@ -75,6 +97,7 @@ void FrmMain::Resize() {
 void FrmMain::Unload() {
     if (unloaded_) return;
     unloaded_ = true;
+    RemoveTrayIcon(platform_.tray, controls_.frmMain);
     guard_.Unload();
     platform_.application.EndProgram();
 }

@@ -11,7 +11,9 @@
 #include <string>
 
 #include "guard/guard.h"
+#include "guard/guard_view.h"
 #include "platform/shell.h"
+#include "platform/tray.h"
 #include "platform/widgets.h"
 
 namespace vantorel {
@@ -31,6 +33,7 @@ enum LightIndex : int { kLightDark = 0, kLightBright = 1, kLightPadlock = 2 };
 
 struct FrmMainPlatform {
     GuardPlatform guard;
+    platform::NotifyArea& tray;
     platform::Shell& shell;
     platform::Application& application;
 };
@@ -46,7 +49,7 @@ struct FrmMainControls {
     std::array<platform::IconHandle, 3> lights;  // dark bulb, lit bulb, padlock
 };
 
-class FrmMain {
+class FrmMain final : private GuardView {
 public:
     // Wires the buttons' clicks to BtnOClick.
     FrmMain(FrmMainPlatform platform, FrmMainControls controls, std::string programFolder);
@@ -64,8 +67,10 @@ public:
     void TmrTick() { guard_.TmrTick(); }
     void TimerTick();
     void Resize();
-    void MouseMove(std::uint32_t code) { guard_.MouseMove(code); }
-    void TaskbarCreated() { guard_.TaskbarCreated(); }
+    // The window's mouse-move handler with the raw low word of the position (the tray's code).
+    void MouseMove(std::uint32_t code);
+    // The icon came back to a fresh notification area (the taskbar restarted): add it again.
+    void TaskbarCreated();
     // A close request (title bar, system menu, the system): unloads the window.
     void QueryUnload() { Unload(); }
     // Removes the tray icon, stops both timers and ends the program. Runs once; later calls (the
@@ -84,6 +89,10 @@ public:
     Guard& guard() { return guard_; }
 
 private:
+    // The guard's view: the count in the caption and the tray tip.
+    void CountLoaded(std::int32_t count) override;
+    void CountIntercepted(std::int32_t count) override;
+
     FrmMainPlatform platform_;
     FrmMainControls controls_;
     std::string programFolder_;

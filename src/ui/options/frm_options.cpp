@@ -1,6 +1,6 @@
 #include "ui/options/frm_options.h"
 
-#include "settings/registry_routines.h"
+#include "settings/settings.h"
 
 namespace vantorel {
 
@@ -8,15 +8,6 @@ namespace {
 
 using platform::kHkeyCurrentUser;
 using platform::kHkeyLocalMachine;
-
-// A routines object on `root`/`keyRoot` whose key exists (created when missing).
-RegistryRoutines OpenOrCreate(platform::Registry& registry, std::int32_t root, const std::string& keyRoot) {
-    RegistryRoutines reg(registry);
-    reg.hkey(root);
-    reg.KeyRoot(keyRoot);
-    if (!reg.KeyExists()) reg.CreateKey();
-    return reg;
-}
 
 // "1" (as text or number) is checked; anything else, a missing value included, is not.
 bool IsOne(const Variant& value) {
@@ -42,17 +33,17 @@ void FrmOptions::Form_Load() {
     // A setting never stored is not in effect: no Run value exists and start-up reads "Tray" as
     // "0", so both boxes show unchecked until the user sets them.
     {
-        RegistryRoutines reg = OpenOrCreate(registry_, kHkeyLocalMachine, kVantorelKey);
-        if (IsOne(reg.GetRegistryValue("Start", std::string("0")))) controls_.Box[0]->SetValue(true);
+        RegistryRoutines reg = OpenSettings(registry_, kHkeyLocalMachine);
+        if (IsOne(reg.GetRegistryValue(kStartValue, std::string("0")))) controls_.Box[0]->SetValue(true);
     }
     {
-        RegistryRoutines reg = OpenOrCreate(registry_, kHkeyLocalMachine, kVantorelKey);
-        if (IsOne(reg.GetRegistryValue("Tray", std::string("0")))) controls_.Box[1]->SetValue(true);
+        RegistryRoutines reg = OpenSettings(registry_, kHkeyLocalMachine);
+        if (IsOne(reg.GetRegistryValue(kTrayValue, std::string("0")))) controls_.Box[1]->SetValue(true);
     }
     {
         // Internet Explorer's own default is "yes".
         RegistryRoutines reg = OpenOrCreate(registry_, kHkeyCurrentUser, kInternetExplorerMainKey);
-        Variant value = reg.GetRegistryValue("Disable Script Debugger", std::string("yes"));
+        Variant value = reg.GetRegistryValue(kScriptDebuggerValue, std::string("yes"));
         const auto* text = std::get_if<std::string>(&value);
         if (text != nullptr && *text == "yes") controls_.Box[2]->SetValue(true);
     }
@@ -66,28 +57,28 @@ void FrmOptions::Box_Click(int index) {
         case 0: {
             if (checked) {
                 RegistryRoutines run = OpenOrCreate(registry_, kHkeyLocalMachine, kRunKey);
-                run.SetRegistryValue("Vantorel", executablePath_, platform::kRegSz);
+                run.SetRegistryValue(kRunValue, executablePath_, platform::kRegSz);
             } else {
                 RegistryRoutines run(registry_);
                 run.hkey(kHkeyLocalMachine);
                 run.KeyRoot(std::string(kRunKey) + "\\");
-                run.DeleteValue("Vantorel");
+                run.DeleteValue(kRunValue);
             }
-            RegistryRoutines reg = OpenOrCreate(registry_, kHkeyLocalMachine, kVantorelKey);
-            reg.SetRegistryValue("Start", std::string(checked ? "1" : "0"), platform::kRegSz);
+            RegistryRoutines reg = OpenSettings(registry_, kHkeyLocalMachine);
+            reg.SetRegistryValue(kStartValue, std::string(checked ? "1" : "0"), platform::kRegSz);
             break;
         }
         case 1: {
             RegistryRoutines reg(registry_);
             reg.hkey(kHkeyLocalMachine);
-            reg.KeyRoot(kVantorelKey);
+            reg.KeyRoot(kSettingsKey);
             if (checked && !reg.KeyExists()) reg.CreateKey();
-            reg.SetRegistryValue("Tray", std::string(checked ? "1" : "0"), platform::kRegSz);
+            reg.SetRegistryValue(kTrayValue, std::string(checked ? "1" : "0"), platform::kRegSz);
             break;
         }
         case 2: {
             RegistryRoutines reg = OpenOrCreate(registry_, kHkeyCurrentUser, kInternetExplorerMainKey);
-            reg.SetRegistryValue("Disable Script Debugger", std::string(checked ? "yes" : "no"), platform::kRegSz);
+            reg.SetRegistryValue(kScriptDebuggerValue, std::string(checked ? "yes" : "no"), platform::kRegSz);
             break;
         }
         default:

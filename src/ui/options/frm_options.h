@@ -13,10 +13,6 @@
 
 namespace vantorel {
 
-inline constexpr const char* kVantorelKey = "SOFTWARE\\Vantorel\\";
-inline constexpr const char* kRunKey = "SOFTWARE\\Microsoft\\Windows\\CurrentVersion\\Run";
-inline constexpr const char* kInternetExplorerMainKey = "SOFTWARE\\Microsoft\\Internet Explorer\\Main\\";
-
 // The options window's controls, as the window declares them.
 struct OptionsControls {
     std::array<platform::Frame*, 2> F{};        // 0 "Options", 1 "Updates"
