@@ -11,7 +11,7 @@
 
 #include "guard/guard_view.h"
 #include "platform/connection_table.h"
-#include "platform/tray.h"
+#include "platform/notify_area.h"
 #include "platform/window.h"
 
 namespace vantorel::testing {

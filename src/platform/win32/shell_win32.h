@@ -4,7 +4,7 @@
 #include <windows.h>
 
 #include "platform/shell.h"
-#include "platform/tray.h"
+#include "platform/notify_area.h"
 #include "platform/window.h"
 #include "platform/win32/unique_handle.h"
 

@@ -13,7 +13,7 @@
 #include "guard/guard.h"
 #include "guard/guard_view.h"
 #include "platform/shell.h"
-#include "platform/tray.h"
+#include "platform/notify_area.h"
 #include "platform/widgets.h"
 
 namespace vantorel {

@@ -9,7 +9,7 @@
 #include <cstdint>
 #include <string>
 
-#include "platform/tray.h"
+#include "platform/notify_area.h"
 #include "platform/window.h"
 
 namespace vantorel {
