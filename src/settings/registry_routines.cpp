@@ -57,23 +57,42 @@ std::int32_t QueryWithRetry(platform::Registry& registry, RegKey key, const std:
     return status;
 }
 
+// A key this object opened, created or connected, closed when the scope ends.
+class ScopedKey {
+public:
+    explicit ScopedKey(platform::Registry& registry) : registry_(registry) {}
+    ~ScopedKey() {
+        if (owned_) registry_.CloseKey(key_);
+    }
+    ScopedKey(const ScopedKey&) = delete;
+    ScopedKey& operator=(const ScopedKey&) = delete;
+
+    // Where the opening call puts the key.
+    RegKey& out() { return key_; }
+    // Takes the status of that call: the key is owned (and closed later) only when it succeeded.
+    bool Took(std::int32_t status) {
+        owned_ = status == platform::kErrorSuccess;
+        return owned_;
+    }
+    RegKey get() const { return key_; }
+
+private:
+    platform::Registry& registry_;
+    RegKey key_ = 0;
+    bool owned_ = false;
+};
+
 }  // namespace
 
 bool RegistryRoutines::KeyExists() {
-    RegKey key = 0;
-    if (registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key) != platform::kErrorSuccess)
-        return false;
-    registry_.CloseKey(key);
-    return true;
+    ScopedKey key(registry_);
+    return key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key.out()));
 }
 
 std::string RegistryRoutines::CreateKey(const std::optional<std::string>& KeyName) {
-    RegKey key = 0;
+    ScopedKey key(registry_);
     std::string path = keyRoot_ + "\\" + KeyName.value_or(subkey_);
-    if (registry_.CreateKey(RootKey(hkey_), path, platform::kKeyAllAccess, key) != platform::kErrorSuccess)
-        return std::string();
-    registry_.CloseKey(key);
-    return "0";
+    return key.Took(registry_.CreateKey(RootKey(hkey_), path, platform::kKeyAllAccess, key.out())) ? "0" : "";
 }
 
 std::int32_t RegistryRoutines::DeleteKey(const std::string& KeyName) {
@@ -81,35 +100,36 @@ std::int32_t RegistryRoutines::DeleteKey(const std::string& KeyName) {
 }
 
 std::int32_t RegistryRoutines::DeleteValue(const std::string& ValueName) {
-    RegKey key = 0;
-    std::int32_t status = registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyAllAccess, key);
-    if (status != platform::kErrorSuccess) return status;
-    status = registry_.DeleteValue(key, ValueName);
-    registry_.CloseKey(key);
-    return status;
+    ScopedKey key(registry_);
+    std::int32_t status = registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyAllAccess, key.out());
+    if (!key.Took(status)) return status;
+    return registry_.DeleteValue(key.get(), ValueName);
 }
 
 Collection<std::string> RegistryRoutines::EnumRegistryKeys(std::int32_t hkey, const std::string& KeyName) {
     Collection<std::string> keys;
     RegKey key = RootKey(hkey);
-    bool opened = !KeyName.empty();
-    if (opened && registry_.OpenKey(RootKey(hkey), KeyName, platform::kKeyRead, key) != platform::kErrorSuccess)
-        return keys;
+    ScopedKey opened(registry_);
+    if (!KeyName.empty()) {
+        if (!opened.Took(registry_.OpenKey(RootKey(hkey), KeyName, platform::kKeyRead, opened.out()))) return keys;
+        key = opened.get();
+    }
     for (std::uint32_t index = 0;; ++index) {
         std::string name;
         if (registry_.EnumKey(key, index, kNameBuffer, name) != platform::kErrorSuccess) break;
         keys.Add(name, name);
     }
-    if (opened) registry_.CloseKey(key);
     return keys;
 }
 
 Collection<RegistryItem> RegistryRoutines::EnumRegistryValues(std::int32_t hkey, const std::string& KeyName) {
     Collection<RegistryItem> values;
     RegKey key = RootKey(hkey);
-    bool opened = !KeyName.empty();
-    if (opened && registry_.OpenKey(RootKey(hkey), KeyName, platform::kKeyRead, key) != platform::kErrorSuccess)
-        return values;
+    ScopedKey opened(registry_);
+    if (!KeyName.empty()) {
+        if (!opened.Took(registry_.OpenKey(RootKey(hkey), KeyName, platform::kKeyRead, opened.out()))) return values;
+        key = opened.get();
+    }
     for (std::uint32_t index = 0;; ++index) {
         std::string name;
         std::int32_t type = 0;
@@ -151,7 +171,6 @@ Collection<RegistryItem> RegistryRoutines::EnumRegistryValues(std::int32_t hkey,
         }
         values.Add(name, RegistryItem{name, std::move(value)});
     }
-    if (opened) registry_.CloseKey(key);
     return values;
 }
 
@@ -197,12 +216,9 @@ Variant RegistryRoutines::ReadValue(RegKey key, const std::string& name, Variant
 }
 
 Variant RegistryRoutines::GetRegistryValue(const std::string& ValueName, const Variant& DefaultValue) {
-    RegKey key = 0;
-    if (registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key) != platform::kErrorSuccess)
-        return DefaultValue;
-    Variant result = ReadValue(key, ValueName, DefaultValue);
-    registry_.CloseKey(key);
-    return result;
+    ScopedKey key(registry_);
+    if (!key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key.out()))) return DefaultValue;
+    return ReadValue(key.get(), ValueName, DefaultValue);
 }
 
 bool RegistryRoutines::WriteValue(RegKey key, const std::string& name, const Variant& value, std::int32_t type) {
@@ -234,45 +250,32 @@ bool RegistryRoutines::WriteValue(RegKey key, const std::string& name, const Var
 }
 
 bool RegistryRoutines::SetRegistryValue(const std::string& ValueName, const Variant& Value, std::int32_t DType) {
-    RegKey key = 0;
-    if (registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyWrite, key) != platform::kErrorSuccess)
-        return false;
-    bool written = WriteValue(key, ValueName, Value, DType);
-    registry_.CloseKey(key);
-    return written;
+    ScopedKey key(registry_);
+    if (!key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyWrite, key.out()))) return false;
+    return WriteValue(key.get(), ValueName, Value, DType);
 }
 
 Variant RegistryRoutines::ReadRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey,
                                                   const std::string& ValueName,
                                                   const std::optional<std::string>& KeyPath) {
-    RegKey remote = 0;
-    if (registry_.ConnectRegistry(sRemoteComputer, RootKey(hkey), remote) != platform::kErrorSuccess)
+    ScopedKey remote(registry_);
+    if (!remote.Took(registry_.ConnectRegistry(sRemoteComputer, RootKey(hkey), remote.out())))
         return std::string("Error!");
-    Variant result;
-    RegKey key = 0;
-    if (registry_.OpenKey(remote, KeyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key) ==
-        platform::kErrorSuccess) {
-        result = ReadValue(key, ValueName, Variant());
-        registry_.CloseKey(key);
-    }
-    registry_.CloseKey(remote);
-    return result;
+    ScopedKey key(registry_);
+    if (!key.Took(registry_.OpenKey(remote.get(), KeyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key.out())))
+        return Variant();
+    return ReadValue(key.get(), ValueName, Variant());
 }
 
 bool RegistryRoutines::WriteRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey,
                                                 const std::string& ValueName, const Variant& Value,
                                                 std::int32_t DType, const std::optional<std::string>& KeyPath) {
-    RegKey remote = 0;
-    if (registry_.ConnectRegistry(sRemoteComputer, RootKey(hkey), remote) != platform::kErrorSuccess) return false;
-    bool written = false;
-    RegKey key = 0;
-    if (registry_.OpenKey(remote, KeyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key) ==
-        platform::kErrorSuccess) {
-        written = WriteValue(key, ValueName, Value, DType);
-        registry_.CloseKey(key);
-    }
-    registry_.CloseKey(remote);
-    return written;
+    ScopedKey remote(registry_);
+    if (!remote.Took(registry_.ConnectRegistry(sRemoteComputer, RootKey(hkey), remote.out()))) return false;
+    ScopedKey key(registry_);
+    if (!key.Took(registry_.OpenKey(remote.get(), KeyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key.out())))
+        return false;
+    return WriteValue(key.get(), ValueName, Value, DType);
 }
 
 std::string RegistryRoutines::TrimNull(std::string& item) {
