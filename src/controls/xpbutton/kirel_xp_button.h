@@ -203,9 +203,9 @@ private:
     void DrawCaption(std::int32_t mode);
     void DrawCaptionEffect(const Box& box);
     void DrawFocus();
-    void DrawUp();
-    void DrawPressed();
-    void DrawDisabled();
+    // The three faces of a look: up (hovered or not), pressed, disabled.
+    enum class Face { Up, Pressed, Disabled };
+    void DrawFace(Face face);
     void DrawPicture(std::int32_t mode);
     void DrawPictureEffect(std::int32_t offset, const platform::Picture& picture);
     void Text(const Box& box, Rgb colour) { canvas_.DrawText(caption_, box, colour, font_); }

@@ -217,13 +217,13 @@ void KirelXPButton::Paint(std::int32_t state, bool force) {
     canvas_.FillBox(0, 0, w_, h_, palette_.FaceColor);
     if (buttonType_ == 11 && hasBackground_) canvas_.WritePixels(0, 0, backgroundW_, backgroundH_, background_);
     if (!enabled_) {
-        DrawDisabled();
+        DrawFace(Face::Disabled);
         DrawPicture(2);
     } else if (state == 0) {
-        DrawUp();
+        DrawFace(Face::Up);
         DrawPicture(0);
     } else if (state == 2) {
-        DrawPressed();
+        DrawFace(Face::Pressed);
         DrawPicture(1);
     }
     if (swapColours) {
@@ -232,7 +232,7 @@ void KirelXPButton::Paint(std::int32_t state, bool force) {
     }
 }
 
-void KirelXPButton::DrawUp() {
+void KirelXPButton::DrawFace(Face face) {
     const Palette& p = palette_;
     const std::int32_t W = w_;
     const std::int32_t H = h_;
@@ -240,321 +240,296 @@ void KirelXPButton::DrawUp() {
     Canvas& c = canvas_;
     switch (buttonType_) {
         case 1:
-            DrawCaption(h);
-            DrawBevel(p.HighlightColor, p.ShadowColor, p.HighlightColor, p.ShadowColor, -1, false);
-            c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-            DrawFocus();
-            break;
-        case 2:
-            DrawCaption(h);
-            if (IsDefault()) {
-                DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, -1, false);
+            if (face == Face::Up) {
+                DrawCaption(h);
+                DrawBevel(p.HighlightColor, p.ShadowColor, p.HighlightColor, p.ShadowColor, -1, false);
+                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
                 DrawFocus();
+            } else if (face == Face::Pressed) {
+                DrawCaption(2);
+                DrawBevel(p.ShadowColor, p.HighlightColor, p.ShadowColor, p.HighlightColor, -1, false);
                 c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-            } else {
-                DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, 0, false);
-            }
-            break;
-        case 3: {
-            const Rgb b = p.BaseColor;
-            Gradient(b, 25, true, true);
-            DrawCaption(h);
-            c.FrameBox(0, 0, W, H, kXpBorder);
-            Corners(kXpCorner);
-            if (hover_) {
-                c.FrameBox(1, 2, W - 2, H - 4, 0x31B2FF);
-                c.DrawLine(2, H - 2, W - 2, H - 2, 0x0096E7);
-                c.DrawLine(2, 1, W - 2, 1, 0xCEF3FF);
-                c.DrawLine(1, 2, W - 1, 2, 0x8CDBFF);
-                c.DrawLine(2, 3, 2, H - 3, 0x6BCBFF);
-                c.DrawLine(W - 3, 3, W - 3, H - 3, 0x6BCBFF);
-            } else if ((hasFocus_ || host_.IsDefault()) && showFocusRect_) {
-                c.FrameBox(1, 2, W - 2, H - 4, 0xE7AE8C);
-                c.DrawLine(2, H - 2, W - 2, H - 2, 0xEF826B);
-                c.DrawLine(2, 1, W - 2, 1, 0xFFE7CE);
-                c.DrawLine(1, 2, W - 1, 2, 0xF7D7BD);
-                c.DrawLine(2, 3, 2, H - 3, 0xF0D1B5);
-                c.DrawLine(W - 3, 3, W - 3, H - 3, 0xF0D1B5);
-            } else {
-                c.DrawLine(2, H - 2, W - 2, H - 2, SB(b, -48));
-                c.DrawLine(1, H - 3, W - 2, H - 3, SB(b, -32));
-                c.DrawLine(W - 2, 2, W - 2, H - 2, SB(b, -36));
-                c.DrawLine(W - 3, 3, W - 3, H - 3, SB(b, -24));
-                c.DrawLine(2, 1, W - 2, 1, SB(b, 16));
-                c.DrawLine(1, 2, W - 2, 2, SB(b, 10));
-                c.DrawLine(1, 2, 1, H - 2, SB(b, -5));
-                c.DrawLine(2, 3, 2, H - 3, SB(b, -10));
-            }
-            break;
-        }
-        case 4:
-            c.FillBox(1, 1, W - 2, H - 2, p.LightColor);
-            DrawCaption(h);
-            c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-            Corners(p.DarkShadowColor);
-            c.DrawLine(1, 2, 2, 0, p.FaceColor);
-            c.DrawLine(3, 2, W - 3, 2, p.HighlightColor);
-            c.DrawLine(2, 2, 2, H - 3, p.HighlightColor);
-            c.PutPixel(3, 3, p.HighlightColor);
-            c.DrawLine(W - 3, 1, W - 3, H - 3, p.FaceColor);
-            c.DrawLine(1, H - 3, W - 3, H - 3, p.FaceColor);
-            c.PutPixel(W - 4, H - 4, p.FaceColor);
-            c.DrawLine(W - 2, 2, W - 2, H - 2, p.ShadowColor);
-            c.DrawLine(2, H - 2, W - 2, H - 2, p.ShadowColor);
-            c.PutPixel(W - 3, H - 3, p.ShadowColor);
-            break;
-        case 5:
-            c.FillBox(1, 1, W - 1, H - 1, S(p.FaceColor, 12));
-            DrawCaption(h);
-            c.FrameBox(1, 1, W - 1, H - 1, p.HighlightColor);
-            c.FrameBox(0, 0, W - 1, H - 1, S(p.ShadowColor, -26));
-            c.PutPixel(1, H - 2, S(p.ShadowColor, 26));
-            c.PutPixel(W - 2, 1, S(p.ShadowColor, 26));
-            if (hasFocus_ && showFocusRect_) {
-                c.FrameBox(captionRect_.left - 2, captionRect_.top - 1, textWidth_ + 4, textHeight_ + 2, 0xCC9999);
-            }
-            break;
-        case 6: {
-            DrawCaption(h);
-            const Rgb a = S(p.LightColor, 8);
-            DrawBevel(a, p.ShadowColor, a, p.ShadowColor, 0, false);
-            DrawFocus();
-            break;
-        }
-        case 7:
-        case 8:
-        case 12:
-            DrawCaption(h);
-            if (buttonType_ == 7 || (buttonType_ == 8 && hover_)) {
-                DrawBevel(p.HighlightColor, p.ShadowColor, 0, 0, 0, true);
-            } else if (buttonType_ == 12 && hover_) {
-                DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, 0, false);
-            }
-            DrawFocus();
-            break;
-        case 9:
-            if (hover_) c.FillBox(1, 1, W, H, p.AccentLightColor);
-            DrawCaption(h);
-            if (hover_) c.FrameBox(0, 0, W, H, p.AccentColor);
-            DrawFocus();
-            break;
-        case 11:
-            DrawCaption(h);
-            DrawFocus();
-            break;
-        case 13:
-            c.DrawOval(0, 0, W, H, hover_ ? p.ShadowColor : p.FaceColor, p.FaceColor);
-            DrawCaption(h);
-            break;
-        case 14:
-            if (hover_) {
-                c.FillBox(0, 0, W, H, p.LightColor);
-            } else {
-                Gradient(p.HighlightColor, 58, true, false);
-            }
-            if (host_.IsDefault()) {
-                // The default button's caption is bold; the font changes must not repaint.
-                paintingEnabled_ = false;
-                const bool keptBold = FontBold();
-                SetFontBold(true);
-                DrawCaption(h);
-                SetFontBold(keptBold);
-                paintingEnabled_ = true;
-            } else {
-                DrawCaption(h);
-            }
-            c.FrameBox(0, 0, W, H, S(p.ShadowColor, -50));
-            c.FrameBox(1, 1, W - 2, H - 2, S(p.FaceColor, -9));
-            c.FillBox(2, 2, W - 4, 2, p.HighlightColor);
-            c.FillBox(2, 4, 2, H - 6, p.HighlightColor);
-            DrawFocus();
-            break;
-        default: break;
-    }
-}
-
-void KirelXPButton::DrawPressed() {
-    const Palette& p = palette_;
-    const std::int32_t W = w_;
-    const std::int32_t H = h_;
-    Canvas& c = canvas_;
-    switch (buttonType_) {
-        case 1:
-            DrawCaption(2);
-            DrawBevel(p.ShadowColor, p.HighlightColor, p.ShadowColor, p.HighlightColor, -1, false);
-            c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-            DrawFocus();
-            break;
-        case 2:
-            DrawCaption(2);
-            if (IsDefault()) {
-                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-                c.FrameBox(1, 1, W - 2, H - 2, p.ShadowColor);
                 DrawFocus();
             } else {
-                DrawBevel(p.DarkShadowColor, p.HighlightColor, p.ShadowColor, p.LightColor, 0, false);
+                DrawCaption(3);
+                DrawBevel(p.HighlightColor, p.ShadowColor, p.HighlightColor, p.ShadowColor, -1, false);
+                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
             }
-            break;
-        case 3: {
-            const Rgb q = SB(p.BaseColor, -32);
-            Gradient(q, 25, false, true);
-            DrawCaption(2);
-            c.FrameBox(0, 0, W, H, kXpBorder);
-            Corners(kXpCorner);
-            c.DrawLine(2, H - 2, W - 2, H - 2, SB(q, 16));
-            c.DrawLine(1, H - 3, W - 2, H - 3, SB(q, 10));
-            c.DrawLine(W - 2, 2, W - 2, H - 2, SB(q, 5));
-            c.DrawLine(W - 3, 3, W - 3, H - 3, p.BaseColor);
-            c.DrawLine(2, 1, W - 2, 1, SB(q, -32));
-            c.DrawLine(1, 2, W - 2, 2, SB(q, -24));
-            c.DrawLine(1, 2, 1, H - 2, SB(q, -32));
-            c.DrawLine(2, 2, 2, H - 2, SB(q, -22));
-            break;
-        }
-        case 4: {
-            const Rgb f = S(p.ShadowColor, -16);
-            c.FillBox(1, 1, W - 2, H - 2, f);
-            palette_.BaseColor = f;
-            DrawCaption(2);
-            palette_.BaseColor = S(p.FaceColor, 48);
-            c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-            c.FrameBox(1, 1, W - 2, H - 2, S(p.ShadowColor, -64));
-            c.FrameBox(2, 2, W - 4, H - 4, S(p.ShadowColor, -32));
-            c.PutPixel(2, 2, S(p.ShadowColor, -64));
-            c.PutPixel(3, 3, S(p.ShadowColor, -32));
-            Corners(p.DarkShadowColor);
-            c.DrawLine(W - 3, 1, W - 3, H - 3, p.ShadowColor);
-            c.DrawLine(1, H - 3, W - 2, H - 3, p.ShadowColor);
-            c.PutPixel(W - 4, H - 4, p.ShadowColor);
-            c.DrawLine(W - 2, 3, W - 2, H - 2, f);
-            c.DrawLine(3, H - 2, W - 2, H - 2, f);
-            c.DrawLine(W - 2, H - 3, W - 4, H - 1, S(p.ShadowColor, -32));
-            c.PutPixel(2, H - 2, S(p.ShadowColor, -32));
-            c.PutPixel(W - 2, 2, S(p.ShadowColor, -32));
-            break;
-        }
-        case 5:
-            c.FillBox(1, 1, W - 2, H - 2, S(p.ShadowColor, 16));
-            c.FrameBox(0, 0, W - 1, H - 1, S(p.ShadowColor, -26));
-            c.DrawLine(W - 1, 1, W - 1, H, p.HighlightColor);
-            c.DrawLine(1, H - 1, W - 1, H - 1, p.HighlightColor);
-            Text(captionRect_, p.TextOverColor);
-            if (hasFocus_ && showFocusRect_) {
-                c.FrameBox(captionRect_.left - 2, captionRect_.top - 1, textWidth_ + 4, textHeight_ + 2, 0xCC9999);
-            }
-            break;
-        case 6: {
-            DrawCaption(2);
-            const Rgb a = S(p.LightColor, 8);
-            DrawBevel(p.ShadowColor, a, p.ShadowColor, a, 0, false);
-            DrawFocus();
-            break;
-        }
-        case 7:
-        case 8:
-        case 12:
-            DrawCaption(2);
-            if (buttonType_ == 12) {
-                DrawBevel(p.DarkShadowColor, p.HighlightColor, p.ShadowColor, p.LightColor, 0, false);
-            } else {
-                DrawBevel(p.ShadowColor, p.HighlightColor, 0, 0, 0, true);
-            }
-            DrawFocus();
-            break;
-        case 9:
-            if (hover_) {
-                c.FillBox(0, 0, W, H,
-                          colorScheme_ == 2 ? S(p.AccentLightColor, -32) : BlendToWhite(p.AccentColor, 128));
-            }
-            DrawCaption(2);
-            c.FrameBox(0, 0, W, H, p.AccentColor);
-            DrawFocus();
-            break;
-        case 11:
-            DrawCaption(2);
-            DrawFocus();
-            break;
-        case 13:
-            c.DrawOval(0, 0, W, H, p.DarkShadowColor, S(p.FaceColor, -32));
-            DrawCaption(2);
-            break;
-        case 14:
-            c.FillBox(1, 1, W, H, S(p.FaceColor, -9));
-            c.FrameBox(0, 0, W, H, S(p.ShadowColor, -48));
-            c.DrawLine(2, H - 2, W - 2, H - 2, p.HighlightColor);
-            c.DrawLine(W - 2, 2, W - 2, H - 1, p.HighlightColor);
-            DrawCaption(7);
-            DrawFocus();
-            break;
-        default: break;
-    }
-}
-
-void KirelXPButton::DrawDisabled() {
-    const Palette& p = palette_;
-    const std::int32_t W = w_;
-    const std::int32_t H = h_;
-    Canvas& c = canvas_;
-    switch (buttonType_) {
-        case 1:
-            DrawCaption(3);
-            DrawBevel(p.HighlightColor, p.ShadowColor, p.HighlightColor, p.ShadowColor, -1, false);
-            c.FrameBox(0, 0, W, H, p.DarkShadowColor);
             break;
         case 2:
-            DrawCaption(3);
-            DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, 0, false);
+            if (face == Face::Up) {
+                DrawCaption(h);
+                if (IsDefault()) {
+                    DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, -1, false);
+                    DrawFocus();
+                    c.FrameBox(0, 0, W, H, p.DarkShadowColor);
+                } else {
+                    DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, 0, false);
+                }
+            } else if (face == Face::Pressed) {
+                DrawCaption(2);
+                if (IsDefault()) {
+                    c.FrameBox(0, 0, W, H, p.DarkShadowColor);
+                    c.FrameBox(1, 1, W - 2, H - 2, p.ShadowColor);
+                    DrawFocus();
+                } else {
+                    DrawBevel(p.DarkShadowColor, p.HighlightColor, p.ShadowColor, p.LightColor, 0, false);
+                }
+            } else {
+                DrawCaption(3);
+                DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, 0, false);
+            }
             break;
         case 3:
-            c.FillBox(0, 0, W, H, SB(p.BaseColor, -24));
-            DrawCaption(5);
-            c.FrameBox(0, 0, W, H, SB(p.BaseColor, -84));
-            Corners(SB(p.BaseColor, -72));
+            if (face == Face::Up) {
+                const Rgb b = p.BaseColor;
+                Gradient(b, 25, true, true);
+                DrawCaption(h);
+                c.FrameBox(0, 0, W, H, kXpBorder);
+                Corners(kXpCorner);
+                if (hover_) {
+                    c.FrameBox(1, 2, W - 2, H - 4, 0x31B2FF);
+                    c.DrawLine(2, H - 2, W - 2, H - 2, 0x0096E7);
+                    c.DrawLine(2, 1, W - 2, 1, 0xCEF3FF);
+                    c.DrawLine(1, 2, W - 1, 2, 0x8CDBFF);
+                    c.DrawLine(2, 3, 2, H - 3, 0x6BCBFF);
+                    c.DrawLine(W - 3, 3, W - 3, H - 3, 0x6BCBFF);
+                } else if ((hasFocus_ || host_.IsDefault()) && showFocusRect_) {
+                    c.FrameBox(1, 2, W - 2, H - 4, 0xE7AE8C);
+                    c.DrawLine(2, H - 2, W - 2, H - 2, 0xEF826B);
+                    c.DrawLine(2, 1, W - 2, 1, 0xFFE7CE);
+                    c.DrawLine(1, 2, W - 1, 2, 0xF7D7BD);
+                    c.DrawLine(2, 3, 2, H - 3, 0xF0D1B5);
+                    c.DrawLine(W - 3, 3, W - 3, H - 3, 0xF0D1B5);
+                } else {
+                    c.DrawLine(2, H - 2, W - 2, H - 2, SB(b, -48));
+                    c.DrawLine(1, H - 3, W - 2, H - 3, SB(b, -32));
+                    c.DrawLine(W - 2, 2, W - 2, H - 2, SB(b, -36));
+                    c.DrawLine(W - 3, 3, W - 3, H - 3, SB(b, -24));
+                    c.DrawLine(2, 1, W - 2, 1, SB(b, 16));
+                    c.DrawLine(1, 2, W - 2, 2, SB(b, 10));
+                    c.DrawLine(1, 2, 1, H - 2, SB(b, -5));
+                    c.DrawLine(2, 3, 2, H - 3, SB(b, -10));
+                }
+            } else if (face == Face::Pressed) {
+                const Rgb q = SB(p.BaseColor, -32);
+                Gradient(q, 25, false, true);
+                DrawCaption(2);
+                c.FrameBox(0, 0, W, H, kXpBorder);
+                Corners(kXpCorner);
+                c.DrawLine(2, H - 2, W - 2, H - 2, SB(q, 16));
+                c.DrawLine(1, H - 3, W - 2, H - 3, SB(q, 10));
+                c.DrawLine(W - 2, 2, W - 2, H - 2, SB(q, 5));
+                c.DrawLine(W - 3, 3, W - 3, H - 3, p.BaseColor);
+                c.DrawLine(2, 1, W - 2, 1, SB(q, -32));
+                c.DrawLine(1, 2, W - 2, 2, SB(q, -24));
+                c.DrawLine(1, 2, 1, H - 2, SB(q, -32));
+                c.DrawLine(2, 2, 2, H - 2, SB(q, -22));
+            } else {
+                c.FillBox(0, 0, W, H, SB(p.BaseColor, -24));
+                DrawCaption(5);
+                c.FrameBox(0, 0, W, H, SB(p.BaseColor, -84));
+                Corners(SB(p.BaseColor, -72));
+            }
             break;
-        case 4: {
-            // As up, with the engraved caption.
-            c.FillBox(1, 1, W - 2, H - 2, p.LightColor);
-            DrawCaption(3);
-            c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-            Corners(p.DarkShadowColor);
-            c.DrawLine(1, 2, 2, 0, p.FaceColor);
-            c.DrawLine(3, 2, W - 3, 2, p.HighlightColor);
-            c.DrawLine(2, 2, 2, H - 3, p.HighlightColor);
-            c.PutPixel(3, 3, p.HighlightColor);
-            c.DrawLine(W - 3, 1, W - 3, H - 3, p.FaceColor);
-            c.DrawLine(1, H - 3, W - 3, H - 3, p.FaceColor);
-            c.PutPixel(W - 4, H - 4, p.FaceColor);
-            c.DrawLine(W - 2, 2, W - 2, H - 2, p.ShadowColor);
-            c.DrawLine(2, H - 2, W - 2, H - 2, p.ShadowColor);
-            c.PutPixel(W - 3, H - 3, p.ShadowColor);
+        case 4:
+            if (face == Face::Up) {
+                c.FillBox(1, 1, W - 2, H - 2, p.LightColor);
+                DrawCaption(h);
+                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
+                Corners(p.DarkShadowColor);
+                c.DrawLine(1, 2, 2, 0, p.FaceColor);
+                c.DrawLine(3, 2, W - 3, 2, p.HighlightColor);
+                c.DrawLine(2, 2, 2, H - 3, p.HighlightColor);
+                c.PutPixel(3, 3, p.HighlightColor);
+                c.DrawLine(W - 3, 1, W - 3, H - 3, p.FaceColor);
+                c.DrawLine(1, H - 3, W - 3, H - 3, p.FaceColor);
+                c.PutPixel(W - 4, H - 4, p.FaceColor);
+                c.DrawLine(W - 2, 2, W - 2, H - 2, p.ShadowColor);
+                c.DrawLine(2, H - 2, W - 2, H - 2, p.ShadowColor);
+                c.PutPixel(W - 3, H - 3, p.ShadowColor);
+            } else if (face == Face::Pressed) {
+                const Rgb f = S(p.ShadowColor, -16);
+                c.FillBox(1, 1, W - 2, H - 2, f);
+                palette_.BaseColor = f;
+                DrawCaption(2);
+                palette_.BaseColor = S(p.FaceColor, 48);
+                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
+                c.FrameBox(1, 1, W - 2, H - 2, S(p.ShadowColor, -64));
+                c.FrameBox(2, 2, W - 4, H - 4, S(p.ShadowColor, -32));
+                c.PutPixel(2, 2, S(p.ShadowColor, -64));
+                c.PutPixel(3, 3, S(p.ShadowColor, -32));
+                Corners(p.DarkShadowColor);
+                c.DrawLine(W - 3, 1, W - 3, H - 3, p.ShadowColor);
+                c.DrawLine(1, H - 3, W - 2, H - 3, p.ShadowColor);
+                c.PutPixel(W - 4, H - 4, p.ShadowColor);
+                c.DrawLine(W - 2, 3, W - 2, H - 2, f);
+                c.DrawLine(3, H - 2, W - 2, H - 2, f);
+                c.DrawLine(W - 2, H - 3, W - 4, H - 1, S(p.ShadowColor, -32));
+                c.PutPixel(2, H - 2, S(p.ShadowColor, -32));
+                c.PutPixel(W - 2, 2, S(p.ShadowColor, -32));
+            } else {
+                // As up, with the engraved caption.
+                c.FillBox(1, 1, W - 2, H - 2, p.LightColor);
+                DrawCaption(3);
+                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
+                Corners(p.DarkShadowColor);
+                c.DrawLine(1, 2, 2, 0, p.FaceColor);
+                c.DrawLine(3, 2, W - 3, 2, p.HighlightColor);
+                c.DrawLine(2, 2, 2, H - 3, p.HighlightColor);
+                c.PutPixel(3, 3, p.HighlightColor);
+                c.DrawLine(W - 3, 1, W - 3, H - 3, p.FaceColor);
+                c.DrawLine(1, H - 3, W - 3, H - 3, p.FaceColor);
+                c.PutPixel(W - 4, H - 4, p.FaceColor);
+                c.DrawLine(W - 2, 2, W - 2, H - 2, p.ShadowColor);
+                c.DrawLine(2, H - 2, W - 2, H - 2, p.ShadowColor);
+                c.PutPixel(W - 3, H - 3, p.ShadowColor);
+            }
             break;
-        }
         case 5:
-            DrawCaption(4);
-            c.FrameBox(0, 0, W, H, p.ShadowColor);
+            if (face == Face::Up) {
+                c.FillBox(1, 1, W - 1, H - 1, S(p.FaceColor, 12));
+                DrawCaption(h);
+                c.FrameBox(1, 1, W - 1, H - 1, p.HighlightColor);
+                c.FrameBox(0, 0, W - 1, H - 1, S(p.ShadowColor, -26));
+                c.PutPixel(1, H - 2, S(p.ShadowColor, 26));
+                c.PutPixel(W - 2, 1, S(p.ShadowColor, 26));
+                if (hasFocus_ && showFocusRect_) {
+                    c.FrameBox(captionRect_.left - 2, captionRect_.top - 1, textWidth_ + 4, textHeight_ + 2, 0xCC9999);
+                }
+            } else if (face == Face::Pressed) {
+                c.FillBox(1, 1, W - 2, H - 2, S(p.ShadowColor, 16));
+                c.FrameBox(0, 0, W - 1, H - 1, S(p.ShadowColor, -26));
+                c.DrawLine(W - 1, 1, W - 1, H, p.HighlightColor);
+                c.DrawLine(1, H - 1, W - 1, H - 1, p.HighlightColor);
+                Text(captionRect_, p.TextOverColor);
+                if (hasFocus_ && showFocusRect_) {
+                    c.FrameBox(captionRect_.left - 2, captionRect_.top - 1, textWidth_ + 4, textHeight_ + 2, 0xCC9999);
+                }
+            } else {
+                DrawCaption(4);
+                c.FrameBox(0, 0, W, H, p.ShadowColor);
+            }
             break;
-        case 6: {
-            DrawCaption(4);
-            const Rgb a = S(p.LightColor, 8);
-            DrawBevel(a, p.ShadowColor, a, p.ShadowColor, 0, false);
+        case 6:
+            if (face == Face::Up) {
+                DrawCaption(h);
+                const Rgb a = S(p.LightColor, 8);
+                DrawBevel(a, p.ShadowColor, a, p.ShadowColor, 0, false);
+                DrawFocus();
+            } else if (face == Face::Pressed) {
+                DrawCaption(2);
+                const Rgb a = S(p.LightColor, 8);
+                DrawBevel(p.ShadowColor, a, p.ShadowColor, a, 0, false);
+                DrawFocus();
+            } else {
+                DrawCaption(4);
+                const Rgb a = S(p.LightColor, 8);
+                DrawBevel(a, p.ShadowColor, a, p.ShadowColor, 0, false);
+            }
             break;
-        }
         case 7:
         case 8:
         case 12:
-            DrawCaption(3);
-            if (buttonType_ == 7) DrawBevel(p.HighlightColor, p.ShadowColor, 0, 0, 0, true);
+            if (face == Face::Up) {
+                DrawCaption(h);
+                if (buttonType_ == 7 || (buttonType_ == 8 && hover_)) {
+                    DrawBevel(p.HighlightColor, p.ShadowColor, 0, 0, 0, true);
+                } else if (buttonType_ == 12 && hover_) {
+                    DrawBevel(p.HighlightColor, p.DarkShadowColor, p.LightColor, p.ShadowColor, 0, false);
+                }
+                DrawFocus();
+            } else if (face == Face::Pressed) {
+                DrawCaption(2);
+                if (buttonType_ == 12) {
+                    DrawBevel(p.DarkShadowColor, p.HighlightColor, p.ShadowColor, p.LightColor, 0, false);
+                } else {
+                    DrawBevel(p.ShadowColor, p.HighlightColor, 0, 0, 0, true);
+                }
+                DrawFocus();
+            } else {
+                DrawCaption(3);
+                if (buttonType_ == 7) DrawBevel(p.HighlightColor, p.ShadowColor, 0, 0, 0, true);
+            }
             break;
-        case 9: DrawCaption(4); break;
+        case 9:
+            if (face == Face::Up) {
+                if (hover_) c.FillBox(1, 1, W, H, p.AccentLightColor);
+                DrawCaption(h);
+                if (hover_) c.FrameBox(0, 0, W, H, p.AccentColor);
+                DrawFocus();
+            } else if (face == Face::Pressed) {
+                if (hover_) {
+                    c.FillBox(0, 0, W, H,
+                              colorScheme_ == 2 ? S(p.AccentLightColor, -32) : BlendToWhite(p.AccentColor, 128));
+                }
+                DrawCaption(2);
+                c.FrameBox(0, 0, W, H, p.AccentColor);
+                DrawFocus();
+            } else {
+                DrawCaption(4);
+            }
+            break;
         case 11:
-        case 13: DrawCaption(3); break;
+            if (face == Face::Up) {
+                DrawCaption(h);
+                DrawFocus();
+            } else if (face == Face::Pressed) {
+                DrawCaption(2);
+                DrawFocus();
+            } else {
+                DrawCaption(3);
+            }
+            break;
+        case 13:
+            if (face == Face::Up) {
+                c.DrawOval(0, 0, W, H, hover_ ? p.ShadowColor : p.FaceColor, p.FaceColor);
+                DrawCaption(h);
+            } else if (face == Face::Pressed) {
+                c.DrawOval(0, 0, W, H, p.DarkShadowColor, S(p.FaceColor, -32));
+                DrawCaption(2);
+            } else {
+                DrawCaption(3);
+            }
+            break;
         case 14:
-            Gradient(p.HighlightColor, 58, true, false);
-            c.FrameBox(0, 0, W, H, S(p.ShadowColor, -50));
-            c.FrameBox(1, 1, W - 2, H - 2, S(p.FaceColor, -9));
-            c.FillBox(2, 2, W - 4, 2, p.HighlightColor);
-            c.FillBox(2, 4, 2, H - 6, p.HighlightColor);
-            DrawCaption(6);
+            if (face == Face::Up) {
+                if (hover_) {
+                    c.FillBox(0, 0, W, H, p.LightColor);
+                } else {
+                    Gradient(p.HighlightColor, 58, true, false);
+                }
+                if (host_.IsDefault()) {
+                    // The default button's caption is bold; the font changes must not repaint.
+                    paintingEnabled_ = false;
+                    const bool keptBold = FontBold();
+                    SetFontBold(true);
+                    DrawCaption(h);
+                    SetFontBold(keptBold);
+                    paintingEnabled_ = true;
+                } else {
+                    DrawCaption(h);
+                }
+                c.FrameBox(0, 0, W, H, S(p.ShadowColor, -50));
+                c.FrameBox(1, 1, W - 2, H - 2, S(p.FaceColor, -9));
+                c.FillBox(2, 2, W - 4, 2, p.HighlightColor);
+                c.FillBox(2, 4, 2, H - 6, p.HighlightColor);
+                DrawFocus();
+            } else if (face == Face::Pressed) {
+                c.FillBox(1, 1, W, H, S(p.FaceColor, -9));
+                c.FrameBox(0, 0, W, H, S(p.ShadowColor, -48));
+                c.DrawLine(2, H - 2, W - 2, H - 2, p.HighlightColor);
+                c.DrawLine(W - 2, 2, W - 2, H - 1, p.HighlightColor);
+                DrawCaption(7);
+                DrawFocus();
+            } else {
+                Gradient(p.HighlightColor, 58, true, false);
+                c.FrameBox(0, 0, W, H, S(p.ShadowColor, -50));
+                c.FrameBox(1, 1, W - 2, H - 2, S(p.FaceColor, -9));
+                c.FillBox(2, 2, W - 4, 2, p.HighlightColor);
+                c.FillBox(2, 4, 2, H - 6, p.HighlightColor);
+                DrawCaption(6);
+            }
             break;
         default: break;
     }
