@@ -62,4 +62,20 @@ private:
     HDC dc_;
 };
 
+// BeginPaint on construction, EndPaint on scope exit: a WM_PAINT handler's device context.
+class PaintGuard {
+public:
+    explicit PaintGuard(HWND hwnd) : hwnd_(hwnd), dc_(::BeginPaint(hwnd, &paint_)) {}
+    PaintGuard(const PaintGuard&) = delete;
+    PaintGuard& operator=(const PaintGuard&) = delete;
+    ~PaintGuard() { ::EndPaint(hwnd_, &paint_); }
+    HDC dc() const { return dc_; }
+    const RECT& area() const { return paint_.rcPaint; }
+
+private:
+    HWND hwnd_;
+    PAINTSTRUCT paint_{};
+    HDC dc_;
+};
+
 }  // namespace vantorel::win32
