@@ -70,17 +70,55 @@ void BM_LoadDefinitions(benchmark::State& state) {
 }
 BENCHMARK(BM_LoadDefinitions)->Unit(benchmark::kMillisecond)->Iterations(10);
 
+// Files that are not lists: 20 MB of bare line feeds, and 20 MB of short lines that are not keys.
+// Load time, and memory held per byte of file (heap bytes of the list; resident growth in a fresh
+// process below).
+const std::string& JunkFile(int kind) {
+    static std::string paths[2];
+    std::string& path = paths[kind];
+    if (path.empty()) {
+        path = "/tmp/vantorel-bench-junk" + std::to_string(kind) + ".def";
+        std::ofstream out(path, std::ios::binary);
+        const std::string line = kind == 0 ? "\n" : "x\n";
+        for (std::size_t bytes = 0; bytes < (20u << 20); bytes += line.size()) out << line;
+    }
+    return path;
+}
+
+void BM_LoadJunk(benchmark::State& state) {
+    const std::string& path = JunkFile(static_cast<int>(state.range(0)));
+    vantorel::platform::StdFiles files;
+    std::string text;
+    files.ReadAll(path, text);
+    std::size_t bytes = 0;
+    for (auto _ : state) {
+        vantorel::DefinitionList list = vantorel::DefinitionList::FromText(text);
+        bytes = list.MemoryBytes();
+        benchmark::DoNotOptimize(list);
+    }
+    state.counters["heap_bytes_per_file_byte"] = static_cast<double>(bytes) / static_cast<double>(text.size());
+    state.SetLabel(state.range(0) == 0 ? "bare line feeds" : "lines that are not keys");
+}
+BENCHMARK(BM_LoadJunk)->Arg(0)->Arg(1)->Unit(benchmark::kMillisecond)->Iterations(3);
+
 // Resident memory is measured in a fresh process (this program started again with
 // --resident-check), so memory that other benchmarks freed cannot hide the cost: resident size
 // after loading, with the file text released, minus before.
-int ResidentCheck(const char* path) {
+int ResidentCheck(const char* path, bool perFileByte) {
     vantorel::platform::StdFiles files;
     long before = ResidentBytes();
     vantorel::DefinitionList list;
+    double fileBytes = 0, peak = 0;
     {
         std::string text;
         files.ReadAll(path, text);
+        fileBytes = static_cast<double>(text.size());
         list = vantorel::DefinitionList::FromText(text);
+        peak = static_cast<double>(ResidentBytes() - before);
+    }
+    if (perFileByte) {
+        std::printf("%f %f\n", peak / fileBytes, static_cast<double>(ResidentBytes() - before) / fileBytes);
+        return 0;
     }
     std::printf("%f %f\n", static_cast<double>(ResidentBytes() - before) / list.size(),
                 static_cast<double>(list.MemoryBytes()) / list.size());
@@ -102,6 +140,23 @@ void BM_ResidentBytesPerKey(benchmark::State& state) {
     }
 }
 BENCHMARK(BM_ResidentBytesPerKey)->Iterations(1)->Unit(benchmark::kMillisecond);
+
+// The same for 20 MB of bare line feeds, per byte of file: peak (the file text included) and held.
+void BM_ResidentBytesPerJunkByte(benchmark::State& state) {
+    const std::string& path = JunkFile(0);
+    for (auto _ : state) {
+        char self[4096] = {0};
+        if (readlink("/proc/self/exe", self, sizeof self - 1) <= 0) state.SkipWithError("readlink");
+        std::string command = std::string(self) + " --resident-check " + path + " bytes";
+        std::FILE* child = popen(command.c_str(), "r");
+        double peak = 0, held = 0;
+        if (child == nullptr || std::fscanf(child, "%lf %lf", &peak, &held) != 2) state.SkipWithError("child");
+        if (child != nullptr) pclose(child);
+        state.counters["peak_bytes_per_file_byte"] = peak;
+        state.counters["held_bytes_per_file_byte"] = held;
+    }
+}
+BENCHMARK(BM_ResidentBytesPerJunkByte)->Iterations(1)->Unit(benchmark::kMillisecond);
 
 // Lookups of row keys: half listed, half not, in random order.
 template <bool kBaseline>
@@ -146,7 +201,7 @@ BENCHMARK(BM_Lookup<true>)->Name("BM_Lookup/text_baseline")->Arg(0)->Arg(50)->Ar
 }  // namespace
 
 int main(int argc, char** argv) {
-    if (argc == 3 && std::string(argv[1]) == "--resident-check") return ResidentCheck(argv[2]);
+    if (argc >= 3 && std::string(argv[1]) == "--resident-check") return ResidentCheck(argv[2], argc == 4);
     benchmark::Initialize(&argc, argv);
     benchmark::RunSpecifiedBenchmarks();
     benchmark::Shutdown();

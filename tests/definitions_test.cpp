@@ -124,6 +124,7 @@ TEST(DefinitionList, IndexAnswersExactlyAsTheHalvingSearch) {
             if (random() % 5 == 0) value = static_cast<std::int32_t>(random());
             lines.push_back(std::to_string(value));
             if (random() % 40 == 0) lines.push_back(random() % 2 ? "0042" : " 7");
+            if (random() % 20 == 0) lines.push_back("");
         }
         std::sort(lines.begin(), lines.end());
         std::string text;
@@ -131,6 +132,7 @@ TEST(DefinitionList, IndexAnswersExactlyAsTheHalvingSearch) {
         text.pop_back();
         // The normalised last piece may change the last line; sort order must still hold.
         DefinitionList list = DefinitionList::FromText(text);
+        ASSERT_EQ(Elements(list), Split(text, "\n")) << "every line as the splitter gives it";
         if (!list.sorted()) continue;
         for (std::int32_t probe = -40; probe <= 40; ++probe) {
             char buffer[12];
@@ -202,6 +204,14 @@ TEST(DefinitionList, StaysSmallInMemory) {
     EXPECT_EQ(list.size(), 100000u);
     EXPECT_TRUE(list.sorted());
     EXPECT_LE(list.MemoryBytes(), 16u * list.size());
+
+    // Blank lines cost next to nothing, other lines little more than their bytes.
+    DefinitionList blanks = DefinitionList::FromText(std::string(1u << 20, '\n'));
+    EXPECT_EQ(blanks.size(), 1u << 20);
+    EXPECT_LE(blanks.MemoryBytes(), (1u << 20) / 2);
+    std::string odd;
+    for (int i = 0; i < 100000; ++i) odd += i % 2 ? "x\n" : "1\n";
+    EXPECT_LE(DefinitionList::FromText(odd).MemoryBytes(), 4 * odd.size());
 }
 
 }  // namespace

@@ -162,6 +162,35 @@ TEST(FrmMainButtons, EachIndexDoesItsOwnAction) {
     EXPECT_TRUE(rig.shell.boxes.empty());
 }
 
+TEST(FrmMainButtons, AModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
+    MainRig rig;
+    rig.Put(platform::kHkeyCurrentUser, "State", "1");
+    rig.Start();
+    rig.table.rows = {Row(5, Ipv4(9, 9, 9, 9)), Row(5, Ipv4(1, 2, 3, 4)), Row(5, Ipv4(8, 8, 8, 8))};
+    // The click on "&Options" reaches the window while the first sweep lets messages run; the
+    // options window's own loop then ticks three times while it is open, and a tick the held sweep's
+    // yield takes itself is still dropped.
+    rig.pump.onPump = [&] {
+        if (rig.pump.pumps == 1) rig.btnO[kBtnOptions].UserClick();
+        if (rig.pump.pumps == 2) rig.pump.OwnTick([&] { rig.form.TmrTick(); });
+    };
+    std::vector<std::int32_t> counts;
+    rig.application.onOptions = [&] {
+        for (int tick = 0; tick < 3; ++tick) {
+            rig.form.TmrTick();
+            counts.push_back(rig.form.guard().AttemptCount());
+        }
+    };
+    rig.form.TmrTick();
+    EXPECT_EQ(counts, (std::vector<std::int32_t>{1, 2, 3})) << "each tick tears the listed row down";
+    EXPECT_EQ(rig.form.guard().SweepsRun(), 4u);
+    EXPECT_EQ(rig.table.fetches, 4);
+    EXPECT_EQ(rig.form.guard().AttemptCount(), 3) << "the held sweep never looks at another row";
+    EXPECT_FALSE(rig.form.guard().Sweeping());
+    rig.form.TmrTick();
+    EXPECT_EQ(rig.form.guard().AttemptCount(), 4);
+}
+
 TEST(FrmMainUnload, ExitRemovesTheIconStopsBothTimersThenEndsOnce) {
     MainRig rig;
     rig.Put(platform::kHkeyCurrentUser, "State", "1");

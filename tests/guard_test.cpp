@@ -224,7 +224,7 @@ TEST(TmrTick, SweepsNeverNestAndSwitchingOffLetsTheRunFinish) {
         ++nestedTicks;
         EXPECT_TRUE(rig.guard.Sweeping());
         EXPECT_EQ(rig.guard.Sweep().LastSweep().rows, 0u) << "a sweep under way is not reported yet";
-        rig.guard.TmrTick();
+        rig.pump.OwnTick([&] { rig.guard.TmrTick(); });
         if (rig.pump.pumps == 1) rig.Click();
     };
     rig.guard.TmrTick();

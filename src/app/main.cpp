@@ -151,11 +151,6 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     report();
 
     MSG message;
-    while (::GetMessageA(&message, nullptr, 0, 0) > 0) {
-        // Tab, the arrow keys and the access keys of the window's buttons.
-        if (window.Hwnd() != nullptr && ::IsDialogMessageA(window.Hwnd(), &message)) continue;
-        ::TranslateMessage(&message);
-        ::DispatchMessageA(&message);
-    }
+    while (::GetMessageA(&message, nullptr, 0, 0) > 0) win32::DispatchQueuedMessage(message);
     return static_cast<int>(message.wParam);
 }

@@ -273,6 +273,15 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             if (handlers_.close) handlers_.close();
             else Destroy();
             return 0;
+        case WM_QUERYENDSESSION:
+            return TRUE;  // the user is logging off or the system shuts down: nothing holds it up
+        case WM_ENDSESSION:
+            // The session ends once this returns: the same unload as "&Exit", now.
+            if (wParam != FALSE) {
+                if (handlers_.close) handlers_.close();
+                else Destroy();
+            }
+            return 0;
         case WM_DESTROY:
             destroying_ = true;
             if (handlers_.unload) handlers_.unload();

@@ -157,9 +157,7 @@ void OptionsWindow::ShowModal() {
             break;
         }
         if (got == -1) break;
-        if (hwnd_ != nullptr && ::IsDialogMessageA(hwnd_, &msg)) continue;
-        ::TranslateMessage(&msg);
-        ::DispatchMessageA(&msg);
+        DispatchQueuedMessage(msg);
     }
     if (ownerWasEnabled) {
         ::EnableWindow(owner_, TRUE);

@@ -196,51 +196,81 @@ std::string_view FormatKey(std::int32_t key, char* buffer) {
     return std::string_view(buffer, length);
 }
 
-DefinitionList DefinitionList::FromText(std::string_view text) {
-    DefinitionList list;
-    std::string_view separator = ChooseSeparator(text);
-    std::size_t lines = 1;
-    if (!text.empty()) {
-        for (std::size_t p = text.find(separator); p != std::string_view::npos; p = text.find(separator, p + 1))
-            ++lines;
+void DefinitionList::LineBits::Count() {
+    before.resize(words.size());
+    std::uint32_t count = 0;
+    for (std::size_t i = 0; i < words.size(); ++i) {
+        before[i] = count;
+        count += static_cast<std::uint32_t>(__builtin_popcountll(words[i]));
     }
-    list.values_.reserve(lines);
+}
 
-    std::string_view previousView;  // the previous line, for the order check
-    bool havePrevious = false;
-    auto add = [&](std::string_view line) {
-        std::int32_t key = 0;
-        if (!ParseCanonicalKey(line, key)) {
-            list.odd_.emplace_back(static_cast<std::uint32_t>(list.values_.size()), std::string(line));
-            key = 0;
-        }
-        list.values_.push_back(key);
-        if (havePrevious && previousView.compare(line) > 0) list.sorted_ = false;
-        previousView = line;
-        havePrevious = true;
+std::size_t DefinitionList::LineBits::Rank(std::size_t line) const {
+    std::uint64_t below = words[line / 64] & ((std::uint64_t{1} << (line % 64)) - 1);
+    return before[line / 64] + static_cast<std::size_t>(__builtin_popcountll(below));
+}
+
+DefinitionList DefinitionList::FromText(std::string_view text) {
+    std::string_view separator = ChooseSeparator(text);
+    // Every line in file order, the last piece normalised as the splitter does (a text without any
+    // separator is one line, as it stands).
+    auto forEachLine = [&](auto&& onLine) {
+        bool any = false;
+        SplitPieces(text, separator, [&](std::string_view piece, bool last) {
+            if (!last || !any) {
+                onLine(piece);
+                any = true;
+            } else if (auto number = ReadLeadingNumber(piece)) {
+                onLine(std::string_view(*number));
+            }
+        });
     };
+    // The pieces are counted first (no parsing): room for every line's bits and for a key on every
+    // line that is not blank, given back at the end when other lines took much of it.
+    std::size_t pieces = 0, blanks = 0;
     SplitPieces(text, separator, [&](std::string_view piece, bool last) {
-        if (!last) {
-            add(piece);
-        } else if (!havePrevious) {
-            add(piece);
-        } else if (auto number = ReadLeadingNumber(piece)) {
-            add(*number);
-        }
+        ++pieces;
+        if (piece.empty() && !last) ++blanks;
     });
-    list.values_.shrink_to_fit();
-    list.odd_.shrink_to_fit();
+    DefinitionList list;
+    list.blank_.Resize(pieces);
+    list.odd_.Resize(pieces);
+    list.keys_.reserve(pieces - blanks);
+    std::string_view previous;  // the previous line, for the order check
+    std::size_t position = 0;
+    forEachLine([&](std::string_view line) {
+        if (position > 0 && previous.compare(line) > 0) list.sorted_ = false;
+        previous = line;
+        std::int32_t key = 0;
+        if (line.empty()) {
+            list.blank_.Set(position);
+        } else if (ParseCanonicalKey(line, key)) {
+            list.keys_.push_back(key);
+        } else {
+            list.odd_.Set(position);
+            list.oddText_.append(line);
+            list.oddEnds_.push_back(static_cast<std::uint32_t>(list.oddText_.size()));
+        }
+        ++position;
+    });
+    list.lines_ = position;
+    if (list.keys_.capacity() > list.keys_.size() + list.keys_.size() / 8 + 64) list.keys_.shrink_to_fit();
+    list.oddText_.shrink_to_fit();
+    list.oddEnds_.shrink_to_fit();
+    list.blank_.Count();
+    list.odd_.Count();
     list.BuildIndex();
     return list;
 }
 
 std::string_view DefinitionList::TextAt(std::size_t position, char* buffer) const {
-    if (!odd_.empty()) {
-        auto it = std::lower_bound(odd_.begin(), odd_.end(), position,
-                                   [](const auto& entry, std::size_t p) { return entry.first < p; });
-        if (it != odd_.end() && it->first == position) return it->second;
+    if (blank_.Test(position)) return {};
+    if (odd_.Test(position)) {
+        std::size_t k = odd_.Rank(position);
+        std::size_t begin = k == 0 ? 0 : oddEnds_[k - 1];
+        return std::string_view(oddText_).substr(begin, oddEnds_[k] - begin);
     }
-    return FormatKey(values_[position], buffer);
+    return FormatKey(keys_[position - blank_.Rank(position) - odd_.Rank(position)], buffer);
 }
 
 std::string DefinitionList::at(std::size_t position) const {
@@ -249,9 +279,9 @@ std::string DefinitionList::at(std::size_t position) const {
 }
 
 std::int32_t DefinitionList::FindText(std::string_view key) const {
-    if (values_.empty()) return kNoDefinition;
+    if (lines_ == 0) return kNoDefinition;
     std::int64_t lo = 0;
-    std::int64_t hi = static_cast<std::int64_t>(values_.size()) - 1;
+    std::int64_t hi = static_cast<std::int64_t>(lines_) - 1;
     char buffer[12];
     while (lo <= hi) {
         std::int64_t mid = (lo + hi) / 2;
@@ -278,25 +308,27 @@ std::pair<std::size_t, std::size_t> DefinitionList::SlotOf(std::int32_t key) con
 }
 
 void DefinitionList::BuildIndex() {
-    std::size_t keys = values_.size() - odd_.size();
-    buckets_.assign(keys / 6 + 1, Bucket{});  // at most 6 of 8 slots filled on average
+    // Room for the distinct keys: a sorted file lists a repeated key on neighbouring lines, so
+    // counting the changes from one key to the next counts them (a file out of order only gets a
+    // roomier index).
+    std::size_t distinct = 0;
+    for (std::size_t k = 0; k < keys_.size(); ++k) distinct += k == 0 || keys_[k] != keys_[k - 1] ? 1 : 0;
+    buckets_.assign(distinct / 6 + 1, Bucket{});  // at most 6 of 8 slots filled on average
     std::vector<std::int32_t> repeated;
-    auto oddIt = odd_.begin();
-    for (std::size_t i = 0; i < values_.size(); ++i) {
-        if (oddIt != odd_.end() && oddIt->first == i) {
-            ++oddIt;
-            continue;
-        }
-        auto [b, slot] = SlotOf(values_[i]);
+    std::size_t k = 0;
+    for (std::size_t i = 0; i < lines_; ++i) {
+        if (blank_.Test(i) || odd_.Test(i)) continue;
+        const std::int32_t key = keys_[k++];
+        auto [b, slot] = SlotOf(key);
         Bucket& bucket = buckets_[b];
         if (bucket.positionsPlusOne[slot] == 0) {
-            bucket.keys[slot] = values_[i];
+            bucket.keys[slot] = key;
             bucket.positionsPlusOne[slot] = static_cast<std::uint32_t>(i + 1);
-        } else {
-            repeated.push_back(values_[i]);
+        } else if (sorted_ && (repeated.empty() || repeated.back() != key)) {
+            repeated.push_back(key);
         }
     }
-    if (sorted_ && !repeated.empty()) {
+    if (!repeated.empty()) {
         // A key listed on several lines: the halving search stops on one of them, not always the
         // first. Record where it stops so both searches answer alike.
         char buffer[12];
@@ -333,10 +365,8 @@ std::int32_t DefinitionList::FindKey(std::int32_t key) const {
 }
 
 std::size_t DefinitionList::MemoryBytes() const {
-    std::size_t bytes = values_.capacity() * sizeof(std::int32_t) + buckets_.capacity() * sizeof(Bucket) +
-                        odd_.capacity() * sizeof(odd_[0]);
-    for (const auto& entry : odd_) bytes += entry.second.capacity() > 15 ? entry.second.capacity() + 1 : 0;
-    return bytes;
+    return keys_.capacity() * sizeof(std::int32_t) + buckets_.capacity() * sizeof(Bucket) + blank_.Bytes() +
+           odd_.Bytes() + oddText_.capacity() + oddEnds_.capacity() * sizeof(std::uint32_t);
 }
 
 std::int32_t FindDefinition(const DefinitionList& list, std::string_view key) {

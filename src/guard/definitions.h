@@ -3,9 +3,10 @@
 // The file holds one key per line, each a connection's remote address field read as a signed
 // 32-bit integer and written in decimal, in ascending order by plain byte comparison. The list is
 // built once at start-up and searched by the connection sweep for every row it examines, so the
-// in-memory form is compact: canonical keys are kept as 32-bit integers in file order, the rare line
-// that is not a canonical key keeps its text, and a small open-addressing index answers a row key
-// in one or two cache lines. Lookups answer exactly as the halving search over the texts would on a
+// in-memory form is compact whatever the file holds: canonical keys are kept as 32-bit integers in
+// file order, a blank line costs two bits, the rare line that is not a canonical key keeps only its
+// bytes and a 4-byte end mark, and a small open-addressing index answers a row key in one or two
+// cache lines. Lookups answer exactly as the halving search over the texts would on a
 // correctly sorted file.
 #pragma once
 
@@ -80,8 +81,8 @@ public:
     // same elements as FastSplit with ChooseSeparator.
     static DefinitionList FromText(std::string_view text);
 
-    std::size_t size() const { return values_.size(); }
-    bool empty() const { return values_.empty(); }
+    std::size_t size() const { return lines_; }
+    bool empty() const { return lines_ == 0; }
 
     // The element at `position` as text.
     std::string at(std::size_t position) const;
@@ -112,14 +113,30 @@ private:
         std::uint32_t positionsPlusOne[kSlotsPerBucket];
     };
 
+    // One bit per line, with the count of set bits before every 64 lines.
+    struct LineBits {
+        std::vector<std::uint64_t> words;
+        std::vector<std::uint32_t> before;
+        void Resize(std::size_t lines) { words.assign((lines + 63) / 64, 0); }
+        void Set(std::size_t line) { words[line / 64] |= std::uint64_t{1} << (line % 64); }
+        void Count();
+        bool Test(std::size_t line) const { return (words[line / 64] >> (line % 64)) & 1; }
+        std::size_t Rank(std::size_t line) const;  // set bits before `line`
+        std::size_t Bytes() const { return words.capacity() * 8 + before.capacity() * 4; }
+    };
+
     std::string_view TextAt(std::size_t position, char* buffer) const;
     std::size_t BucketFor(std::int32_t key) const;
     // The key's slot, or the free slot where it belongs, as (bucket, index in the bucket).
     std::pair<std::size_t, std::size_t> SlotOf(std::int32_t key) const;
     void BuildIndex();
 
-    std::vector<std::int32_t> values_;                        // every line; 0 for the odd ones
-    std::vector<std::pair<std::uint32_t, std::string>> odd_;  // lines that are not canonical keys
+    std::size_t lines_ = 0;
+    std::vector<std::int32_t> keys_;       // the lines that are canonical keys, in file order
+    LineBits blank_;                       // empty lines
+    LineBits odd_;                         // other lines that are not canonical keys
+    std::string oddText_;                  // their bytes, one after the other
+    std::vector<std::uint32_t> oddEnds_;   // where each one ends in oddText_
     std::vector<Bucket> buckets_;
     bool sorted_ = true;
 };

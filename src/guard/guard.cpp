@@ -53,12 +53,7 @@ void Guard::Toggle() {
 }
 
 void Guard::TmrTick() {
-    if (sweeping_) return;
-    struct Running {
-        bool& flag;
-        explicit Running(bool& f) : flag(f) { flag = true; }
-        ~Running() { flag = false; }
-    } running(sweeping_);
+    if (sweep_.Running() && platform_.pump.InOwnTimerTick()) return;
     ++sweepsRun_;
     sweep_.SweepConnections();
 }

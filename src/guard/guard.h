@@ -67,8 +67,11 @@ public:
     // A click on the switch, after it flipped its own Value.
     void BtnOnOffClick() { Toggle(); }
 
-    // Tick of Tmr: one sweep. A tick that falls due while a sweep lets messages run is dropped, so
-    // sweeps never nest.
+    // Tick of Tmr: one sweep. A tick that the running sweep's own yield takes from the queue is
+    // dropped, so sweeps never nest. A tick taken by a loop running below that yield (a modal
+    // window or message box opened from a click the sweep let through) finds the sweep held up for
+    // as long as that window stays open: the held sweep gives way and a fresh one runs, so the guard
+    // keeps sweeping every 55 ms whatever window is open.
     void TmrTick();
 
     // Unload: both timers stop.
@@ -78,7 +81,7 @@ public:
     std::int32_t AttemptCount() const { return attemptCount_; }
 
     ConnectionSweep& Sweep() { return sweep_; }
-    bool Sweeping() const { return sweeping_; }
+    bool Sweeping() const { return sweep_.Running(); }
     std::uint64_t SweepsRun() const { return sweepsRun_; }
 
 private:
@@ -89,7 +92,6 @@ private:
     GuardView& view_;
     std::int32_t attemptCount_ = 0;
     ConnectionSweep sweep_;
-    bool sweeping_ = false;
     std::uint64_t sweepsRun_ = 0;
 };
 

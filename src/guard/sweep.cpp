@@ -49,12 +49,17 @@ void ConnectionSweep::Intercepted() {
 }
 
 void ConnectionSweep::SweepConnections() {
+    const std::uint64_t run = ++runs_;
+    running_ = true;
     current_ = SweepResult();
     std::uint32_t rows = FetchTable();
     current_.rows = rows;
     const auto* words = reinterpret_cast<const unsigned char*>(buffer_.data() + 1);
     for (std::uint32_t i = 0; i < rows; ++i) {
-        if (!services_.pump.YieldToMessages()) break;  // the program is quitting
+        bool carryOn = services_.pump.YieldToMessages();
+        // Taken over by a newer run: the buffer and the result are that run's now.
+        if (runs_ != run) return;
+        if (!carryOn) break;  // the program is quitting
         ++current_.examined;
         platform::TcpRow row;
         std::memcpy(&row, words + static_cast<std::size_t>(i) * sizeof row, sizeof row);
@@ -69,6 +74,7 @@ void ConnectionSweep::SweepConnections() {
         Intercepted();
     }
     last_ = current_;
+    running_ = false;
 }
 
 }  // namespace vantorel

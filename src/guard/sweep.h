@@ -50,8 +50,14 @@ public:
     // caller and grown here.
     ConnectionSweep(SweepServices services, const DefinitionList& definitions, std::int32_t& count);
 
-    // One run over the table.
+    // One run over the table. A run started while an earlier one is held in its yield (a modal
+    // window or message box opened by a message the yield let through, and still open) takes over:
+    // the earlier run stops where it stands when its yield returns and never looks at another row,
+    // so at most one run is ever at work.
     void SweepConnections();
+
+    // A run is under way and has not been taken over.
+    bool Running() const { return running_; }
 
     // The last sweep that ran to its end (a sweep under way is not reported until it ends).
     const SweepResult& LastSweep() const { return last_; }
@@ -69,6 +75,8 @@ private:
     const DefinitionList& definitions_;
     std::int32_t& count_;
     std::vector<std::uint32_t> buffer_;  // 32-bit words: the entry count, then the rows
+    std::uint64_t runs_ = 0;  // runs started: a run that finds it changed after a yield was taken over
+    bool running_ = false;
     SweepResult current_;  // the sweep under way
     SweepResult last_;
 };

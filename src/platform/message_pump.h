@@ -20,6 +20,12 @@ public:
     // queue less often than it is called (a message then waits a moment, never longer than a
     // millisecond or so). Same result as PumpMessages.
     virtual bool YieldToMessages() { return PumpMessages(); }
+
+    // True while the message being handled is a timer tick that this pump took from the queue
+    // itself. False for a tick taken by any other loop, including one running below a handler this
+    // pump called: a modal window or message box opened by a click let through in the middle of a
+    // sweep runs its own loop, and its ticks are not the pump's.
+    virtual bool InOwnTimerTick() const { return false; }
 };
 
 }  // namespace vantorel::platform

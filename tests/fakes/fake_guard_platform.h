@@ -160,8 +160,17 @@ public:
         if (onPump) onPump();
         return !quitting;
     }
+    // A tick the pump takes from the queue itself (a modal window's loop runs `tick` directly).
+    void OwnTick(const std::function<void()>& tick) {
+        bool was = ownTick;
+        ownTick = true;
+        tick();
+        ownTick = was;
+    }
+    bool InOwnTimerTick() const override { return ownTick; }
     std::function<void()> onPump;
     bool quitting = false;
+    bool ownTick = false;
     int pumps = 0;
 };
 

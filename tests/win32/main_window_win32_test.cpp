@@ -91,7 +91,11 @@ RECT ChildRect(HWND child, HWND relativeTo) {
     return r;
 }
 
-TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
+// Ended by a close request or by the end of the session (logging off, shutting down).
+class MainWindowWin32 : public ::testing::TestWithParam<UINT> {};
+INSTANTIATE_TEST_SUITE_P(EndedBy, MainWindowWin32, ::testing::Values(WM_CLOSE, WM_ENDSESSION));
+
+TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     win32::MainWindow window;
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
     const UINT dpi = window.Dpi();
@@ -169,6 +173,10 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     ::SendMessageA(window.BtnO(kBtnUpdates).hwnd(), BM_CLICK, 0, 0);
     ::SendMessageA(window.BtnO(kBtnOptions).hwnd(), BM_CLICK, 0, 0);
     EXPECT_EQ(application.frames, (std::vector<int>{1, 0}));
+    // Alt+O that the yield of a sweep lets through is handled as the main loop handles it.
+    ::PostMessageA(window.BtnO(kBtnTray).hwnd(), WM_SYSCHAR, 'o', 1 << 29);
+    EXPECT_TRUE(pump.PumpMessages());
+    EXPECT_EQ(application.frames, (std::vector<int>{1, 0, 0})) << "Alt+O presses \"&Options\"";
     ::SendMessageA(window.BtnO(kBtnTray).hwnd(), BM_CLICK, 0, 0);
     EXPECT_FALSE(window.Visible());
 
@@ -178,8 +186,15 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     pump.PumpMessages();
     EXPECT_FALSE(window.Visible()) << "minimising ends hidden";
 
-    // The close request: tray icon gone, timers stopped, the window destroyed once.
-    ::SendMessageA(hwnd, WM_CLOSE, 0, 0);
+    // The close request or the session's end: tray icon gone, timers stopped, the window destroyed once.
+    if (GetParam() == WM_ENDSESSION) {
+        EXPECT_EQ(::SendMessageA(hwnd, WM_QUERYENDSESSION, 0, 0), TRUE) << "the session may end";
+        ::SendMessageA(hwnd, WM_ENDSESSION, FALSE, 0);  // it did not end after all
+        EXPECT_EQ(application.ends, 0);
+        EXPECT_TRUE(window.Timer().Enabled());
+    }
+    ::SendMessageA(hwnd, GetParam(), GetParam() == WM_ENDSESSION, 0);
+    EXPECT_TRUE(form.Unloaded());
     EXPECT_EQ(application.ends, 1);
     EXPECT_FALSE(window.Timer().Enabled());
     EXPECT_EQ(window.Hwnd(), nullptr);

@@ -142,10 +142,15 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
             return 0;
         case WM_LBUTTONDOWN:
         case WM_RBUTTONDOWN:
-        case WM_MBUTTONDOWN: {
-            const std::int16_t b = message == WM_LBUTTONDOWN ? 1 : message == WM_RBUTTONDOWN ? 2 : 4;
+        case WM_MBUTTONDOWN:
+        case WM_RBUTTONDBLCLK:  // a quick second right or middle press is a press like any other
+        case WM_MBUTTONDBLCLK: {
+            const std::int16_t b = message == WM_LBUTTONDOWN ? 1
+                                   : message == WM_RBUTTONDOWN || message == WM_RBUTTONDBLCLK ? 2
+                                                                                              : 4;
             if (b == 1 && ::GetFocus() != hwnd_) ::SetFocus(hwnd_);
             ::SetCapture(hwnd_);
+            if (b == 1) leftPressed_ = true;
             button_->OnMouseDown(b, ShiftState(), x, y);
             return 0;
         }
@@ -153,12 +158,19 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
             doubleClicked_ = true;
             button_->OnDoubleClick();
             return 0;
+        case WM_CAPTURECHANGED:
+            // Another window took the mouse in the middle of a press: its release is no click.
+            if (reinterpret_cast<HWND>(lParam) != hwnd_) leftPressed_ = false;
+            return 0;
         case WM_MOUSEMOVE: button_->OnMouseMove(held(), ShiftState(), x, y); return 0;
         case WM_LBUTTONUP:
         case WM_RBUTTONUP:
         case WM_MBUTTONUP: {
             const std::int16_t b = message == WM_LBUTTONUP ? 1 : message == WM_RBUTTONUP ? 2 : 4;
             const bool captured = ::GetCapture() == hwnd_;
+            // A click needs the left press on this control, the mouse held by it since then.
+            const bool pressedHere = b == 1 && leftPressed_ && captured;
+            if (b == 1) leftPressed_ = false;
             if (captured) ::ReleaseCapture();
             RECT client;
             ::GetClientRect(hwnd_, &client);
@@ -167,7 +179,7 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
             button_->OnMouseUp(b, ShiftState(), x, y);
             // The click after a press and release on the control; the release that ends a double
             // click raises none.
-            if (b == 1 && inside && !doubleClicked_ && hwnd_) button_->OnClick();
+            if (pressedHere && inside && !doubleClicked_ && hwnd_) button_->OnClick();
             if (b == 1) doubleClicked_ = false;
             return 0;
         }
@@ -176,6 +188,16 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
             return DLGC_WANTARROWS | DLGC_BUTTON | (default_ ? DLGC_DEFPUSHBUTTON : DLGC_UNDEFPUSHBUTTON);
         case WM_KEYDOWN: button_->OnKeyDown(static_cast<std::int16_t>(wParam), ShiftState()); return 0;
         case WM_KEYUP: button_->OnKeyUp(static_cast<std::int16_t>(wParam), ShiftState()); return 0;
+        case WM_SYSKEYDOWN:
+        case WM_SYSKEYUP: {
+            // Keys pressed with Alt: the Alt bit from the message itself (posted keys leave the
+            // keyboard state alone); then the system's own handling (Alt+F4, Alt+Space, F10).
+            std::int16_t shift = ShiftState();
+            if (lParam & (1 << 29)) shift |= 4;
+            if (message == WM_SYSKEYDOWN) button_->OnKeyDown(static_cast<std::int16_t>(wParam), shift);
+            else button_->OnKeyUp(static_cast<std::int16_t>(wParam), shift);
+            break;
+        }
         case WM_CHAR: button_->OnKeyPress(static_cast<std::int16_t>(wParam)); return 0;
         case BM_CLICK: button_->OnAccessKey(); return 0;  // the caption's access key (IsDialogMessage)
         case WM_SETFOCUS: button_->OnGotFocus(); return 0;
@@ -277,9 +299,18 @@ void XPButtonWindow::Present() {
     if (hwnd_) ::UpdateWindow(hwnd_);
 }
 
-void XPButtonWindow::SetAccessKey(char) {
-    // IsDialogMessage finds the access key in the window text.
-    if (hwnd_) ::SetWindowTextA(hwnd_, button_->Caption().c_str());
+void XPButtonWindow::SetAccessKey(char key) {
+    // IsDialogMessage finds the access key in the window text by the system's rule, which skips
+    // every doubled "&&"; the control skips only the first, so where the two differ the control
+    // has no key ("A&&B &&C &D"). The window text is then the caption with every "&" doubled: it
+    // still reads as the caption, and the dialog finds no key in it either.
+    if (!hwnd_) return;
+    std::string text;
+    for (char c : button_->Caption()) {
+        text += c;
+        if (key == 0 && c == '&') text += '&';
+    }
+    ::SetWindowTextA(hwnd_, text.c_str());
 }
 
 std::int32_t XPButtonWindow::ScreenDpi() const {

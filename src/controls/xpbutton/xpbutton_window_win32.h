@@ -92,6 +92,7 @@ private:
     UniqueHfont font_;
     bool default_ = false;
     bool doubleClicked_ = false;
+    bool leftPressed_ = false;  // a left press on the control, the mouse captured since
     std::int32_t pointer_ = 0;
     platform::PicturePtr mouseIcon_;
 };

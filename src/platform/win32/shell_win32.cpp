@@ -75,10 +75,19 @@ bool Win32MessagePump::PumpMessages() {
             ::PostQuitMessage(static_cast<int>(message.wParam));
             return false;
         }
-        ::TranslateMessage(&message);
-        ::DispatchMessageA(&message);
+        const MSG* outer = dispatching_;
+        dispatching_ = &message;
+        DispatchQueuedMessage(message);
+        dispatching_ = outer;
     }
     return true;
+}
+
+void DispatchQueuedMessage(MSG& message) {
+    HWND root = message.hwnd != nullptr ? ::GetAncestor(message.hwnd, GA_ROOT) : nullptr;
+    if (root != nullptr && ::IsDialogMessageA(root, &message)) return;
+    ::TranslateMessage(&message);
+    ::DispatchMessageA(&message);
 }
 
 bool Win32Instance::PreviousInstance() {

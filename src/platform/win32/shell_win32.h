@@ -35,6 +35,12 @@ public:
                     std::uint32_t style) override;
 };
 
+// Handles one message taken from the queue, the same way in every loop of the program (the main
+// loop, the options window's loop and the yield of long work): the keyboard interface of the
+// top-level window the message is for (Tab, the arrow keys, Enter, Escape and the access keys of
+// its controls), otherwise translated and dispatched.
+void DispatchQueuedMessage(MSG& message);
+
 // Runs the messages waiting on this thread. WM_QUIT is put back for the main loop and ends all
 // further pumping.
 //
@@ -48,10 +54,12 @@ public:
     Win32MessagePump();
     bool PumpMessages() override;
     bool YieldToMessages() override;
+    bool InOwnTimerTick() const override { return dispatching_ != nullptr && dispatching_->message == WM_TIMER; }
     bool Quitting() const { return quitting_; }
 
 private:
     bool quitting_ = false;
+    const MSG* dispatching_ = nullptr;  // the message this pump is handling now (innermost call)
     long long yieldTicks_ = 0;  // performance-counter ticks between two looks at the queue
     long long lastLook_ = 0;
 };
