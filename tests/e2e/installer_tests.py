@@ -1,5 +1,6 @@
 #!/usr/bin/python3
-"""The setup program VTSetup.exe under Wine, in a fresh prefix, and publishing a release.
+"""The setup program VTSetup.exe under Wine, in a fresh prefix, and publishing a release with
+deploy/publish-release.
 
 Usage: installer_tests.py BUILD_DIR [unittest options]
 
@@ -108,12 +109,17 @@ class Setup(unittest.TestCase):
         SESSION.reg_add(HKCU_KEY, "Attempts", "42")
         SESSION.reg_add(HKLM_KEY, "Tray", "0")
         newer = b"16777343\r\n"
-        for defver, kept in ((b"99\r\n", True), (b" 0.5\r\n", False)):
+        # The second time with the updates window open, as after the update check fetched VTSetup.exe.
+        for defver, kept, updates_open in ((b"99\r\n", True, False), (b" 0.5\r\n", False, True)):
             with self.subTest(installed_defver=defver):
                 write(os.path.join(self.folder, "defver"), defver)
                 write(os.path.join(self.folder, "sw2.def"), newer)
                 first = SESSION.find(is_main, timeout=30)
                 self.assertIsNotNone(first, "the program runs")
+                if updates_open:
+                    button = next(c for c in SESSION.controls(first) if c.caption == "&Updates")
+                    SESSION.post(button, 0xF5)  # BM_CLICK
+                    self.assertIsNotNone(SESSION.find(lambda w: w.caption == "Updates" and w.visible))
                 self.assertEqual(SESSION.run_in_desktop(setup_exe() + " /S"), 0)
                 self.assertFalse(any(w.hwnd == first.hwnd for w in SESSION.windows()), "it was closed")
                 self.assertIsNotNone(SESSION.find(is_main, timeout=30), "and started again")
@@ -145,6 +151,34 @@ class Setup(unittest.TestCase):
         found = subprocess.run(["find", os.path.join(SESSION.prefix, "drive_c"), "-iname", "*vantorel*"],
                                capture_output=True, text=True).stdout
         self.assertEqual(found, "")
+
+
+class Publish(unittest.TestCase):
+    def test_a_release_goes_to_the_update_server_without_downgrades(self):
+        release = os.path.join(BUILD, "release")
+        with tempfile.TemporaryDirectory() as root:
+            vt = os.path.join(root, "vt")
+
+            def publish():
+                return subprocess.run([os.path.join(ROOT, "deploy", "publish-release"), release, root],
+                                      capture_output=True).returncode
+
+            self.assertEqual(publish(), 0)
+            names = ["VTSetup.exe", "defver", "mainver", "sw2.def"]
+            self.assertEqual(sorted(os.listdir(vt)), names)
+            self.assertEqual([read(os.path.join(vt, n)) for n in names], [read(os.path.join(release, n)) for n in names])
+            self.assertEqual(read(os.path.join(vt, "mainver")).strip().decode(), version())
+            write(os.path.join(vt, "defver"), b"25")  # definitions updated on the server since
+            write(os.path.join(vt, "sw2.def"), b"newer")
+            write(os.path.join(vt, "VTSetup.exe"), b"")
+            self.assertEqual(publish(), 0)
+            self.assertEqual(read(os.path.join(vt, "sw2.def")), b"newer")
+            self.assertEqual(os.path.getsize(os.path.join(vt, "VTSetup.exe")),
+                             os.path.getsize(os.path.join(release, "VTSetup.exe")))
+            write(os.path.join(vt, "mainver"), b"99.0")  # a newer program on the server
+            write(os.path.join(vt, "VTSetup.exe"), b"")
+            self.assertEqual(publish(), 1)
+            self.assertEqual(read(os.path.join(vt, "VTSetup.exe")), b"")
 
 
 if __name__ == "__main__":
