@@ -47,6 +47,7 @@ Var WasRunning
 ; Asks a running Vantorel to close (WM_CLOSE to its main window: it removes its tray icon, stops its
 ; timers and ends as when the user closes it) and waits until the process has gone, which the named
 ; mutex it holds for its whole life tells. Never kills it; after 30 s the user may retry or cancel.
+; $WasRunning: a window of the program was asked to close.
 !macro CLOSE_PROGRAM un
 Function ${un}CloseProgram
     Push $0
@@ -62,6 +63,7 @@ Function ${un}CloseProgram
             DetailPrint "Asking the running Vantorel to close"
             System::Call "user32::PostMessage(p r0, i ${WM_CLOSE}, p 0, p 0)"
             StrCpy $2 $0
+            StrCpy $WasRunning 1
         ${EndIf}
         ${If} $0 P= 0
             System::Call "kernel32::OpenMutex(i 0x00100000, i 0, t 'Vantorel') p .r0"
@@ -70,18 +72,17 @@ Function ${un}CloseProgram
             ${EndIf}
             System::Call "kernel32::CloseHandle(p r0)"
         ${EndIf}
-        StrCpy $WasRunning 1
         IntOp $1 $1 + 1
         ${If} $1 >= 120
             MessageBox MB_RETRYCANCEL|MB_ICONEXCLAMATION "Vantorel is still running. Close it, then click Retry." \
                 /SD IDCANCEL IDRETRY +2
             Abort "Vantorel is still running."
-            StrCpy $1 0
+            StrCpy $1 1
             StrCpy $2 0
         ${EndIf}
         Sleep 250
     ${Loop}
-    ${If} $WasRunning = 1
+    ${If} $1 > 0
         Sleep 500    ; the ended process's files are released
     ${EndIf}
     Pop $2

@@ -85,7 +85,13 @@ class Setup(unittest.TestCase):
 
     def test_1_silent_install(self):
         self.assertIn(b'level="requireAdministrator"', read(os.path.join(BUILD, "release", "VTSetup.exe")))
-        self.assertEqual(SESSION.run_in_desktop(setup_exe() + " /S"), 0)
+        # A program still running (its named mutex held) without a window: the setup waits for its end.
+        with tempfile.TemporaryFile() as said:
+            holder = subprocess.Popen(["wine", os.path.join(BUILD, "vtprobe.exe"), "hold", "Vantorel", "3000"],
+                                      env=SESSION.env, stdin=subprocess.DEVNULL, stdout=said, stderr=subprocess.DEVNULL)
+            self.assertTrue(wait_for(lambda: said.seek(0) == 0 and b"held" in said.read()))
+            self.assertEqual(SESSION.run_in_desktop(setup_exe() + " /S"), 0)
+            self.assertIsNotNone(holder.poll(), "the setup returned after the program had ended")
         self.assertEqual(sorted(os.listdir(self.folder)), ["defver", "sw2.def", "uninstall.exe", "vantorel.exe"])
         self.assertEqual(read(os.path.join(self.folder, "vantorel.exe")), read(os.path.join(BUILD, "vantorel.exe")))
         self.assertEqual(read(os.path.join(self.folder, "sw2.def")), read(os.path.join(ROOT, "data", "sw2.def")))

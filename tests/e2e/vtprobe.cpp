@@ -9,6 +9,7 @@
 //                                   posts a message (numbers in decimal or 0x hex)
 //   vtprobe icon HWND               the handle of the window's small and big icon
 //   vtprobe run "COMMAND LINE"      runs a program in the desktop, waits for it and exits with its code
+//   vtprobe hold NAME MS            holds the named mutex NAME for MS milliseconds ("held" once it does)
 #include <windows.h>
 
 #include <cstdio>
@@ -82,8 +83,14 @@ int main(int argc, char** argv) {
         ::CloseHandle(process.hThread);
         ::CloseHandle(process.hProcess);
         return static_cast<int>(code);
+    } else if (command == "hold" && argc > 3) {
+        HANDLE mutex = ::CreateMutexA(nullptr, FALSE, argv[2]);
+        std::printf("held\n");
+        std::fflush(stdout);
+        ::Sleep(static_cast<DWORD>(std::strtoul(argv[3], nullptr, 10)));
+        ::CloseHandle(mutex);
     } else {
-        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | icon HWND | run \"COMMAND LINE\"\n");
+        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | icon HWND | run \"COMMAND LINE\" | hold NAME MS\n");
         return 2;
     }
     std::fflush(stdout);
