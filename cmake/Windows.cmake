@@ -176,3 +176,29 @@ target_link_libraries(program_e2e_tests PRIVATE ws2_32)
 # The main window with the program's own resources (icons, manifest, version) linked in.
 vantorel_wine_test(main_window_win32_tests tests/win32/main_window_win32_test.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
 target_link_libraries(main_window_win32_tests PRIVATE version)
+
+# The setup program VTSetup.exe (NSIS) and the release files beside it in release/: what
+# deploy/publish-release puts on the update server ("mainver" from the project version, which also
+# makes the program's version resource; the shipped definitions and their "defver").
+find_program(MAKENSIS makensis)
+if(MAKENSIS)
+    set(VANTOREL_RELEASE ${CMAKE_BINARY_DIR}/release)
+    configure_file(data/sw2.def ${VANTOREL_RELEASE}/sw2.def COPYONLY)
+    configure_file(data/defver ${VANTOREL_RELEASE}/defver COPYONLY)
+    file(CONFIGURE OUTPUT ${VANTOREL_RELEASE}/mainver CONTENT "${PROJECT_VERSION_MAJOR}.${PROJECT_VERSION_MINOR}\n")
+    add_custom_command(OUTPUT ${VANTOREL_RELEASE}/VTSetup.exe
+        COMMAND ${MAKENSIS} -V2 -DVERSION_MAJOR=${PROJECT_VERSION_MAJOR} -DVERSION_MINOR=${PROJECT_VERSION_MINOR}
+            -DEXE=$<TARGET_FILE:vantorel> -DDEFINITIONS=${VANTOREL_RELEASE}/sw2.def -DDEFVER=${VANTOREL_RELEASE}/defver
+            -DICON=${CMAKE_BINARY_DIR}/icons/padlock.ico -DOUTFILE=${VANTOREL_RELEASE}/VTSetup.exe
+            ${CMAKE_SOURCE_DIR}/installer/vantorel.nsi
+        DEPENDS vantorel ${CMAKE_SOURCE_DIR}/installer/vantorel.nsi ${VANTOREL_RELEASE}/sw2.def ${VANTOREL_RELEASE}/defver
+            ${CMAKE_BINARY_DIR}/icons/padlock.ico
+        COMMENT "Making the setup program VTSetup.exe")
+    add_custom_target(VTSetup ALL DEPENDS ${VANTOREL_RELEASE}/VTSetup.exe)
+
+    # Install, upgrade and uninstall in a fresh Wine prefix; publishing a release.
+    add_test(NAME installer COMMAND /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/e2e/installer_tests.py ${CMAKE_BINARY_DIR})
+    set_tests_properties(installer PROPERTIES TIMEOUT 600)
+else()
+    message(WARNING "makensis not found (Debian package nsis): VTSetup.exe and its test are left out")
+endif()

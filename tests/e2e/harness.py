@@ -46,7 +46,7 @@ class Session:
         self.build = os.path.abspath(build_dir)
         self.prefix = prefix or os.path.join(self.build, "e2e-wineprefix")
         os.makedirs(self.prefix, exist_ok=True)
-        self.env = dict(os.environ, WINEPREFIX=self.prefix, WINEDEBUG="-all", WINEDLLOVERRIDES="mscoree,mshtml=")
+        self.env = dict(os.environ, WINEPREFIX=self.prefix, WINEDEBUG="-all", WINEDLLOVERRIDES="mscoree,mshtml=;winemenubuilder.exe=d")
         n = display_base
         while os.path.exists(f"/tmp/.X11-unix/X{n}") or os.path.exists(f"/tmp/.X{n}-lock"):
             n += 1
@@ -81,6 +81,10 @@ class Session:
     def run(self, exe, timeout=60):
         """Runs a second program in the same prefix and waits for it: (exit code, output)."""
         return _run(["wine", exe], self.env, timeout)
+
+    def run_in_desktop(self, command_line, timeout=120):
+        """Runs a Windows command line inside the program's Wine desktop and waits for it: its exit code."""
+        return _run(["wine", os.path.join(self.build, "vtprobe.exe"), "run", command_line], self.env, timeout)[0]
 
     def probe(self, *args):
         return _run(["wine", os.path.join(self.build, "vtprobe.exe"), *[str(a) for a in args]], self.env)[1]
@@ -132,6 +136,20 @@ class Session:
             if len(parts) >= 2 and parts[0].lower() == value.lower() and parts[1].startswith("REG_"):
                 return parts[2] if len(parts) == 3 else ""
         return None
+
+    def reg_values(self, key):
+        """Every value (names without blanks) of a key as {name: data}, REG_DWORD data as an int; None
+        when the key is missing."""
+        code, out = _run(["wine", "reg", "query", key], self.env)
+        if code != 0:
+            return None
+        values = {}
+        for line in out.splitlines():
+            parts = line.strip().split(None, 2)
+            if len(parts) >= 2 and parts[1].startswith("REG_"):
+                data = parts[2] if len(parts) == 3 else ""
+                values[parts[0]] = int(data, 16) if parts[1] == "REG_DWORD" else data
+        return values
 
     def reg_add(self, key, value, data):
         _run(["wine", "reg", "add", key, "/v", value, "/t", "REG_SZ", "/d", data, "/f"], self.env)

@@ -8,6 +8,8 @@
 //   vtprobe post HWND MSG WPARAM LPARAM
 //                                   posts a message (numbers in decimal or 0x hex)
 //   vtprobe icon HWND               the handle of the window's small and big icon
+//   vtprobe run "COMMAND LINE"      runs a program in the desktop, waits for it and exits with its code
+//   vtprobe hold NAME MS            holds the named mutex NAME for MS milliseconds ("held" once it does)
 #include <windows.h>
 
 #include <cstdio>
@@ -64,8 +66,31 @@ int main(int argc, char** argv) {
         HWND hwnd = ToHwnd(argv[2]);
         std::printf("%lld\t%lld\n", static_cast<long long>(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0)),
                     static_cast<long long>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0)));
+    } else if (command == "run" && argc > 2) {
+        std::string line = argv[2];
+        STARTUPINFOA startup{};
+        startup.cb = sizeof startup;
+        std::string name = desktopName != nullptr ? desktopName : "vt";
+        startup.lpDesktop = name.data();
+        PROCESS_INFORMATION process{};
+        if (!::CreateProcessA(nullptr, line.data(), nullptr, nullptr, FALSE, 0, nullptr, nullptr, &startup, &process)) {
+            std::fprintf(stderr, "vtprobe: cannot run %s (error %lu)\n", line.c_str(), ::GetLastError());
+            return 127;
+        }
+        ::WaitForSingleObject(process.hProcess, INFINITE);
+        DWORD code = 0;
+        ::GetExitCodeProcess(process.hProcess, &code);
+        ::CloseHandle(process.hThread);
+        ::CloseHandle(process.hProcess);
+        return static_cast<int>(code);
+    } else if (command == "hold" && argc > 3) {
+        HANDLE mutex = ::CreateMutexA(nullptr, FALSE, argv[2]);
+        std::printf("held\n");
+        std::fflush(stdout);
+        ::Sleep(static_cast<DWORD>(std::strtoul(argv[3], nullptr, 10)));
+        ::CloseHandle(mutex);
     } else {
-        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | icon HWND\n");
+        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | icon HWND | run \"COMMAND LINE\" | hold NAME MS\n");
         return 2;
     }
     std::fflush(stdout);
