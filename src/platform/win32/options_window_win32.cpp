@@ -98,9 +98,14 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     controls_.BtnCancel = close_.get();
     controls_.BtnUpdate = update_.get();
     controls_.L = {labels_[0].get(), labels_[1].get()};
-    form_ = std::make_unique<FrmOptions>(controls_, registry, executablePath, [this] {
-        if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
-    });
+    form_ = std::make_unique<FrmOptions>(
+        controls_, registry, scheduler_, executablePath,
+        [this] {
+            if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
+        },
+        [this](const std::string& text) {
+            if (hwnd_ != nullptr) ::MessageBoxA(hwnd_, text.c_str(), "Options", MB_OK | MB_ICONEXCLAMATION);
+        });
     form_->Form_Load();
 
     check_ = std::make_unique<UpdateCheck>(*this, inet_, pump_, files_, FD1_, FD2_, FD3_, target.programFolder,

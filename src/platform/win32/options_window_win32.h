@@ -18,6 +18,7 @@
 #include "platform/win32/http_transfer_win32.h"
 #include "platform/win32/picture_box_win32.h"
 #include "platform/win32/shell_win32.h"
+#include "platform/win32/task_scheduler_win32.h"
 #include "ui/options/frm_options.h"
 #include "ui/options/update_check.h"
 
@@ -78,6 +79,7 @@ private:
     HWND pbWindow_ = nullptr;  // pb's window: hidden until a download starts
     std::unique_ptr<GdiPictureBox> pb_;
     OptionsControls controls_;
+    Win32TaskScheduler scheduler_;
     std::unique_ptr<FrmOptions> form_;
 
     // The update check's transfers, downloaders and the check itself: they live while the window
