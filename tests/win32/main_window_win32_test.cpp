@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstring>
 #include <string>
 #include <vector>
@@ -21,6 +22,7 @@
 #include "platform/win32/shell_win32.h"
 #include "ui/main/frm_main.h"
 #include "version.h"
+#include "win32/ui_input.h"
 
 namespace vantorel {
 namespace {
@@ -160,10 +162,10 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
 
     // The status light is the window's real icon, big and small.
     form.TimerTick();
-    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), window.Lights(kLightBright));
+    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), reinterpret_cast<LRESULT>(window.ShownLight(kLightBright)));
     EXPECT_NE(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0), 0);
     form.TimerTick();
-    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), window.Lights(kLightDark));
+    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), reinterpret_cast<LRESULT>(window.ShownLight(kLightDark)));
 
     // Real clicks on the Win32 buttons reach the handler by index.
     ::SendMessageA(window.BtnO(kBtnUpdates).hwnd(), BM_CLICK, 0, 0);
@@ -185,6 +187,32 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     EXPECT_EQ(window.Hwnd(), nullptr);
     MSG quit;
     EXPECT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE)) << "the message loop is told to end";
+}
+
+TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWhole) {
+    win32::MainWindow window;
+    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
+    HWND hwnd = window.Hwnd();
+    ::ShowWindow(hwnd, SW_SHOWNA);
+    for (UINT dpi : {144u, 192u, 120u, 96u}) {
+        const int d = static_cast<int>(dpi);
+        RECT suggested = win32::SendDpiChange(hwnd, dpi, {9120, 4335}), now, client;
+        ::GetWindowRect(hwnd, &now);
+        EXPECT_TRUE(::EqualRect(&now, &suggested)) << dpi << ": the suggested rectangle taken";
+        ::GetClientRect(hwnd, &client);
+        EXPECT_EQ(client.right, ::MulDiv(9120, d, 1440)) << dpi;
+        RECT onOff = ChildRect(window.BtnOnOff().Handle(), hwnd);
+        EXPECT_EQ(onOff.left, ::MulDiv(120, d, 1440)) << dpi;
+        EXPECT_EQ(onOff.bottom - onOff.top, ::MulDiv(4095, d, 1440)) << dpi;
+        RECT options = ChildRect(window.BtnO(kBtnOptions).hwnd(), hwnd), panel = ChildRect(window.Uf(1).hwnd(), hwnd);
+        EXPECT_EQ(options.left - panel.left, ::MulDiv(2400, d, 1440)) << dpi;
+        EXPECT_EQ(panel.right - panel.left, ::MulDiv(6375, d, 1440)) << dpi;
+        EXPECT_EQ(win32::FontHeight(window.BtnO(kBtnExit).hwnd()), -::MulDiv(825, d, 7200)) << dpi;
+        EXPECT_EQ(win32::FontHeight(window.BtnOnOff().Handle()), -std::lround(14.25 * d / 72)) << dpi << ": the switch";
+        EXPECT_EQ(win32::IconWidth(reinterpret_cast<HICON>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0))),
+                  ::MulDiv(32, d, 96)) << dpi;
+        EXPECT_EQ(win32::TextsCut(hwnd, dpi), "") << dpi;
+    }
 }
 
 }  // namespace

@@ -129,6 +129,14 @@ HFONT CreateDesignFont(UINT dpi) {
                          CLIP_DEFAULT_PRECIS, DEFAULT_QUALITY, DEFAULT_PITCH | FF_SWISS, "Verdana");
 }
 
+void PlaceControl(HWND control, const TwipsRect& rect, UINT dpi, HFONT font) {
+    RECT r = ToPixels(rect, dpi);
+    ::SetWindowPos(control, nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
+                   SWP_NOZORDER | SWP_NOACTIVATE);
+    ::SendMessageA(control, WM_SETFONT, reinterpret_cast<WPARAM>(font), TRUE);
+    ::InvalidateRect(control, nullptr, TRUE);
+}
+
 bool RouteCommand(WPARAM wParam, LPARAM lParam) {
     HWND control = reinterpret_cast<HWND>(lParam);
     if (control == nullptr || HIWORD(wParam) != BN_CLICKED) return false;
@@ -142,7 +150,7 @@ bool RouteCommand(WPARAM wParam, LPARAM lParam) {
 }
 
 Win32Button::Win32Button(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font)
-    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_PUSHBUTTON, caption, rect, dpi, font)) {
+    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_PUSHBUTTON, caption, rect, dpi, font)), rect_(rect) {
     Tag(hwnd_, this, Kind::kButton);
 }
 Win32Button::~Win32Button() { Untag(hwnd_); }
@@ -152,7 +160,7 @@ void Win32Button::SetEnabled(bool enabled) { ::EnableWindow(hwnd_, enabled ? TRU
 bool Win32Button::Enabled() const { return ::IsWindowEnabled(hwnd_) != FALSE; }
 
 Win32Label::Win32Label(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font)
-    : hwnd_(CreateControl(parent, "STATIC", SS_LEFT, caption, rect, dpi, font)) {}
+    : hwnd_(CreateControl(parent, "STATIC", SS_LEFT, caption, rect, dpi, font)), rect_(rect) {}
 Win32Label::~Win32Label() = default;
 void Win32Label::SetCaption(const std::string& caption) {
     ::SetWindowTextA(hwnd_, caption.c_str());
@@ -161,7 +169,8 @@ void Win32Label::SetCaption(const std::string& caption) {
 std::string Win32Label::Caption() const { return TextOf(hwnd_); }
 
 Win32Frame::Win32Frame(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font,
-                       bool visible) {
+                       bool visible)
+    : rect_(rect) {
     auto instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(parent, GWLP_HINSTANCE));
     RegisterWindowClass(instance, kFrameClass, FrameProc);
     RECT r = ToPixels(rect, dpi);
@@ -177,7 +186,7 @@ void Win32Frame::SetVisible(bool visible) { ::ShowWindow(hwnd_, visible ? SW_SHO
 bool Win32Frame::Visible() const { return (::GetWindowLongPtrA(hwnd_, GWL_STYLE) & WS_VISIBLE) != 0; }
 
 Win32CheckBox::Win32CheckBox(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font)
-    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_AUTOCHECKBOX, caption, rect, dpi, font)) {
+    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_AUTOCHECKBOX, caption, rect, dpi, font)), rect_(rect) {
     Tag(hwnd_, this, Kind::kCheckBox);
 }
 Win32CheckBox::~Win32CheckBox() { Untag(hwnd_); }

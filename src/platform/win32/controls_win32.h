@@ -23,6 +23,9 @@ RECT ToPixels(const TwipsRect& rect, UINT dpi);
 // The design font, Verdana 8.25 pt, for `dpi`. The caller owns it.
 HFONT CreateDesignFont(UINT dpi);
 
+// Moves `control` to `rect` at `dpi` and gives it `font` (a window that moved to another monitor).
+void PlaceControl(HWND control, const TwipsRect& rect, UINT dpi, HFONT font);
+
 // Registers a window class with the dialog colour and the arrow cursor, once per process.
 void RegisterWindowClass(HINSTANCE instance, const char* name, WNDPROC proc);
 
@@ -43,8 +46,12 @@ public:
         if (Enabled() && Click) Click();
     }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 class Win32Label final : public platform::Label {
@@ -55,8 +62,12 @@ public:
     std::string Caption() const override;
     HWND hwnd() const { return hwnd_; }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 class Win32Frame final : public platform::Frame {
@@ -71,8 +82,12 @@ public:
     // Controls placed on the frame are created with this as their parent.
     HWND hwnd() const { return hwnd_; }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 class Win32CheckBox final : public platform::CheckBox {
@@ -88,8 +103,12 @@ public:
         if (Click) Click();
     }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 }  // namespace vantorel::win32
