@@ -7,6 +7,7 @@
 #include <windows.h>
 
 #include <gtest/gtest.h>
+#include <vector>
 #include <taskschd.h>
 
 #include "platform/win32/options_window_win32.h"
@@ -177,6 +178,91 @@ TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsMeetWinesTaskSchedu
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kRunKey, "Vantorel"))) << "unchecking removes the Run value";
     EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kVantorelKey, "Tray"))) << "the other boxes wrote nothing";
+}
+
+RECT ChildRect(HWND child, HWND relativeTo) {
+    RECT r;
+    ::GetWindowRect(child, &r);
+    ::MapWindowPoints(nullptr, relativeTo, reinterpret_cast<POINT*>(&r), 2);
+    return r;
+}
+
+TEST_F(OptionsWindowTest, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
+    OptionsWindow window(nullptr, 0, registry_, AutostartPath());
+    ASSERT_NE(window.hwnd(), nullptr) << "no display?";
+    HWND hwnd = window.hwnd();
+    ::ShowWindow(hwnd, SW_SHOWNA);
+    window.label(0).SetCaption("Definitions Updates: defver has been corrupted");  // the longest status
+    for (UINT dpi : {144u, 192u, 120u, 96u}) {
+        const int d = static_cast<int>(dpi);
+        RECT suggested = SendDpiChange(hwnd, dpi, {6615, 3135}), now, client;
+        ::GetWindowRect(hwnd, &now);
+        EXPECT_TRUE(::EqualRect(&now, &suggested)) << dpi << ": the suggested rectangle taken";
+        ::GetClientRect(hwnd, &client);
+        EXPECT_EQ(client.right, ::MulDiv(6615, d, 1440)) << dpi;
+        EXPECT_EQ(ChildRect(window.closeButton().hwnd(), hwnd).left, ::MulDiv(4440, d, 1440)) << dpi;
+        RECT box = ChildRect(window.box(2).hwnd(), hwnd), pb;
+        EXPECT_EQ(box.right - box.left, ::MulDiv(5900, d, 1440)) << dpi;
+        EXPECT_EQ(FontHeight(window.box(0).hwnd()), -::MulDiv(825, d, 7200)) << dpi;
+        ::GetWindowRect(window.pbWindow(), &pb);
+        EXPECT_EQ(pb.right - pb.left, ::MulDiv(5895, d, 1440)) << dpi << ": pb";
+        EXPECT_EQ(TextsCut(hwnd, dpi), "") << dpi << ": options";
+        window.controls().F[0]->SetVisible(false);
+        window.controls().F[1]->SetVisible(true);
+        EXPECT_EQ(TextsCut(hwnd, dpi), "") << dpi << ": updates";
+        window.controls().F[1]->SetVisible(false);
+        window.controls().F[0]->SetVisible(true);
+    }
+
+    // The keyboard: the first box has the focus, Tab walks the boxes to "&Close" and round, Esc closes.
+    std::vector<HWND> focus;
+    Ticker keys(60, [&] {
+        if (!::IsWindowVisible(hwnd)) return false;
+        focus.push_back(::GetFocus());
+        if (focus.size() > 5) ::PostMessageA(hwnd, WM_CLOSE, 0, 0);  // Esc did not close it
+        else Key(focus.size() < 5 ? VK_TAB : VK_ESCAPE);
+        return focus.size() > 5;
+    });
+    ::ShowWindow(hwnd, SW_HIDE);
+    window.ShowModal();
+    EXPECT_EQ(focus, (std::vector<HWND>{window.box(0).hwnd(), window.box(1).hwnd(), window.box(2).hwnd(),
+                                        window.closeButton().hwnd(), window.box(0).hwnd()}))
+        << "a sixth entry: Esc did not close the window";
+}
+
+TEST_F(OptionsWindowTest, AccessKeysReachEveryShownButton) {
+    // The options frame: Alt+C is "&Close" alone (the update button is on the hidden frame).
+    OptionsWindow options(nullptr, 0, registry_, AutostartPath());
+    int updates = 0;
+    options.updateButton().Click = [&] { ++updates; };
+    int presses = 0;
+    Ticker close(60, [&] {
+        if (!::IsWindowVisible(options.hwnd())) return false;
+        if (++presses > 20) ::PostMessageA(options.hwnd(), WM_CLOSE, 0, 0);  // never closed: give up
+        else Key('C', true);
+        return presses > 20;
+    });
+    options.ShowModal();
+    EXPECT_LE(presses, 20) << "Alt+C pressed \"&Close\"";
+    EXPECT_EQ(updates, 0);
+
+    // The updates frame: "&Check for Updates" and "&Close" share C; each Alt+C moves to the next of
+    // them, Enter presses the one with the focus.
+    OptionsWindow window(nullptr, 1, registry_, AutostartPath());
+    window.updateButton().Click = [&] { ++updates; };
+    std::vector<HWND> focus;
+    Ticker keys(60, [&] {
+        if (!::IsWindowVisible(window.hwnd())) return false;
+        focus.push_back(::GetFocus());
+        if (focus.size() > 4) ::PostMessageA(window.hwnd(), WM_CLOSE, 0, 0);  // Enter did not close it
+        else Key(focus.size() < 4 ? 'C' : VK_RETURN, focus.size() < 4);
+        return focus.size() > 4;
+    });
+    window.ShowModal();
+    EXPECT_EQ(focus, (std::vector<HWND>{window.updateButton().hwnd(), window.closeButton().hwnd(),
+                                        window.updateButton().hwnd(), window.closeButton().hwnd()}))
+        << "a fifth entry: Enter did not press \"&Close\"";
+    EXPECT_EQ(updates, 0) << "a shared access key presses nothing";
 }
 
 }  // namespace

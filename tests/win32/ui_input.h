@@ -29,6 +29,19 @@ inline void PointerClick(HWND control) {
     ::SendInput(3, input, sizeof(INPUT));
 }
 
+// Presses and releases `vk` through the system's input, with Alt held when `alt`.
+inline void Key(WORD vk, bool alt = false) {
+    INPUT input[4] = {};
+    WORD keys[4] = {VK_MENU, vk, vk, VK_MENU};
+    int n = 0;
+    for (int i = alt ? 0 : 1; i < (alt ? 4 : 3); ++i, ++n) {
+        input[n].type = INPUT_KEYBOARD;
+        input[n].ki.wVk = keys[i];
+        input[n].ki.dwFlags = i >= 2 ? KEYEVENTF_KEYUP : 0;
+    }
+    ::SendInput(static_cast<UINT>(n), input, sizeof(INPUT));
+}
+
 // Runs `step` on the window thread every `ms` milliseconds while any message loop runs (the modal
 // loop, a download's pumping, a message box's own loop) until it returns true.
 class Ticker {

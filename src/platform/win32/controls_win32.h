@@ -20,6 +20,10 @@ struct TwipsRect {
 int TwipsToPixels(int twips, UINT dpi);
 RECT ToPixels(const TwipsRect& rect, UINT dpi);
 
+// The window's DPI: GetDpiForWindow where the system has it (per-monitor awareness), else the
+// screen's.
+UINT DpiOfWindow(HWND hwnd);
+
 // The design font, Verdana 8.25 pt, for `dpi`. The caller owns it.
 HFONT CreateDesignFont(UINT dpi);
 
@@ -28,6 +32,12 @@ void PlaceControl(HWND control, const TwipsRect& rect, UINT dpi, HFONT font);
 
 // Registers a window class with the dialog colour and the arrow cursor, once per process.
 void RegisterWindowClass(HINSTANCE instance, const char* name, WNDPROC proc);
+
+// Alt+`key` under `top`: the shown, enabled buttons whose caption marks `key` (case-insensitive).
+// One such button is focused and clicked; when several share the key, each press moves the focus
+// to the next of them without clicking (Enter or Space clicks the focused one). False when no
+// shown button has the key.
+bool HandleAccessKey(HWND top, char key);
 
 // Raises the click of the wrapper that sent this WM_COMMAND. True when one of ours handled it.
 bool RouteCommand(WPARAM wParam, LPARAM lParam);

@@ -26,24 +26,6 @@ constexpr TwipsRect kPanelButtonRect{2400, 960, 3855, 495};
 constexpr TwipsRect kRowRects[3] = {{2640, 3720, 2055, 495}, {4800, 3720, 2055, 495}, {6960, 3720, 2055, 495}};
 constexpr const char* kBtnOCaptions[5] = {"&Tray", "&Exit", "&Help", "&Updates", "&Options"};
 
-// The window's DPI: GetDpiForWindow where the system has it (per-monitor awareness), else the
-// screen's.
-UINT DpiOf(HWND hwnd) {
-    using GetDpiForWindowFunction = UINT(WINAPI*)(HWND);
-    if (HMODULE user32 = ::GetModuleHandleA("user32.dll")) {
-        auto get = reinterpret_cast<GetDpiForWindowFunction>(
-            reinterpret_cast<void*>(::GetProcAddress(user32, "GetDpiForWindow")));
-        if (get != nullptr) {
-            UINT dpi = get(hwnd);
-            if (dpi != 0) return dpi;
-        }
-    }
-    HDC dc = ::GetDC(hwnd);
-    UINT dpi = static_cast<UINT>(::GetDeviceCaps(dc, LOGPIXELSY));
-    ::ReleaseDC(hwnd, dc);
-    return dpi == 0 ? 96 : dpi;
-}
-
 HICON LoadIconSized(HINSTANCE instance, int id, int size) {
     return static_cast<HICON>(::LoadImageA(instance, MAKEINTRESOURCEA(id), IMAGE_ICON, size, size, LR_DEFAULTCOLOR));
 }
@@ -135,7 +117,7 @@ bool MainWindow::Create(HINSTANCE instance) {
     HWND hwnd = ::CreateWindowExA(WS_EX_CONTROLPARENT, kClassName, "Vantorel", kStyle, CW_USEDEFAULT, CW_USEDEFAULT,
                                   100, 100, nullptr, nullptr, instance, this);
     if (hwnd == nullptr) return false;
-    dpi_ = DpiOf(hwnd);
+    dpi_ = DpiOfWindow(hwnd);
     RECT outer{0, 0, TwipsToPixels(kClientWidth, dpi_), TwipsToPixels(kClientHeight, dpi_)};
     ::AdjustWindowRectEx(&outer, kStyle, FALSE, WS_EX_CONTROLPARENT);
     ::SetWindowPos(hwnd, nullptr, 0, 0, outer.right - outer.left, outer.bottom - outer.top,
