@@ -189,7 +189,7 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     EXPECT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE)) << "the message loop is told to end";
 }
 
-TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWhole) {
+TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
     win32::MainWindow window;
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
     HWND hwnd = window.Hwnd();
@@ -213,6 +213,31 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWhole) {
                   ::MulDiv(32, d, 96)) << dpi;
         EXPECT_EQ(win32::TextsCut(hwnd, dpi), "") << dpi;
     }
+
+    // The keyboard, through a loop that hands dialog keys to the window as the program's does: the
+    // switch has the focus first; Tab walks the panels' buttons, then the row, and round.
+    ::ShowWindow(hwnd, SW_SHOW);
+    ::SetForegroundWindow(hwnd);
+    std::vector<HWND> focus;
+    win32::Ticker keys(60, [&] {
+        focus.push_back(::GetFocus());
+        win32::Key(VK_TAB);
+        return focus.size() == 7;
+    });
+    for (DWORD start = ::GetTickCount(); focus.size() < 7 && ::GetTickCount() - start < 5000;) {
+        MSG msg;
+        if (!::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
+            continue;
+        }
+        if (::IsDialogMessageA(hwnd, &msg)) continue;
+        ::TranslateMessage(&msg);
+        ::DispatchMessageA(&msg);
+    }
+    HWND onOff = window.BtnOnOff().Handle();
+    EXPECT_EQ(focus, (std::vector<HWND>{onOff, window.BtnO(kBtnOptions).hwnd(), window.BtnO(kBtnUpdates).hwnd(),
+                                        window.BtnO(kBtnTray).hwnd(), window.BtnO(kBtnExit).hwnd(),
+                                        window.BtnO(kBtnHelp).hwnd(), onOff}));
 }
 
 }  // namespace
