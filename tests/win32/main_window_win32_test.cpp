@@ -208,7 +208,16 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
         EXPECT_EQ(options.left - panel.left, ::MulDiv(2400, d, 1440)) << dpi;
         EXPECT_EQ(panel.right - panel.left, ::MulDiv(6375, d, 1440)) << dpi;
         EXPECT_EQ(win32::FontHeight(window.BtnO(kBtnExit).hwnd()), -::MulDiv(825, d, 7200)) << dpi;
-        EXPECT_EQ(win32::FontHeight(window.BtnOnOff().Handle()), -std::lround(14.25 * d / 72)) << dpi << ": the switch";
+        HWND onOffHwnd = window.BtnOnOff().Handle();
+        EXPECT_EQ(win32::FontHeight(onOffHwnd), -std::lround(14.25 * d / 72)) << dpi << ": the switch";
+        HDC dc = ::GetDC(onOffHwnd);
+        HGDIOBJ old = ::SelectObject(dc, reinterpret_cast<HFONT>(::SendMessageA(onOffHwnd, WM_GETFONT, 0, 0)));
+        SIZE off{};
+        ::GetTextExtentPoint32A(dc, "OFF", 3, &off);
+        ::SelectObject(dc, old);
+        ::ReleaseDC(onOffHwnd, dc);
+        const auto& caption = window.BtnOnOffWindow().button().captionRect();
+        EXPECT_EQ(caption.right - caption.left, off.cx) << dpi << ": the switch's caption laid out in that font";
         EXPECT_EQ(win32::IconWidth(reinterpret_cast<HICON>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0))),
                   ::MulDiv(32, d, 96)) << dpi;
         EXPECT_EQ(win32::TextsCut(hwnd, dpi), "") << dpi;
