@@ -224,16 +224,22 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
     }
 
     // The keyboard, through a loop that hands dialog keys to the window as the program's does: the
-    // switch has the focus first; Tab walks the panels' buttons, then the row, and round.
+    // switch has the focus first; Tab walks the panels' buttons, then the row, and round; each
+    // button's access key presses it.
     ::ShowWindow(hwnd, SW_SHOW);
     ::SetForegroundWindow(hwnd);
     std::vector<HWND> focus;
-    win32::Ticker keys(60, [&] {
-        focus.push_back(::GetFocus());
-        win32::Key(VK_TAB);
-        return focus.size() == 7;
+    std::string pressed;
+    const char keys[] = "TEHUO";
+    for (int i = 0; i < 5; ++i) window.BtnO(i).Click = [&, i] { pressed += keys[i]; };
+    std::size_t step = 0;
+    win32::Ticker user(60, [&] {
+        if (step < 7) focus.push_back(::GetFocus());
+        if (step < 7) win32::Key(VK_TAB);
+        else win32::Key(static_cast<WORD>("OUTEH"[step - 7]), true);
+        return ++step == 12;
     });
-    for (DWORD start = ::GetTickCount(); focus.size() < 7 && ::GetTickCount() - start < 5000;) {
+    for (DWORD start = ::GetTickCount(); pressed.size() < 5 && ::GetTickCount() - start < 5000;) {
         MSG msg;
         if (!::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
             ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
@@ -247,6 +253,7 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
     EXPECT_EQ(focus, (std::vector<HWND>{onOff, window.BtnO(kBtnOptions).hwnd(), window.BtnO(kBtnUpdates).hwnd(),
                                         window.BtnO(kBtnTray).hwnd(), window.BtnO(kBtnExit).hwnd(),
                                         window.BtnO(kBtnHelp).hwnd(), onOff}));
+    EXPECT_EQ(pressed, "OUTEH");
 }
 
 }  // namespace
