@@ -3,12 +3,15 @@
 // ending on "&Close"; once with queued BM_CLICKs, once with the real pointer (SendInput, hit-tested
 // by the system, pressed and released on the control). Wine's scheduler refuses a logon trigger
 // (ITriggerCollection::Create answers E_NOTIMPL), so checking "Boot when Windows boots" shows the
-// refusal; unchecking removes a task "Vantorel" that the test registered as XML. Runs on the virtual display; the values it touches are removed afterwards.
+// refusal; unchecking removes a task "Vantorel" that the test registered as XML. Then the window at
+// other DPIs and on the keyboard. Runs on the virtual display; the values and the task it touches
+// are removed afterwards.
 #include <windows.h>
+#include <taskschd.h>
 
 #include <gtest/gtest.h>
+
 #include <vector>
-#include <taskschd.h>
 
 #include "platform/win32/options_window_win32.h"
 #include "platform/win32/registry_win32.h"
@@ -34,8 +37,9 @@ bool Task(const wchar_t* xml, bool remove = false) {
                                      reinterpret_cast<void**>(&service))) &&
         SUCCEEDED(service->Connect(none, none, none, none)) && SUCCEEDED(service->GetFolder(root, &folder))) {
         if (remove) folder->DeleteTask(name, 0);
-        else if (xml != nullptr && (SUCCEEDED(folder->RegisterTask(name, text, TASK_CREATE_OR_UPDATE, none, none, TASK_LOGON_NONE,
-                                                none, &task))))
+        else if (xml != nullptr &&
+                 SUCCEEDED(folder->RegisterTask(name, text, TASK_CREATE_OR_UPDATE, none, none, TASK_LOGON_NONE, none,
+                                                &task)))
             task->Release();
         task = nullptr;
         folder->GetTask(name, &task);
@@ -54,10 +58,7 @@ constexpr const wchar_t* kTaskXml =
 
 class OptionsWindowTest : public ::testing::Test {
 protected:
-    void SetUp() override {
-        Clean();
-        Task(nullptr, true);
-    }
+    void SetUp() override { Clean(); }
     void TearDown() override { Clean(); }
 
     Variant Read(std::int32_t root, const std::string& key, const std::string& name) {
@@ -77,6 +78,7 @@ protected:
         Remove(kHkeyLocalMachine, kVantorelKey, "Tray");
         Remove(kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel");
         Remove(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger");
+        Task(nullptr, true);
     }
 
     Win32Registry registry_;
