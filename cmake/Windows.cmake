@@ -13,8 +13,10 @@ add_library(vantorel_win32 STATIC
     src/platform/win32/picture_box_win32.cpp
     src/platform/win32/registry_win32.cpp
     src/platform/win32/shell_win32.cpp
+    src/platform/win32/task_scheduler_win32.cpp
 )
-target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet iphlpapi shell32 user32 gdi32)
+target_link_libraries(vantorel_win32 PUBLIC vantorel_core advapi32 shlwapi wininet iphlpapi shell32 user32 gdi32
+    taskschd ole32 oleaut32)
 target_compile_definitions(vantorel_win32 PUBLIC WIN32_LEAN_AND_MEAN NOMINMAX)
 
 # Icons drawn at build time, the manifest and the version resource.

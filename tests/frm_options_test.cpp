@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "fakes/fake_registry.h"
+#include "fakes/fake_task_scheduler.h"
 #include "fakes/fake_widgets.h"
 #include "settings/settings.h"
 
@@ -14,6 +15,7 @@ using platform::kHkeyCurrentUser;
 using platform::kHkeyLocalMachine;
 
 constexpr const char* kExe = "C:\\Program Files\\Vantorel\\vantorel.exe";
+constexpr const char* kQuotedExe = "\"C:\\Program Files\\Vantorel\\vantorel.exe\"";
 
 struct OptionsWindow {
     FakeFrame options{"Options", false}, updates{"Updates", false};
@@ -22,13 +24,15 @@ struct OptionsWindow {
     FakeButton close{"&Close"}, update{"&Check for Updates"};
     FakeLabel definitions{"Definitions Updates:"}, program{"Program Updates:"};
     int unloads = 0;
+    std::vector<std::string> messages;
     FakeRegistry& registry;
+    FakeTaskScheduler scheduler;
     FrmOptions form;
 
     explicit OptionsWindow(FakeRegistry& r)
         : registry(r),
           form(OptionsControls{{&options, &updates}, {&start, &tray, &debugger}, &close, &update, {&definitions, &program}},
-               r, kExe, [this] { ++unloads; }) {}
+               r, scheduler, kExe, [this] { ++unloads; }, [this](const std::string& m) { messages.push_back(m); }) {}
 };
 
 Variant Read(FakeRegistry& registry, std::int32_t root, const std::string& key, const std::string& name) {
@@ -97,10 +101,12 @@ TEST(FrmOptions, TogglingStoresEachOptionAtOnce) {
     window.form.Form_Load();
 
     window.start.UserToggle();  // on
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(std::string(kExe)));
+    EXPECT_EQ(window.scheduler.tasks, (std::map<std::string, std::string>{{"Vantorel", kQuotedExe}}));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(std::string(kQuotedExe)));
     EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("1")));
     window.start.UserToggle();  // off
     EXPECT_TRUE(IsEmpty(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"))) << "autostart entry removed";
+    EXPECT_TRUE(window.scheduler.tasks.empty()) << "logon task removed";
     EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
     window.start.UserToggle();
     window.start.UserToggle();  // removing a value twice is harmless
@@ -120,6 +126,32 @@ TEST(FrmOptions, TogglingStoresEachOptionAtOnce) {
 
     window.close.UserClick();
     EXPECT_EQ(window.unloads, 1);
+}
+
+TEST(FrmOptions, StartWithWindowsThatTheSchedulerRefusesIsUndoneAndSaysWhy) {
+    FakeRegistry registry;
+    OptionsWindow window(registry);
+    window.form.Form_Load();
+    window.scheduler.failure = {"ITaskFolder::RegisterTaskDefinition", static_cast<std::int32_t>(0x80070005u),
+                                "Access is denied."};
+    window.start.UserToggle();  // on, refused
+    EXPECT_FALSE(window.start.Value()) << "the box shows unchecked again";
+    EXPECT_EQ(ValueCount(registry, kHkeyLocalMachine, kRunKey), 0u);
+    EXPECT_EQ(ValueCount(registry, kHkeyLocalMachine, "SOFTWARE\\Vantorel"), 0u);
+
+    window.scheduler.failure = {};
+    window.start.UserToggle();  // on
+    window.scheduler.failure = {"ITaskFolder::DeleteTask", static_cast<std::int32_t>(0x80070005u), "Access is denied."};
+    window.start.UserToggle();  // off, refused: the task still starts the program
+    EXPECT_TRUE(window.start.Value());
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(std::string(kQuotedExe)));
+    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("1")));
+    EXPECT_EQ(window.messages,
+              (std::vector<std::string>{
+                  "Vantorel cannot be set to start when Windows boots: the Task Scheduler refused its task "
+                  "\"Vantorel\".\n\nITaskFolder::RegisterTaskDefinition failed with HRESULT 0x80070005: Access is denied.",
+                  "Vantorel still starts when Windows boots: the Task Scheduler refused its task \"Vantorel\".\n\n"
+                  "ITaskFolder::DeleteTask failed with HRESULT 0x80070005: Access is denied."}));
 }
 
 TEST(FrmOptions, LoadLeavesStoredValuesAloneEvenWhenSettingABoxClicksIt) {

@@ -1,5 +1,6 @@
 #include "app/main_window.h"
 
+#include <algorithm>
 #include <utility>
 
 #include "platform/win32/resource_ids.h"
@@ -16,33 +17,33 @@ constexpr DWORD kStyle = WS_OVERLAPPED | WS_CAPTION | WS_SYSMENU | WS_MINIMIZEBO
 constexpr TwipsRect kBtnOnOffRect{120, 120, 2415, 4095};
 constexpr TwipsRect kUfRects[2] = {{2640, 1920, 6375, 1695}, {2640, 120, 6375, 1695}};  // "Update", "Options"
 constexpr const char* kUfCaptions[2] = {"Update", "Options"};
-constexpr TwipsRect kLRects[2] = {{480, 360, 4845, 255}, {480, 360, 3330, 255}};
+// The panels' texts use the room their panel has (two lines down to the button), so that they are
+// shown whole at every DPI and font.
+constexpr TwipsRect kLRects[2] = {{480, 360, 5775, 540}, {480, 360, 5775, 540}};
 constexpr const char* kLCaptions[2] = {"Selectable options such as starting when windows boots...",
                                        "Check for Vantorel updates..."};
 constexpr TwipsRect kPanelButtonRect{2400, 960, 3855, 495};
 constexpr TwipsRect kRowRects[3] = {{2640, 3720, 2055, 495}, {4800, 3720, 2055, 495}, {6960, 3720, 2055, 495}};
 constexpr const char* kBtnOCaptions[5] = {"&Tray", "&Exit", "&Help", "&Updates", "&Options"};
 
-// The window's DPI: GetDpiForWindow where the system has it (per-monitor awareness), else the
-// screen's.
-UINT DpiOf(HWND hwnd) {
-    using GetDpiForWindowFunction = UINT(WINAPI*)(HWND);
-    if (HMODULE user32 = ::GetModuleHandleA("user32.dll")) {
-        auto get = reinterpret_cast<GetDpiForWindowFunction>(
-            reinterpret_cast<void*>(::GetProcAddress(user32, "GetDpiForWindow")));
-        if (get != nullptr) {
-            UINT dpi = get(hwnd);
-            if (dpi != 0) return dpi;
-        }
-    }
-    HDC dc = ::GetDC(hwnd);
-    UINT dpi = static_cast<UINT>(::GetDeviceCaps(dc, LOGPIXELSY));
-    ::ReleaseDC(hwnd, dc);
-    return dpi == 0 ? 96 : dpi;
-}
-
 HICON LoadIconSized(HINSTANCE instance, int id, int size) {
     return static_cast<HICON>(::LoadImageA(instance, MAKEINTRESOURCEA(id), IMAGE_ICON, size, size, LR_DEFAULTCOLOR));
+}
+
+// A system metric at `dpi`: GetSystemMetricsForDpi where the system has it, else scaled.
+int MetricForDpi(int index, UINT dpi) {
+    using ForDpiFunction = int(WINAPI*)(int, UINT);
+    if (HMODULE user32 = ::GetModuleHandleA("user32.dll")) {
+        auto get = reinterpret_cast<ForDpiFunction>(
+            reinterpret_cast<void*>(::GetProcAddress(user32, "GetSystemMetricsForDpi")));
+        if (get != nullptr) return get(index, dpi);
+    }
+    return ::MulDiv(::GetSystemMetrics(index), static_cast<int>(dpi), 96);
+}
+
+void DestroyIcons(std::array<HICON, 2> icons) {
+    for (HICON icon : icons)
+        if (icon != nullptr) ::DestroyIcon(icon);
 }
 
 }  // namespace
@@ -83,10 +84,8 @@ MainWindow::MainWindow() = default;
 
 MainWindow::~MainWindow() {
     Destroy();
-    for (IconPair& pair : lights_) {
-        if (pair.large != nullptr) ::DestroyIcon(pair.large);
-        if (pair.small != nullptr) ::DestroyIcon(pair.small);
-    }
+    for (const auto* set : {&lights_, &sized_})
+        for (const IconPair& pair : *set) DestroyIcons({pair.large, pair.small});
     if (font_ != nullptr) ::DeleteObject(font_);
 }
 
@@ -118,15 +117,13 @@ bool MainWindow::Create(HINSTANCE instance) {
     HWND hwnd = ::CreateWindowExA(WS_EX_CONTROLPARENT, kClassName, "Vantorel", kStyle, CW_USEDEFAULT, CW_USEDEFAULT,
                                   100, 100, nullptr, nullptr, instance, this);
     if (hwnd == nullptr) return false;
-    dpi_ = DpiOf(hwnd);
+    dpi_ = DpiOfWindow(hwnd);
     RECT outer{0, 0, TwipsToPixels(kClientWidth, dpi_), TwipsToPixels(kClientHeight, dpi_)};
     ::AdjustWindowRectEx(&outer, kStyle, FALSE, WS_EX_CONTROLPARENT);
     ::SetWindowPos(hwnd, nullptr, 0, 0, outer.right - outer.left, outer.bottom - outer.top,
                    SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
     font_ = CreateDesignFont(dpi_);
     ::SendMessageA(hwnd, WM_SETFONT, reinterpret_cast<WPARAM>(font_), FALSE);
-    ::SendMessageA(hwnd, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(lights_[2].large));
-    ::SendMessageA(hwnd, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(lights_[2].small));
 
     RECT r = ToPixels(kBtnOnOffRect, dpi_);
     xpbutton::PropertyBag design = BtnOnOffDesign();
@@ -141,12 +138,7 @@ bool MainWindow::Create(HINSTANCE instance) {
         auto index = static_cast<std::size_t>(i);
         uf_[index] = std::make_unique<Win32Frame>(hwnd, kUfCaptions[i], kUfRects[i], dpi_, font_);
         HWND panel = uf_[index]->hwnd();
-        auto& label = l_[static_cast<std::size_t>(1 - i)];
-        label = std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_);
-        // One line of the design's height: a text wider than its label ends in an ellipsis instead
-        // of wrapping into a second line that is cut in half.
-        LONG_PTR style = ::GetWindowLongPtrA(label->hwnd(), GWL_STYLE);
-        ::SetWindowLongPtrA(label->hwnd(), GWL_STYLE, (style & ~LONG_PTR{SS_TYPEMASK}) | SS_LEFTNOWORDWRAP | SS_ENDELLIPSIS);
+        l_[static_cast<std::size_t>(1 - i)] = std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_);
         const int buttonIndex = i == 1 ? 4 : 3;
         btnO_[static_cast<std::size_t>(buttonIndex)] =
             std::make_unique<Win32Button>(panel, kBtnOCaptions[buttonIndex], kPanelButtonRect, dpi_, font_);
@@ -165,6 +157,10 @@ bool MainWindow::Create(HINSTANCE instance) {
         if (allow != nullptr && taskbarCreated_ != 0) allow(hwnd, taskbarCreated_, 1 /* MSGFLT_ALLOW */, nullptr);
     }
 
+    ApplyDpi(dpi_);
+    // Focus rectangles and access-key underlines shown from the start, not only after a key press.
+    ::SendMessageA(hwnd, WM_CHANGEUISTATE, MAKEWPARAM(UIS_CLEAR, UISF_HIDEFOCUS | UISF_HIDEACCEL), 0);
+
     tmr_.hwnd_ = hwnd;
     timer_.hwnd_ = hwnd;
     tmr_.Apply();
@@ -172,16 +168,44 @@ bool MainWindow::Create(HINSTANCE instance) {
     return true;
 }
 
+void MainWindow::ApplyDpi(UINT dpi) {
+    dpi_ = dpi;
+    HFONT old = font_;
+    font_ = CreateDesignFont(dpi);
+    ::SendMessageA(hwnd_, WM_SETFONT, reinterpret_cast<WPARAM>(font_), FALSE);
+    RECT r = ToPixels(kBtnOnOffRect, dpi);
+    ::SetWindowPos(onOff_.hwnd(), nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
+                   SWP_NOZORDER | SWP_NOACTIVATE);
+    onOff_.SetDpi(dpi);
+    for (auto& frame : uf_) frame->Relayout(dpi, font_);
+    for (auto& label : l_) label->Relayout(dpi, font_);
+    for (auto& button : btnO_) button->Relayout(dpi, font_);
+    if (old != nullptr && old != font_) ::DeleteObject(old);
+
+    HINSTANCE instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(hwnd_, GWLP_HINSTANCE));
+    const int ids[3] = {IDI_BULB_DARK, IDI_BULB_LIT, IDI_PADLOCK};
+    std::array<IconPair, 3> previous = sized_;
+    for (std::size_t i = 0; i < 3; ++i)
+        sized_[i] = {LoadIconSized(instance, ids[i], MetricForDpi(SM_CXICON, dpi)),
+                     LoadIconSized(instance, ids[i], MetricForDpi(SM_CXSMICON, dpi))};
+    ShowIcon();
+    for (const IconPair& pair : previous) DestroyIcons({pair.large, pair.small});
+}
+
+void MainWindow::ShowIcon() {
+    if (hwnd_ == nullptr) return;
+    IconPair shown{icon_, icon_};
+    for (std::size_t i = 0; i < 3; ++i)
+        if (lights_[i].large == icon_) shown = sized_[i];
+    ::SendMessageA(hwnd_, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(shown.large));
+    ::SendMessageA(hwnd_, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(shown.small));
+}
+
 void MainWindow::SetIcon(platform::IconHandle icon) {
-    HICON large = reinterpret_cast<HICON>(icon), small = large;
-    for (const IconPair& pair : lights_) {
-        if (pair.large == large && pair.small != nullptr) small = pair.small;
-    }
+    HICON large = reinterpret_cast<HICON>(icon);
     if (large == icon_) return;
     icon_ = large;
-    if (hwnd_ == nullptr) return;
-    ::SendMessageA(hwnd_, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(large));
-    ::SendMessageA(hwnd_, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(small));
+    ShowIcon();  // the light's picture at the window's DPI
 }
 
 std::string MainWindow::Caption() const {
@@ -263,6 +287,34 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             break;
         case WM_SIZE:
             if (handlers_.resize) handlers_.resize();
+            return 0;
+        case WM_DPICHANGED: {
+            // Moved to a monitor of another DPI: lay out again and take the size the system suggests.
+            ApplyDpi(HIWORD(wParam));
+            const RECT* suggested = reinterpret_cast<const RECT*>(lParam);
+            ::SetWindowPos(hwnd, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
+                           suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
+            return 0;
+        }
+        case WM_GETMINMAXINFO: {
+            // The design's size at the window's DPI is never cut to the screen's (a monitor of
+            // 200 % may be wider in pixels than the one the window came from).
+            RECT outer{0, 0, TwipsToPixels(kClientWidth, dpi_), TwipsToPixels(kClientHeight, dpi_)};
+            ::AdjustWindowRectEx(&outer, kStyle, FALSE, WS_EX_CONTROLPARENT);
+            auto* info = reinterpret_cast<MINMAXINFO*>(lParam);
+            info->ptMaxTrackSize.x = std::max<LONG>(info->ptMaxTrackSize.x, outer.right - outer.left);
+            info->ptMaxTrackSize.y = std::max<LONG>(info->ptMaxTrackSize.y, outer.bottom - outer.top);
+            return 0;
+        }
+        case WM_ACTIVATE:
+            // Keyboard focus comes back to the control that had it (the switch at first).
+            if (LOWORD(wParam) == WA_INACTIVE) {
+                HWND focus = ::GetFocus();
+                if (focus != nullptr && ::IsChild(hwnd, focus)) focus_ = focus;
+            }
+            break;
+        case WM_SETFOCUS:
+            ::SetFocus(focus_ != nullptr && ::IsWindow(focus_) ? focus_ : onOff_.hwnd());
             return 0;
         case WM_MOUSEMOVE:
             // The tray icon's notifications arrive as this message with the event code in the low

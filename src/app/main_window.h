@@ -1,4 +1,5 @@
-// FrmMain on Windows: the main window laid out in twips and scaled to its DPI, with the ON/OFF
+// FrmMain on Windows: the main window laid out in twips and scaled to its DPI (again when it moves
+// to a monitor of another DPI), with the ON/OFF
 // switch (a KirelXPButton in check-box behaviour whose design properties come from the window's
 // property store), the "Options" and "Update" panels, the "&Tray", "&Exit", "&Help" row, the three
 // status icons, the two timers, and the messages the window logic needs.
@@ -116,6 +117,8 @@ public:
     platform::IconHandle Lights(int index) const {
         return reinterpret_cast<platform::IconHandle>(lights_[static_cast<std::size_t>(index)].large);
     }
+    // The picture the window shows for Lights(index), at the window's DPI.
+    HICON ShownLight(int index) const { return sized_[static_cast<std::size_t>(index)].large; }
     HWND Hwnd() const { return hwnd_; }
     UINT Dpi() const { return dpi_; }
 
@@ -132,13 +135,19 @@ private:
     };
     static LRESULT CALLBACK WindowProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
     LRESULT HandleMessage(UINT message, WPARAM wParam, LPARAM lParam);
+    // Lays the window out for `dpi`: controls in twips, the design font and the switch's font, and
+    // the window's icons at that DPI's sizes.
+    void ApplyDpi(UINT dpi);
+    void ShowIcon();
 
     HWND hwnd_ = nullptr;
     bool destroying_ = false;
     UINT dpi_ = 96;
     HFONT font_ = nullptr;
     HICON icon_ = nullptr;
-    std::array<IconPair, 3> lights_{};
+    std::array<IconPair, 3> lights_{};  // what the window logic holds; the identity of each light
+    std::array<IconPair, 3> sized_{};   // the same pictures at the window's DPI, as the window shows them
+    HWND focus_ = nullptr;              // the control that had the focus when the window was deactivated
     UINT taskbarCreated_ = 0;
     MainWindowHandlers handlers_;
     XPButtonWindow onOff_;

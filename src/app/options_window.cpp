@@ -1,5 +1,7 @@
 #include "app/options_window.h"
 
+#include <algorithm>
+
 #include "platform/win32/files_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/settings.h"
@@ -21,12 +23,14 @@ constexpr TwipsRect kLabelRects[2] = {{240, 960, 5895, 255}, {240, 1320, 5895, 2
 constexpr TwipsRect kProgressRect{240, 1800, 5895, 255};
 constexpr TwipsRect kCloseRect{4440, 2520, 2055, 495};
 constexpr int kClientWidth = 6615, kClientHeight = 3135;
+constexpr DWORD kStyle = WS_CAPTION | WS_SYSMENU | WS_POPUP | WS_CLIPCHILDREN;
+constexpr DWORD kExStyle = WS_EX_DLGMODALFRAME | WS_EX_CONTROLPARENT;
 
-UINT WindowDpi(HWND hwnd) {
-    HDC dc = ::GetDC(hwnd);
-    UINT dpi = static_cast<UINT>(::GetDeviceCaps(dc, LOGPIXELSY));
-    ::ReleaseDC(hwnd, dc);
-    return dpi == 0 ? 96 : dpi;
+// The window's outer size for the design's client area at `dpi`.
+SIZE OuterSize(UINT dpi) {
+    RECT frame{0, 0, TwipsToPixels(kClientWidth, dpi), TwipsToPixels(kClientHeight, dpi)};
+    ::AdjustWindowRectEx(&frame, kStyle, FALSE, kExStyle);
+    return {frame.right - frame.left, frame.bottom - frame.top};
 }
 
 }  // namespace
@@ -56,17 +60,14 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     HINSTANCE instance = ::GetModuleHandleA(nullptr);
     RegisterWindowClass(instance, kOptionsClass, Proc);
     RegisterWindowClass(instance, kPictureClass, PictureProc);
-    const DWORD style = WS_CAPTION | WS_SYSMENU | WS_POPUP | WS_CLIPCHILDREN;
-    hwnd_ = ::CreateWindowExA(WS_EX_DLGMODALFRAME | WS_EX_CONTROLPARENT, kOptionsClass, "Options", style,
-                              CW_USEDEFAULT, CW_USEDEFAULT, 100, 100, owner, nullptr, instance, this);
+    hwnd_ = ::CreateWindowExA(kExStyle, kOptionsClass, "Options", kStyle, CW_USEDEFAULT, CW_USEDEFAULT, 100, 100,
+                              owner, nullptr, instance, this);
     if (hwnd_ == nullptr) return;
 
-    UINT dpi = WindowDpi(hwnd_);
-    RECT frame{0, 0, TwipsToPixels(kClientWidth, dpi), TwipsToPixels(kClientHeight, dpi)};
-    ::AdjustWindowRectEx(&frame, style, FALSE, WS_EX_DLGMODALFRAME);
+    const UINT dpi = dpi_ = DpiOfWindow(hwnd_);
     RECT ownerRect{0, 0, ::GetSystemMetrics(SM_CXSCREEN), ::GetSystemMetrics(SM_CYSCREEN)};
     if (owner != nullptr && ::IsWindowVisible(owner)) ::GetWindowRect(owner, &ownerRect);
-    int width = frame.right - frame.left, height = frame.bottom - frame.top;
+    const int width = OuterSize(dpi).cx, height = OuterSize(dpi).cy;
     ::SetWindowPos(hwnd_, nullptr, (ownerRect.left + ownerRect.right - width) / 2,
                    (ownerRect.top + ownerRect.bottom - height) / 2, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
 
@@ -92,21 +93,49 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     ::SetWindowLongPtrA(pbWindow_, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(pb_.get()));
     close_ = std::make_unique<Win32Button>(hwnd_, "&Close", kCloseRect, dpi, font_);
     if (frameIndex == 1) ::SetWindowTextA(hwnd_, "Updates");
+    // Focus rectangles and access-key underlines shown from the start, not only after a key press.
+    ::SendMessageA(hwnd_, WM_CHANGEUISTATE, MAKEWPARAM(UIS_CLEAR, UISF_HIDEFOCUS | UISF_HIDEACCEL), 0);
 
     controls_.F = {frames_[0].get(), frames_[1].get()};
     controls_.Box = {boxes_[0].get(), boxes_[1].get(), boxes_[2].get()};
     controls_.BtnCancel = close_.get();
     controls_.BtnUpdate = update_.get();
     controls_.L = {labels_[0].get(), labels_[1].get()};
-    form_ = std::make_unique<FrmOptions>(controls_, registry, executablePath, [this] {
-        if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
-    });
+    form_ = std::make_unique<FrmOptions>(
+        controls_, registry, scheduler_, executablePath,
+        [this] {
+            if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
+        },
+        [this](const std::string& text) {
+            if (hwnd_ != nullptr) ::MessageBoxA(hwnd_, text.c_str(), "Options", MB_OK | MB_ICONEXCLAMATION);
+        });
     form_->Form_Load();
 
     check_ = std::make_unique<UpdateCheck>(*this, inet_, pump_, files_, FD1_, FD2_, FD3_, target.programFolder,
                                            target.version, ServerAddress(registry));
     check_->ConnectEvents();
     update_->Click = [this] { check_->BtnUpdate_Click(); };
+}
+
+void OptionsWindow::ApplyDpi(UINT dpi) {
+    dpi_ = dpi;
+    HFONT old = font_;
+    font_ = CreateDesignFont(dpi);
+    for (auto& frame : frames_) frame->Relayout(dpi, font_);
+    for (auto& box : boxes_) box->Relayout(dpi, font_);
+    for (auto& label : labels_) label->Relayout(dpi, font_);
+    hint_->Relayout(dpi, font_);
+    update_->Relayout(dpi, font_);
+    close_->Relayout(dpi, font_);
+    if (old != nullptr) ::DeleteObject(old);
+    // pb: the box at its new size, with an image of the new size (the next progress step paints it).
+    RECT pb = ToPixels(kProgressRect, dpi), inside{};
+    ::SetWindowPos(pbWindow_, nullptr, pb.left, pb.top, pb.right - pb.left, pb.bottom - pb.top,
+                   SWP_NOZORDER | SWP_NOACTIVATE);
+    ::GetClientRect(pbWindow_, &inside);
+    pb_ = std::make_unique<GdiPictureBox>(inside.right, inside.bottom, pbWindow_);
+    ::SetWindowLongPtrA(pbWindow_, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(pb_.get()));
+    ::InvalidateRect(pbWindow_, nullptr, TRUE);
 }
 
 void OptionsWindow::SetBtnUpdateEnabled(bool enabled) {
@@ -179,7 +208,43 @@ LRESULT CALLBACK OptionsWindow::Proc(HWND hwnd, UINT message, WPARAM wParam, LPA
                 self->form_->BtnCancel_Click();
                 return 0;
             }
+            if (LOWORD(wParam) == IDOK && lParam == 0) {  // Enter: the push button with the focus
+                HWND focus = ::GetFocus();
+                if (focus != nullptr && ::IsChild(hwnd, focus) &&
+                    (::SendMessageA(focus, WM_GETDLGCODE, 0, 0) & (DLGC_DEFPUSHBUTTON | DLGC_UNDEFPUSHBUTTON)))
+                    ::SendMessageA(focus, BM_CLICK, 0, 0);
+                return 0;
+            }
             break;
+        case WM_DPICHANGED:
+            if (self != nullptr && self->form_) {
+                // Moved to a monitor of another DPI: lay out again and take the size the system suggests.
+                self->ApplyDpi(HIWORD(wParam));
+                const RECT* suggested = reinterpret_cast<const RECT*>(lParam);
+                ::SetWindowPos(hwnd, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
+                               suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
+                return 0;
+            }
+            break;
+        case WM_GETMINMAXINFO:
+            if (self != nullptr) {
+                // The design's size at the window's DPI is never cut to the screen's.
+                auto* info = reinterpret_cast<MINMAXINFO*>(lParam);
+                SIZE outer = OuterSize(self->dpi_);
+                info->ptMaxTrackSize.x = std::max<LONG>(info->ptMaxTrackSize.x, outer.cx);
+                info->ptMaxTrackSize.y = std::max<LONG>(info->ptMaxTrackSize.y, outer.cy);
+                return 0;
+            }
+            break;
+        case WM_SETFOCUS:
+            // The keyboard starts on the first control of the visible frame.
+            if (self != nullptr && self->close_) {
+                HWND first = self->frames_[0]->Visible() ? self->boxes_[0]->hwnd()
+                             : self->update_->Enabled()  ? self->update_->hwnd()
+                                                         : self->close_->hwnd();
+                ::SetFocus(first);
+            }
+            return 0;
         case WM_CLOSE:
             ::DestroyWindow(hwnd);
             return 0;

@@ -2,7 +2,8 @@
 // keeps the owner's timers running, and the window procedure that hands clicks to the controls.
 // The window is the updates panel of the update check: "&Check for Updates" runs the check with
 // the window's own downloaders FD1 to FD3 (WinINet), painting progress into the picture box pb.
-// Closing the window while a check runs stops the check at its next step.
+// Closing the window while a check runs stops the check at its next step. Moved to a monitor of
+// another DPI, the window lays itself out again in twips at that DPI.
 #pragma once
 
 #include <windows.h>
@@ -18,6 +19,7 @@
 #include "platform/win32/http_transfer_win32.h"
 #include "platform/win32/picture_box_win32.h"
 #include "platform/win32/shell_win32.h"
+#include "platform/win32/task_scheduler_win32.h"
 #include "ui/options/frm_options.h"
 #include "ui/options/update_check.h"
 
@@ -66,10 +68,13 @@ public:
 private:
     static LRESULT CALLBACK Proc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
     static LRESULT CALLBACK PictureProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
+    // Lays the window out for `dpi`: controls in twips, the design font, pb at its new size.
+    void ApplyDpi(UINT dpi);
 
     HWND owner_;
     HWND hwnd_ = nullptr;
     HFONT font_ = nullptr;
+    UINT dpi_ = 96;
     bool closed_ = false;
     std::unique_ptr<Win32Frame> frames_[2];
     std::unique_ptr<Win32CheckBox> boxes_[3];
@@ -78,6 +83,7 @@ private:
     HWND pbWindow_ = nullptr;  // pb's window: hidden until a download starts
     std::unique_ptr<GdiPictureBox> pb_;
     OptionsControls controls_;
+    Win32TaskScheduler scheduler_;
     std::unique_ptr<FrmOptions> form_;
 
     // The update check's transfers, downloaders and the check itself: they live while the window

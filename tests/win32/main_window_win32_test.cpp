@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <cstring>
 #include <string>
 #include <vector>
@@ -21,6 +22,7 @@
 #include "platform/win32/shell_win32.h"
 #include "ui/main/frm_main.h"
 #include "version.h"
+#include "win32/ui_input.h"
 
 namespace vantorel {
 namespace {
@@ -164,10 +166,10 @@ TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
 
     // The status light is the window's real icon, big and small.
     form.TimerTick();
-    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), window.Lights(kLightBright));
+    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), reinterpret_cast<LRESULT>(window.ShownLight(kLightBright)));
     EXPECT_NE(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0), 0);
     form.TimerTick();
-    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), window.Lights(kLightDark));
+    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), reinterpret_cast<LRESULT>(window.ShownLight(kLightDark)));
 
     // Real clicks on the Win32 buttons reach the handler by index.
     ::SendMessageA(window.BtnO(kBtnUpdates).hwnd(), BM_CLICK, 0, 0);
@@ -200,6 +202,73 @@ TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     EXPECT_EQ(window.Hwnd(), nullptr);
     MSG quit;
     EXPECT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE)) << "the message loop is told to end";
+}
+
+TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
+    win32::MainWindow window;
+    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
+    HWND hwnd = window.Hwnd();
+    ::ShowWindow(hwnd, SW_SHOWNA);
+    for (UINT dpi : {144u, 192u, 120u, 96u}) {
+        const int d = static_cast<int>(dpi);
+        RECT suggested = win32::SendDpiChange(hwnd, dpi, {9120, 4335}), now, client;
+        ::GetWindowRect(hwnd, &now);
+        EXPECT_TRUE(::EqualRect(&now, &suggested)) << dpi << ": the suggested rectangle taken";
+        ::GetClientRect(hwnd, &client);
+        EXPECT_EQ(client.right, ::MulDiv(9120, d, 1440)) << dpi;
+        RECT onOff = ChildRect(window.BtnOnOff().Handle(), hwnd);
+        EXPECT_EQ(onOff.left, ::MulDiv(120, d, 1440)) << dpi;
+        EXPECT_EQ(onOff.bottom - onOff.top, ::MulDiv(4095, d, 1440)) << dpi;
+        RECT options = ChildRect(window.BtnO(kBtnOptions).hwnd(), hwnd), panel = ChildRect(window.Uf(1).hwnd(), hwnd);
+        EXPECT_EQ(options.left - panel.left, ::MulDiv(2400, d, 1440)) << dpi;
+        EXPECT_EQ(panel.right - panel.left, ::MulDiv(6375, d, 1440)) << dpi;
+        EXPECT_EQ(win32::FontHeight(window.BtnO(kBtnExit).hwnd()), -::MulDiv(825, d, 7200)) << dpi;
+        HWND onOffHwnd = window.BtnOnOff().Handle();
+        EXPECT_EQ(win32::FontHeight(onOffHwnd), -std::lround(14.25 * d / 72)) << dpi << ": the switch";
+        HDC dc = ::GetDC(onOffHwnd);
+        HGDIOBJ old = ::SelectObject(dc, reinterpret_cast<HFONT>(::SendMessageA(onOffHwnd, WM_GETFONT, 0, 0)));
+        SIZE off{};
+        ::GetTextExtentPoint32A(dc, "OFF", 3, &off);
+        ::SelectObject(dc, old);
+        ::ReleaseDC(onOffHwnd, dc);
+        const auto& caption = window.BtnOnOffWindow().button().captionRect();
+        EXPECT_EQ(caption.right - caption.left, off.cx) << dpi << ": the switch's caption laid out in that font";
+        EXPECT_EQ(win32::IconWidth(reinterpret_cast<HICON>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0))),
+                  ::MulDiv(32, d, 96)) << dpi;
+        EXPECT_EQ(win32::TextsCut(hwnd, dpi), "") << dpi;
+    }
+
+    // The keyboard, through a loop that hands dialog keys to the window as the program's does: the
+    // switch has the focus first; Tab walks the panels' buttons, then the row, and round; each
+    // button's access key presses it.
+    ::ShowWindow(hwnd, SW_SHOW);
+    ::SetForegroundWindow(hwnd);
+    std::vector<HWND> focus;
+    std::string pressed;
+    const char keys[] = "TEHUO";
+    for (int i = 0; i < 5; ++i) window.BtnO(i).Click = [&, i] { pressed += keys[i]; };
+    std::size_t step = 0;
+    win32::Ticker user(60, [&] {
+        if (step < 7) focus.push_back(::GetFocus());
+        if (step < 7) win32::Key(VK_TAB);
+        else win32::Key(static_cast<WORD>("OUTEH"[step - 7]), true);
+        return ++step == 12;
+    });
+    for (DWORD start = ::GetTickCount(); pressed.size() < 5 && ::GetTickCount() - start < 5000;) {
+        MSG msg;
+        if (!::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
+            ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
+            continue;
+        }
+        if (::IsDialogMessageA(hwnd, &msg)) continue;
+        ::TranslateMessage(&msg);
+        ::DispatchMessageA(&msg);
+    }
+    HWND onOff = window.BtnOnOff().Handle();
+    EXPECT_EQ(focus, (std::vector<HWND>{onOff, window.BtnO(kBtnOptions).hwnd(), window.BtnO(kBtnUpdates).hwnd(),
+                                        window.BtnO(kBtnTray).hwnd(), window.BtnO(kBtnExit).hwnd(),
+                                        window.BtnO(kBtnHelp).hwnd(), onOff}));
+    EXPECT_EQ(pressed, "OUTEH");
 }
 
 }  // namespace

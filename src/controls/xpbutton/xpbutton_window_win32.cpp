@@ -235,7 +235,14 @@ void XPButtonWindow::SetEnabled(bool enabled) {
     if (hwnd_) ::EnableWindow(hwnd_, enabled);
 }
 
-void XPButtonWindow::SetFont(const platform::FontDesc& font) { font_ = MakeFont(font); }
+void XPButtonWindow::SetFont(const platform::FontDesc& font) { font_ = MakeFont(font, static_cast<int>(dpi_)); }
+
+void XPButtonWindow::SetDpi(UINT dpi) {
+    dpi_ = dpi;
+    canvas_.SetDpi(static_cast<int>(dpi));
+    font_ = MakeFont(button_->Font(), static_cast<int>(dpi));
+    if (hwnd_) button_->Refresh();
+}
 
 bool XPButtonWindow::SetMouseIcon(const platform::PicturePtr& picture) {
     if (picture && !dynamic_cast<const GdiPicture*>(picture.get())) return false;

@@ -46,6 +46,9 @@ public:
     xpbutton::KirelXPButton& button() { return *button_; }
     xpbutton::XPButtonEvents& events() { return button_->events; }
     GdiCanvas& canvas() { return canvas_; }
+    // The window moved to a monitor of `dpi`: the caption's font is made for it and the control
+    // lays its caption out and paints again.
+    void SetDpi(UINT dpi);
     // The container reports this control as its default button.
     void SetDefault(bool isDefault);
     // The container's ambient properties (system colours) changed.
@@ -90,6 +93,7 @@ private:
     GdiCanvas canvas_;
     std::unique_ptr<xpbutton::KirelXPButton> button_;
     UniqueHfont font_;
+    UINT dpi_ = 0;  // 0: the screen's
     bool default_ = false;
     bool doubleClicked_ = false;
     bool leftPressed_ = false;  // a left press on the control, the mouse captured since

@@ -1,6 +1,8 @@
 #include "platform/win32/controls_win32.h"
 
+#include <algorithm>
 #include <string>
+#include <vector>
 
 namespace vantorel::win32 {
 
@@ -42,6 +44,12 @@ std::string TextOf(HWND hwnd) {
     int copied = ::GetWindowTextA(hwnd, text.data(), length + 1);
     text.resize(static_cast<std::size_t>(copied > 0 ? copied : 0));
     return text;
+}
+
+// A character of the system code page in lower case.
+char LowerChar(char c) {
+    ::CharLowerBuffA(&c, 1);
+    return c;
 }
 
 LRESULT CALLBACK FrameProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
@@ -114,6 +122,22 @@ void RegisterWindowClass(HINSTANCE instance, const char* name, WNDPROC proc) {
     ::RegisterClassA(&wc);
 }
 
+UINT DpiOfWindow(HWND hwnd) {
+    using GetDpiForWindowFunction = UINT(WINAPI*)(HWND);
+    if (HMODULE user32 = ::GetModuleHandleA("user32.dll")) {
+        auto get = reinterpret_cast<GetDpiForWindowFunction>(
+            reinterpret_cast<void*>(::GetProcAddress(user32, "GetDpiForWindow")));
+        if (get != nullptr) {
+            UINT dpi = get(hwnd);
+            if (dpi != 0) return dpi;
+        }
+    }
+    HDC dc = ::GetDC(hwnd);
+    UINT dpi = static_cast<UINT>(::GetDeviceCaps(dc, LOGPIXELSY));
+    ::ReleaseDC(hwnd, dc);
+    return dpi == 0 ? 96 : dpi;
+}
+
 int TwipsToPixels(int twips, UINT dpi) { return ::MulDiv(twips, static_cast<int>(dpi), 1440); }
 
 RECT ToPixels(const TwipsRect& rect, UINT dpi) {
@@ -129,6 +153,53 @@ HFONT CreateDesignFont(UINT dpi) {
                          CLIP_DEFAULT_PRECIS, DEFAULT_QUALITY, DEFAULT_PITCH | FF_SWISS, "Verdana");
 }
 
+void PlaceControl(HWND control, const TwipsRect& rect, UINT dpi, HFONT font) {
+    RECT r = ToPixels(rect, dpi);
+    ::SetWindowPos(control, nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
+                   SWP_NOZORDER | SWP_NOACTIVATE);
+    ::SendMessageA(control, WM_SETFONT, reinterpret_cast<WPARAM>(font), TRUE);
+    ::InvalidateRect(control, nullptr, TRUE);
+}
+
+bool HandleAccessKey(HWND top, char key) {
+    struct Search {
+        char key;
+        std::vector<HWND> found;
+    } search{LowerChar(key), {}};
+    ::EnumChildWindows(
+        top,
+        [](HWND control, LPARAM data) -> BOOL {
+            auto& s = *reinterpret_cast<Search*>(data);
+            char cls[16] = {};
+            ::GetClassNameA(control, cls, sizeof cls);
+            const LONG_PTR type = ::GetWindowLongPtrA(control, GWL_STYLE) & BS_TYPEMASK;
+            if (lstrcmpiA(cls, "Button") != 0 || (type != BS_PUSHBUTTON && type != BS_DEFPUSHBUTTON) ||
+                !::IsWindowVisible(control) || !::IsWindowEnabled(control))
+                return TRUE;
+            std::string text = TextOf(control);
+            for (std::size_t i = 0; i + 1 < text.size(); ++i) {
+                if (text[i] != '&') continue;
+                if (text[i + 1] == '&') {
+                    ++i;
+                    continue;
+                }
+                if (LowerChar(text[i + 1]) == s.key) s.found.push_back(control);
+                break;
+            }
+            return TRUE;
+        },
+        reinterpret_cast<LPARAM>(&search));
+    if (search.found.empty()) return false;
+    if (search.found.size() == 1) {
+        ::SetFocus(search.found[0]);
+        ::SendMessageA(search.found[0], BM_CLICK, 0, 0);
+        return true;
+    }
+    auto at = std::find(search.found.begin(), search.found.end(), ::GetFocus());
+    ::SetFocus(at == search.found.end() || at + 1 == search.found.end() ? search.found[0] : *(at + 1));
+    return true;
+}
+
 bool RouteCommand(WPARAM wParam, LPARAM lParam) {
     HWND control = reinterpret_cast<HWND>(lParam);
     if (control == nullptr || HIWORD(wParam) != BN_CLICKED) return false;
@@ -142,7 +213,7 @@ bool RouteCommand(WPARAM wParam, LPARAM lParam) {
 }
 
 Win32Button::Win32Button(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font)
-    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_PUSHBUTTON, caption, rect, dpi, font)) {
+    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_PUSHBUTTON, caption, rect, dpi, font)), rect_(rect) {
     Tag(hwnd_, this, Kind::kButton);
 }
 Win32Button::~Win32Button() { Untag(hwnd_); }
@@ -152,7 +223,7 @@ void Win32Button::SetEnabled(bool enabled) { ::EnableWindow(hwnd_, enabled ? TRU
 bool Win32Button::Enabled() const { return ::IsWindowEnabled(hwnd_) != FALSE; }
 
 Win32Label::Win32Label(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font)
-    : hwnd_(CreateControl(parent, "STATIC", SS_LEFT, caption, rect, dpi, font)) {}
+    : hwnd_(CreateControl(parent, "STATIC", SS_LEFT, caption, rect, dpi, font)), rect_(rect) {}
 Win32Label::~Win32Label() = default;
 void Win32Label::SetCaption(const std::string& caption) {
     ::SetWindowTextA(hwnd_, caption.c_str());
@@ -161,7 +232,8 @@ void Win32Label::SetCaption(const std::string& caption) {
 std::string Win32Label::Caption() const { return TextOf(hwnd_); }
 
 Win32Frame::Win32Frame(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font,
-                       bool visible) {
+                       bool visible)
+    : rect_(rect) {
     auto instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(parent, GWLP_HINSTANCE));
     RegisterWindowClass(instance, kFrameClass, FrameProc);
     RECT r = ToPixels(rect, dpi);
@@ -177,7 +249,7 @@ void Win32Frame::SetVisible(bool visible) { ::ShowWindow(hwnd_, visible ? SW_SHO
 bool Win32Frame::Visible() const { return (::GetWindowLongPtrA(hwnd_, GWL_STYLE) & WS_VISIBLE) != 0; }
 
 Win32CheckBox::Win32CheckBox(HWND parent, const std::string& caption, const TwipsRect& rect, UINT dpi, HFONT font)
-    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_AUTOCHECKBOX, caption, rect, dpi, font)) {
+    : hwnd_(CreateControl(parent, "BUTTON", WS_TABSTOP | BS_AUTOCHECKBOX, caption, rect, dpi, font)), rect_(rect) {
     Tag(hwnd_, this, Kind::kCheckBox);
 }
 Win32CheckBox::~Win32CheckBox() { Untag(hwnd_); }

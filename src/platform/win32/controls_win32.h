@@ -20,11 +20,24 @@ struct TwipsRect {
 int TwipsToPixels(int twips, UINT dpi);
 RECT ToPixels(const TwipsRect& rect, UINT dpi);
 
+// The window's DPI: GetDpiForWindow where the system has it (per-monitor awareness), else the
+// screen's.
+UINT DpiOfWindow(HWND hwnd);
+
 // The design font, Verdana 8.25 pt, for `dpi`. The caller owns it.
 HFONT CreateDesignFont(UINT dpi);
 
+// Moves `control` to `rect` at `dpi` and gives it `font` (a window that moved to another monitor).
+void PlaceControl(HWND control, const TwipsRect& rect, UINT dpi, HFONT font);
+
 // Registers a window class with the dialog colour and the arrow cursor, once per process.
 void RegisterWindowClass(HINSTANCE instance, const char* name, WNDPROC proc);
+
+// Alt+`key` under `top`: the shown, enabled buttons whose caption marks `key` (case-insensitive).
+// One such button is focused and clicked; when several share the key, each press moves the focus
+// to the next of them without clicking (Enter or Space clicks the focused one). False when no
+// shown button has the key.
+bool HandleAccessKey(HWND top, char key);
 
 // Raises the click of the wrapper that sent this WM_COMMAND. True when one of ours handled it.
 bool RouteCommand(WPARAM wParam, LPARAM lParam);
@@ -43,8 +56,12 @@ public:
         if (Enabled() && Click) Click();
     }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 class Win32Label final : public platform::Label {
@@ -55,8 +72,12 @@ public:
     std::string Caption() const override;
     HWND hwnd() const { return hwnd_; }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 class Win32Frame final : public platform::Frame {
@@ -71,8 +92,12 @@ public:
     // Controls placed on the frame are created with this as their parent.
     HWND hwnd() const { return hwnd_; }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 class Win32CheckBox final : public platform::CheckBox {
@@ -88,8 +113,12 @@ public:
         if (Click) Click();
     }
 
+    // Back to the design rectangle at `dpi`, with `font`.
+    void Relayout(UINT dpi, HFONT font) { PlaceControl(hwnd_, rect_, dpi, font); }
+
 private:
     HWND hwnd_;
+    TwipsRect rect_;
 };
 
 }  // namespace vantorel::win32

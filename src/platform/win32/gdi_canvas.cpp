@@ -15,9 +15,11 @@ constexpr UINT kDrawFlags = DT_CENTER | DT_VCENTER | DT_WORDBREAK;  // 21
 constexpr UINT kMeasureFlags = DT_CALCRECT | DT_WORDBREAK;          // 1040
 }  // namespace
 
-UniqueHfont MakeFont(const platform::FontDesc& font) {
-    WindowDc screen(nullptr);
-    const int dpi = screen.get() ? ::GetDeviceCaps(screen.get(), LOGPIXELSY) : 96;
+UniqueHfont MakeFont(const platform::FontDesc& font, int dpi) {
+    if (dpi == 0) {
+        WindowDc screen(nullptr);
+        dpi = screen.get() ? ::GetDeviceCaps(screen.get(), LOGPIXELSY) : 96;
+    }
     const LONG height = -static_cast<LONG>(std::lround(font.size * dpi / 72.0));
     return UniqueHfont(::CreateFontA(height, 0, 0, 0, font.bold ? FW_BOLD : FW_NORMAL, font.italic, font.underline,
                                      font.strikethrough, DEFAULT_CHARSET, OUT_DEFAULT_PRECIS, CLIP_DEFAULT_PRECIS,
@@ -94,7 +96,7 @@ void GdiCanvas::DrawOval(std::int32_t x, std::int32_t y, std::int32_t w, std::in
 
 void GdiCanvas::DrawText(const std::string& text, const platform::Box& box, Rgb colour,
                          const platform::FontDesc& font) {
-    UniqueHfont hfont = MakeFont(font);
+    UniqueHfont hfont = MakeFont(font, dpi_);
     SelectGuard select(dc_.get(), hfont.get());
     const int oldMode = ::SetBkMode(dc_.get(), TRANSPARENT);
     const COLORREF oldColour = ::SetTextColor(dc_.get(), Colour(colour));
@@ -106,7 +108,7 @@ void GdiCanvas::DrawText(const std::string& text, const platform::Box& box, Rgb 
 
 platform::Box GdiCanvas::MeasureText(const std::string& text, const platform::Box& box,
                                      const platform::FontDesc& font) {
-    UniqueHfont hfont = MakeFont(font);
+    UniqueHfont hfont = MakeFont(font, dpi_);
     SelectGuard select(dc_.get(), hfont.get());
     RECT r{box.left, box.top, box.right, box.bottom};
     ::DrawTextA(dc_.get(), text.c_str(), static_cast<int>(text.size()), &r, kMeasureFlags);

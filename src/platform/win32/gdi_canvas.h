@@ -17,6 +17,8 @@ public:
     ~GdiCanvas() override;
 
     void SetWindow(HWND window) { window_ = window; }
+    // Text is drawn and measured at `dpi` (0: the screen's), the DPI of the monitor the window is on.
+    void SetDpi(int dpi) { dpi_ = dpi; }
 
     void Resize(std::int32_t w, std::int32_t h) override;
     void Clear() override;
@@ -52,9 +54,10 @@ private:
     std::uint32_t* bits_ = nullptr;  // top-down rows of 0x00RRGGBB
     std::int32_t w_ = 0;
     std::int32_t h_ = 0;
+    int dpi_ = 0;
 };
 
-// A GDI font for a FontDesc at the screen's resolution.
-UniqueHfont MakeFont(const platform::FontDesc& font);
+// A GDI font for a FontDesc at `dpi` pixels per inch (0: the screen's).
+UniqueHfont MakeFont(const platform::FontDesc& font, int dpi = 0);
 
 }  // namespace vantorel::win32

@@ -1,5 +1,7 @@
 #include "platform/win32/shell_win32.h"
 
+#include "platform/win32/controls_win32.h"
+
 #include <shellapi.h>
 
 #include <cstring>
@@ -85,6 +87,10 @@ bool Win32MessagePump::PumpMessages() {
 
 void DispatchQueuedMessage(MSG& message) {
     HWND root = message.hwnd != nullptr ? ::GetAncestor(message.hwnd, GA_ROOT) : nullptr;
+    // Alt+letter: the program's own rule for an access key that two buttons share ("&Close" and
+    // "&Check for Updates") and for buttons on a hidden frame; the dialog handling otherwise.
+    if (root != nullptr && message.message == WM_SYSCHAR && HandleAccessKey(root, static_cast<char>(message.wParam)))
+        return;
     if (root != nullptr && ::IsDialogMessageA(root, &message)) return;
     ::TranslateMessage(&message);
     ::DispatchMessageA(&message);

@@ -1,5 +1,7 @@
 #include "ui/options/frm_options.h"
 
+#include <cstdio>
+
 #include "settings/settings.h"
 
 namespace vantorel {
@@ -15,14 +17,24 @@ bool IsOne(const Variant& value) {
     return number && !IsEmpty(value) && *number == 1;
 }
 
+// "CALL failed with HRESULT 0x80070005: TEXT".
+std::string Describe(const platform::TaskFailure& failure) {
+    char code[16];
+    std::snprintf(code, sizeof code, "0x%08X", static_cast<unsigned>(failure.hresult));
+    return failure.call + " failed with HRESULT " + code + (failure.text.empty() ? "" : ": " + failure.text);
+}
+
 }  // namespace
 
-FrmOptions::FrmOptions(const OptionsControls& controls, platform::Registry& registry, std::string executablePath,
-                       std::function<void()> unload)
+FrmOptions::FrmOptions(const OptionsControls& controls, platform::Registry& registry, platform::TaskScheduler& scheduler,
+                       std::string executablePath, std::function<void()> unload,
+                       std::function<void(const std::string&)> showMessage)
     : controls_(controls),
       registry_(registry),
+      scheduler_(scheduler),
       executablePath_(std::move(executablePath)),
-      unload_(std::move(unload)) {
+      unload_(std::move(unload)),
+      showMessage_(std::move(showMessage)) {
     for (int i = 0; i < 3; ++i)
         if (controls_.Box[i]) controls_.Box[i]->Click = [this, i] { Box_Click(i); };
     if (controls_.BtnCancel) controls_.BtnCancel->Click = [this] { BtnCancel_Click(); };
@@ -54,20 +66,9 @@ void FrmOptions::Box_Click(int index) {
     if (loading_ || index < 0 || index > 2) return;
     bool checked = controls_.Box[index]->Value();
     switch (index) {
-        case 0: {
-            if (checked) {
-                RegistryRoutines run = OpenOrCreate(registry_, kHkeyLocalMachine, kRunKey);
-                run.SetRegistryValue(kRunValue, executablePath_, platform::kRegSz);
-            } else {
-                RegistryRoutines run(registry_);
-                run.hkey(kHkeyLocalMachine);
-                run.KeyRoot(std::string(kRunKey) + "\\");
-                run.DeleteValue(kRunValue);
-            }
-            RegistryRoutines reg = OpenSettings(registry_, kHkeyLocalMachine);
-            reg.SetRegistryValue(kStartValue, std::string(checked ? "1" : "0"), platform::kRegSz);
+        case 0:
+            StartWithWindows(checked);
             break;
-        }
         case 1: {
             RegistryRoutines reg(registry_);
             reg.hkey(kHkeyLocalMachine);
@@ -84,6 +85,34 @@ void FrmOptions::Box_Click(int index) {
         default:
             break;
     }
+}
+
+void FrmOptions::StartWithWindows(bool checked) {
+    // Quoted: an unquoted path with blanks ("C:\Program Files\...") could start another program.
+    const std::string command = "\"" + executablePath_ + "\"";
+    platform::TaskFailure failure =
+        checked ? scheduler_.RegisterLogonTask(kStartTaskName, command) : scheduler_.DeleteTask(kStartTaskName);
+    if (failure.Failed()) {
+        loading_ = true;  // a box that clicks when set from code must not start this again
+        controls_.Box[0]->SetValue(!checked);
+        loading_ = false;
+        if (showMessage_)
+            showMessage_(std::string(checked ? "Vantorel cannot be set to start when Windows boots"
+                                             : "Vantorel still starts when Windows boots") +
+                         ": the Task Scheduler refused its task \"" + kStartTaskName + "\".\n\n" + Describe(failure));
+        return;
+    }
+    if (checked) {
+        RegistryRoutines run = OpenOrCreate(registry_, kHkeyLocalMachine, kRunKey);
+        run.SetRegistryValue(kRunValue, command, platform::kRegSz);
+    } else {
+        RegistryRoutines run(registry_);
+        run.hkey(kHkeyLocalMachine);
+        run.KeyRoot(std::string(kRunKey) + "\\");
+        run.DeleteValue(kRunValue);
+    }
+    RegistryRoutines reg = OpenSettings(registry_, kHkeyLocalMachine);
+    reg.SetRegistryValue(kStartValue, std::string(checked ? "1" : "0"), platform::kRegSz);
 }
 
 void FrmOptions::BtnCancel_Click() {

@@ -1,7 +1,9 @@
 // FrmOptions: the options window's logic. Two frames: the options (three check boxes stored in the
 // registry as soon as they are toggled) and the updates (the update check runs there). The window
 // keeps no state of its own beyond its controls; every value lives in the registry, and each step
-// makes its own registry routines object.
+// makes its own registry routines object. Starting with Windows is a logon task of the Task
+// Scheduler (the program runs elevated, which the Run key cannot start); the Run value and "Start"
+// are kept beside it as the stored state other tools read.
 #pragma once
 
 #include <array>
@@ -9,9 +11,12 @@
 #include <string>
 
 #include "platform/registry.h"
+#include "platform/task_scheduler.h"
 #include "platform/widgets.h"
 
 namespace vantorel {
+
+inline constexpr const char* kStartTaskName = "Vantorel";
 
 // The options window's controls, as the window declares them.
 struct OptionsControls {
@@ -24,25 +29,33 @@ struct OptionsControls {
 
 class FrmOptions {
 public:
-    // `executablePath`: the program's folder + "\" + its base name + ".exe", written as the
-    // autostart entry. `unload` closes the window.
-    FrmOptions(const OptionsControls& controls, platform::Registry& registry, std::string executablePath,
-               std::function<void()> unload);
+    // `executablePath`: the program's folder + "\" + its base name + ".exe", started (quoted) by the
+    // logon task and written (quoted) as the autostart entry. `unload` closes the window;
+    // `showMessage` tells the user why starting with Windows could not be changed.
+    FrmOptions(const OptionsControls& controls, platform::Registry& registry, platform::TaskScheduler& scheduler,
+               std::string executablePath, std::function<void()> unload,
+               std::function<void(const std::string&)> showMessage);
 
     // Shows the boxes as the stored settings are in effect. Writes no value; a box click that the
     // check box raises while the load sets it is ignored.
     void Form_Load();
 
-    // A box was toggled by the user: store its new state.
+    // A box was toggled by the user: store its new state. When the logon task of "Boot when
+    // Windows boots" cannot be registered (or removed), the box shows its old state again, nothing
+    // is stored and a message names the failing call and its HRESULT.
     void Box_Click(int index);
 
     void BtnCancel_Click();
 
 private:
     OptionsControls controls_;
+    void StartWithWindows(bool checked);
+
     platform::Registry& registry_;
+    platform::TaskScheduler& scheduler_;
     std::string executablePath_;
     std::function<void()> unload_;
+    std::function<void(const std::string&)> showMessage_;
     bool loading_ = false;
 };
 
