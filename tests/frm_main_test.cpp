@@ -341,6 +341,20 @@ TEST(MissingDefinitions, MessageThenUpdatesThenASecondMessageAndTheProgramCarrie
     EXPECT_TRUE(rig.timer.enabled);
 }
 
+TEST(MissingDefinitions, AFileThatCannotBeReadIsReportedLikeAMissingOne) {
+    MainRig rig;
+    rig.files.MakeUnreadable(kDefinitionsPath);
+    rig.Start();
+    EXPECT_EQ(rig.events, (std::vector<std::string>{"MessageBox Definitions Error", "Options 1",
+                                                    "MessageBox Definitions Error"}));
+    ASSERT_EQ(rig.shell.boxes.size(), 2u);
+    EXPECT_EQ(rig.shell.boxes[0].text, std::string("Reading definitions, installation corrupted re-install at "
+                                                   "http://www.vantorel.com/\n\n") + kUnreadableDefinitionsText);
+    EXPECT_EQ(rig.shell.boxes[1].text, kStillUnreadableText);
+    EXPECT_EQ(Definitions.size(), 0u);
+    EXPECT_TRUE(rig.timer.enabled);
+}
+
 TEST(MissingDefinitions, AFileInstalledByTheUpdatesWindowIsReadWithoutASecondMessage) {
     MainRig rig;
     rig.files.Remove(kDefinitionsPath);
