@@ -169,8 +169,8 @@ TEST(FrmMainButtons, AModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
     rig.Start();
     rig.table.rows = {Row(5, Ipv4(9, 9, 9, 9)), Row(5, Ipv4(1, 2, 3, 4)), Row(5, Ipv4(8, 8, 8, 8))};
     // The click on "&Options" reaches the window while the first sweep lets messages run; the
-    // options window's own loop then ticks three times while it is open, and a tick the held sweep's
-    // yield takes itself is still dropped.
+    // options window's own loop then ticks three times while it is open; a tick that a running
+    // sweep's own yield takes is still dropped.
     rig.pump.onPump = [&] {
         if (rig.pump.pumps == 1) rig.btnO[kBtnOptions].UserClick();
         if (rig.pump.pumps == 2) rig.pump.OwnTick([&] { rig.form.TmrTick(); });
