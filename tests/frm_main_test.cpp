@@ -168,8 +168,8 @@ TEST(FrmMainButtons, AModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
     rig.Start();
     rig.table.rows = {Row(5, Ipv4(9, 9, 9, 9)), Row(5, Ipv4(1, 2, 3, 4)), Row(5, Ipv4(8, 8, 8, 8))};
     // The click on "&Options" reaches the window while the first sweep lets messages run; the
-    // options window's own loop then ticks three times while it is open, and a tick the held sweep's
-    // yield takes itself is still dropped.
+    // options window's own loop then ticks three times while it is open; a tick that a running
+    // sweep's own yield takes is still dropped.
     rig.pump.onPump = [&] {
         if (rig.pump.pumps == 1) rig.btnO[kBtnOptions].UserClick();
         if (rig.pump.pumps == 2) rig.pump.OwnTick([&] { rig.form.TmrTick(); });
@@ -339,6 +339,20 @@ TEST(MissingDefinitions, MessageThenUpdatesThenASecondMessageAndTheProgramCarrie
     EXPECT_EQ(rig.application.ends, 0);
     EXPECT_EQ(Definitions.size(), 0u);
     EXPECT_EQ(rig.frm.caption, "Vantorel -  0 attempts intercepted");
+    EXPECT_TRUE(rig.timer.enabled);
+}
+
+TEST(MissingDefinitions, AFileThatCannotBeReadIsReportedLikeAMissingOne) {
+    MainRig rig;
+    rig.files.MakeUnreadable(kDefinitionsPath);
+    rig.Start();
+    EXPECT_EQ(rig.events, (std::vector<std::string>{"MessageBox Definitions Error", "Options 1",
+                                                    "MessageBox Definitions Error"}));
+    ASSERT_EQ(rig.shell.boxes.size(), 2u);
+    EXPECT_EQ(rig.shell.boxes[0].text, std::string("Reading definitions, installation corrupted re-install at "
+                                                   "http://www.vantorel.com/\n\n") + kUnreadableDefinitionsText);
+    EXPECT_EQ(rig.shell.boxes[1].text, kStillUnreadableText);
+    EXPECT_EQ(Definitions.size(), 0u);
     EXPECT_TRUE(rig.timer.enabled);
 }
 

@@ -39,11 +39,11 @@ TEST(ReadDefinitions, MissingFileAsksForHelpThenLooksAgain) {
     EXPECT_EQ(FindDefinition(list, std::int32_t{3}), kNoDefinition);
     EXPECT_EQ(FindDefinition(list, "3"), kNoDefinition);
 
-    // Present but unreadable: no prompt, nothing read.
+    // Present but unreadable: asked for like a missing file, nothing read.
     files.Put(path, "4");
     files.MakeUnreadable(path);
     EXPECT_FALSE(ReadDefinitions(path, files, [&] { ++missing; }).has_value());
-    EXPECT_EQ(missing, 2);
+    EXPECT_EQ(missing, 3);
     EXPECT_FALSE(ReadDefinitions(path, files, nullptr).has_value());
 }
 

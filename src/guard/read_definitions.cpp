@@ -6,14 +6,20 @@ std::string DefinitionsPath(const std::string& programFolder) {
     return programFolder + "\\" + kDefinitionsFileName;
 }
 
+bool DefinitionsUsable(const std::string& path, platform::Files& files) {
+    std::optional<std::uint64_t> size = files.ReadableSize(path);
+    return size && *size <= kMaxDefinitionsBytes;
+}
+
 std::optional<std::string> ReadDefinitions(const std::string& path, platform::Files& files,
                                            const std::function<void()>& onMissing) {
-    if (!files.Exists(path)) {
+    if (!DefinitionsUsable(path, files)) {
         if (onMissing) onMissing();
-        if (!files.Exists(path)) return std::nullopt;
+        if (!DefinitionsUsable(path, files)) return std::nullopt;
     }
     std::string text;
-    if (!files.ReadAll(path, text)) return std::nullopt;
+    // A file that grew past the limit since it was looked at is not kept either.
+    if (!files.ReadAll(path, text) || text.size() > kMaxDefinitionsBytes) return std::nullopt;
     return text;
 }
 

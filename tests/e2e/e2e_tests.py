@@ -8,6 +8,7 @@ starts it inside a Wine desktop, reads its windows with vtprobe.exe, clicks with
 settings with `wine reg`. One Wine prefix and display serve the whole run.
 """
 import os
+import re
 import shutil
 import socket
 import sys
@@ -248,31 +249,54 @@ class MainWindow(unittest.TestCase):
         self.assertIsNotNone(SESSION.find(lambda w: is_main(w) and not w.visible, timeout=10),
                              "Alt+T presses \"&Tray\"")
 
-    def test_a_listed_loopback_connection_makes_the_count_grow(self):
-        """127.0.0.2 is listed (key 33554559). Under Wine SetTcpEntry is a stub that answers success
-        and closes nothing, so every sweep counts the connection again."""
+    def listed_connection(self, unlisted=0):
+        """Guard on, 127.0.0.2 listed (key 33554559) and one connection to it, plus `unlisted`
+        connections to 127.0.0.1 that make every sweep longer. Under Wine SetTcpEntry is a stub that
+        answers success and closes nothing, so every sweep counts the listed connection again."""
         self.folder.remove()
         self.folder = ProgramFolder(definitions=b"-939524086\r\n33554559")
         SESSION.reg_add(HKCU_KEY, "State", "1")
-        listener = socket.socket()
-        listener.bind(("127.0.0.2", 0))
-        listener.listen(1)
-        client = socket.create_connection(listener.getsockname())
-        server, _ = listener.accept()
-        try:
-            self.start()
+        sockets = []
+        for host, n in (("127.0.0.2", 1), ("127.0.0.1", unlisted)):
+            if n == 0:
+                continue
+            listener = socket.socket()
+            listener.bind((host, 0))
+            listener.listen(n + 8)
+            sockets.append(listener)
+            sockets += [socket.create_connection(listener.getsockname()) for _ in range(n)]
+        self.addCleanup(lambda: [s.close() for s in sockets])
 
-            def count():
-                w = SESSION.find(is_main, timeout=5)
-                return int(w.caption.split()[2]) if w is not None else 0
+    def count(self):
+        w = SESSION.find(is_main, timeout=5)
+        return int(w.caption.split()[2]) if w is not None else 0
 
-            first = wait_for(count, 20)
-            self.assertGreater(first, 0, "the connection is counted")
-            self.assertTrue(wait_for(lambda: count() > first, 20), "and the count keeps growing")
-            self.assertGreater(int(SESSION.reg_query(HKCU_KEY, "Attempts")), 0)
-        finally:
-            for s in (client, server, listener):
-                s.close()
+    def test_a_listed_loopback_connection_makes_the_count_grow(self):
+        self.listed_connection()
+        self.start()
+        first = wait_for(self.count, 20)
+        self.assertGreater(first, 0, "the connection is counted")
+        self.assertTrue(wait_for(lambda: self.count() > first, 20), "and the count keeps growing")
+        self.assertGreater(int(SESSION.reg_query(HKCU_KEY, "Attempts")), 0)
+
+    def test_the_guard_keeps_sweeping_while_the_options_window_is_open(self):
+        """With 1,500 more connections a sweep takes longer than the 55 ms between ticks, so the
+        click on "&Options" is nearly always handled in the middle of one."""
+        self.listed_connection(unlisted=1500)
+        self.start()
+        self.assertTrue(wait_for(lambda: self.count() > 0, 30), "the connection is counted")
+        window = self.main_window()
+        for attempt in range(3):
+            SESSION.click(*self.control(window, lambda c: c.caption == "&Options").centre())
+            options = SESSION.find(lambda w: w.caption == "Options" and w.visible, timeout=10)
+            self.assertIsNotNone(options, "the options window opens")
+            before = self.count()
+            self.assertTrue(wait_for(lambda: self.count() > before + 1, 15),
+                            "attempt %d: sweeps go on while the options window is open" % attempt)
+            SESSION.post(options, WM_CLOSE)
+            self.assertTrue(wait_for(lambda: not any(w.caption == "Options" for w in SESSION.windows()), 10))
+        examined = re.findall(r"the last sweep examined (\d+) rows", SESSION.program_output())
+        self.assertGreater(int(examined[-1]), 1500, "every sweep looked at the many connections")
 
 
 if __name__ == "__main__":

@@ -65,6 +65,38 @@ TEST(Win32Files, LoadsDefinitionsFromARealFile) {
     EXPECT_EQ(unchanged, "kept") << "a failed read leaves the text as it was";
 }
 
+TEST(Win32Files, ADefinitionsFileThatCannotBeUsedIsAskedForLikeAMissingOne) {
+    ScratchFolder folder;
+    win32::Win32Files files;
+    const std::string path = DefinitionsPath(folder.path());
+    auto attempt = [&](const char* what) {
+        int missing = 0;
+        DefinitionList list = DefinitionList::FromText("67305985");
+        EXPECT_FALSE(LoadDefinitions(path, files, [&] { ++missing; }, list)) << what;
+        EXPECT_EQ(missing, 1) << what;
+        EXPECT_EQ(list.size(), 0u) << what;
+    };
+    ASSERT_TRUE(::CreateDirectoryA(path.c_str(), nullptr));  // a folder of that name
+    attempt("a folder");
+    ::RemoveDirectoryA(path.c_str());
+
+    WriteFile(path, "67305985");  // held open by another program that shares no reading
+    HANDLE locked = ::CreateFileA(path.c_str(), GENERIC_READ, 0, nullptr, OPEN_EXISTING, 0, nullptr);
+    ASSERT_NE(locked, INVALID_HANDLE_VALUE);
+    attempt("a locked file");
+    ::CloseHandle(locked);
+
+    // Past the size limit (a sparse file: nothing is written), and exactly at it.
+    HANDLE big = ::CreateFileA(path.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_ALWAYS, 0, nullptr);
+    LARGE_INTEGER end;
+    end.QuadPart = static_cast<LONGLONG>(kMaxDefinitionsBytes) + 1;
+    ASSERT_TRUE(::SetFilePointerEx(big, end, nullptr, FILE_BEGIN) && ::SetEndOfFile(big));
+    ::CloseHandle(big);
+    attempt("a file over 256 MB");
+    EXPECT_EQ(files.ReadableSize(path), kMaxDefinitionsBytes + 1);
+    EXPECT_FALSE(DefinitionsUsable(path, files));
+}
+
 TEST(Win32Files, ProgramFolderIsTheExecutablesFolder) {
     std::string folder = win32::ProgramFolder();
     char module[MAX_PATH];

@@ -28,6 +28,15 @@ bool Win32Files::ReadAll(const std::string& path, std::string& content) {
     return true;
 }
 
+std::optional<std::uint64_t> Win32Files::ReadableSize(const std::string& path) {
+    // Opened exactly as ReadAll opens it, so a file this accepts can be read.
+    UniqueFile file(::CreateFileA(path.c_str(), GENERIC_READ, FILE_SHARE_READ, nullptr, OPEN_EXISTING,
+                                  FILE_ATTRIBUTE_NORMAL, nullptr));
+    LARGE_INTEGER size{};
+    if (!file || !::GetFileSizeEx(file.get(), &size) || size.QuadPart < 0) return std::nullopt;
+    return static_cast<std::uint64_t>(size.QuadPart);
+}
+
 std::string ProgramFolder() {
     std::string path(MAX_PATH, '\0');
     for (;;) {

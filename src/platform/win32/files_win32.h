@@ -11,6 +11,7 @@ class Win32Files final : public platform::Files {
 public:
     bool Exists(const std::string& path) override;
     bool ReadAll(const std::string& path, std::string& content) override;
+    std::optional<std::uint64_t> ReadableSize(const std::string& path) override;
 };
 
 // The folder of the running executable, without a trailing backslash.

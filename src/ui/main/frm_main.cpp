@@ -104,12 +104,15 @@ void FrmMain::Unload() {
 
 void FrmMain::DefinitionsMissing() {
     platform::WindowHandle owner = controls_.frmMain.Handle();
-    platform_.shell.ShowMessage(owner, kDefinitionsErrorText + ServerAddress(platform_.guard.registry) + "/",
-                               kDefinitionsErrorTitle, platform::kMbOk | platform::kMbIconStop);
+    const std::string path = DefinitionsPath(programFolder_);
+    std::string text = kDefinitionsErrorText + ServerAddress(platform_.guard.registry) + "/";
+    if (platform_.guard.files.Exists(path)) text += std::string("\n\n") + kUnreadableDefinitionsText;
+    platform_.shell.ShowMessage(owner, text, kDefinitionsErrorTitle, platform::kMbOk | platform::kMbIconStop);
     platform_.application.ShowOptionsModal(owner, 1);
-    if (!platform_.guard.files.Exists(DefinitionsPath(programFolder_))) {
-        platform_.shell.ShowMessage(owner, kNoDefinitionsText, kDefinitionsErrorTitle,
-                                   platform::kMbOk | platform::kMbIconExclamation);
+    if (!DefinitionsUsable(path, platform_.guard.files)) {
+        platform_.shell.ShowMessage(owner,
+                                   platform_.guard.files.Exists(path) ? kStillUnreadableText : kNoDefinitionsText,
+                                   kDefinitionsErrorTitle, platform::kMbOk | platform::kMbIconExclamation);
     }
 }
 

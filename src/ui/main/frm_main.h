@@ -24,6 +24,13 @@ inline constexpr const char* kDefinitionsErrorText = "Reading definitions, insta
 inline constexpr const char* kNoDefinitionsText =
     "The definitions file sw2.def is still missing. Vantorel carries on without definitions and intercepts "
     "nothing until they are installed (Updates).";
+// Added to the messages when sw2.def is there but cannot be used.
+inline constexpr const char* kUnreadableDefinitionsText =
+    "The definitions file sw2.def could not be read: it is locked by another program, not readable with "
+    "your rights, a folder, or larger than 256 MB.";
+inline constexpr const char* kStillUnreadableText =
+    "The definitions file sw2.def still cannot be read. Vantorel carries on without definitions and intercepts "
+    "nothing until they are installed (Updates).";
 inline constexpr const char* kTrayTipMinimised = "Vantorel";
 
 // BtnO indexes.
@@ -77,8 +84,9 @@ public:
     // window's own destruction after the end was asked for) do nothing.
     void Unload();
 
-    // "Definitions Error", then the updates window; when the file is still missing after it has
-    // closed, a second message says the program carries on without definitions.
+    // "Definitions Error", then the updates window; when the file is still missing (or still cannot
+    // be used) after it has closed, a second message says the program carries on without definitions.
+    // A file that is there but cannot be used gets the same flow, its messages saying so.
     void DefinitionsMissing();
 
     // The help page's address: the web server's base address + "/vt/help.php".
