@@ -9,6 +9,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <string>
 
 namespace vantorel::platform {
@@ -53,6 +54,12 @@ public:
 
     // Ends the request (running or finished) and frees what it holds. Harmless when idle.
     virtual void Cancel() = 0;
+
+    // Every wait of the transfer (StillExecuting, GetHeader, GetChunk) also ends as soon as `stop`
+    // answers true, asked after the window messages that ran meanwhile (a click on "Close" sets
+    // the caller's cancel flag there): the request is then abandoned and the call fails as
+    // cancelled. A transfer that never waits may ignore it.
+    virtual void StopWaitingWhen(std::function<bool()> stop) { (void)stop; }
 };
 
 }  // namespace vantorel::platform
