@@ -32,6 +32,7 @@ public:
         : Inet_(Inet), files_(files), pump_(pump) {
         Inet_.StopWaitingWhen([this] { return cancel_; });
     }
+    ~FileDownloader() { Inet_.StopWaitingWhen(nullptr); }
     FileDownloader(const FileDownloader&) = delete;
     FileDownloader& operator=(const FileDownloader&) = delete;
 

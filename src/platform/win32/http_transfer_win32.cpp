@@ -15,7 +15,7 @@ namespace {
 constexpr std::size_t kBlocksAhead = 4;
 // Whole blocks are read while one arrives within this many milliseconds, judged over reads of at
 // least kMeasureMs.
-constexpr ULONGLONG kWholeBlockMs = 200, kMeasureMs = 50;
+constexpr double kWholeBlockMs = 200, kMeasureMs = 5;
 
 using UniqueHinternet = UniqueHandle<NullInvalid<HINTERNET, ::InternetCloseHandle>>;
 
@@ -242,9 +242,14 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
             // arrived (waiting until something has): a slow server's bytes reach the window thread
             // as they come. Once a whole block arrives within kWholeBlockMs, whole blocks are read
             // (one call each, the fast path); a block that takes longer goes back to the careful way.
-            std::string buffer(blockSize, '\0');
+            LARGE_INTEGER frequency, now;
+            ::QueryPerformanceFrequency(&frequency);
+            auto Ms = [&] {
+                ::QueryPerformanceCounter(&now);
+                return static_cast<double>(now.QuadPart) * 1000.0 / static_cast<double>(frequency.QuadPart);
+            };
             bool whole = false;
-            ULONGLONG measureFrom = ::GetTickCount64();
+            double measureFrom = Ms();
             std::size_t measured = 0;
             for (;;) {
                 {
@@ -254,26 +259,27 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
                     });
                     if (shared->stop) break;
                 }
-                DWORD ask = static_cast<DWORD>(buffer.size()), available = 0, read = 0, failure = 0;
+                DWORD ask = static_cast<DWORD>(blockSize), available = 0, read = 0, failure = 0;
                 if (!whole && ::InternetQueryDataAvailable(opened, &available, 0, 0) && available > 0 && available < ask)
                     ask = available;
-                ULONGLONG before = ::GetTickCount64();
-                if (!::InternetReadFile(opened, buffer.data(), ask, &read)) {
+                std::string block(ask, '\0');
+                double before = Ms();
+                if (!::InternetReadFile(opened, block.data(), ask, &read)) {
                     failure = ::GetLastError();
                     read = 0;
                 }
-                ULONGLONG after = ::GetTickCount64();
+                block.resize(read);
+                double after = Ms();
                 if (whole) {
                     whole = after - before <= kWholeBlockMs;
                     measureFrom = after;
                     measured = 0;
                 } else if ((measured += read, after - measureFrom >= kMeasureMs)) {
-                    whole = measured * kWholeBlockMs >= buffer.size() * (after - measureFrom);
+                    whole = static_cast<double>(measured) * kWholeBlockMs >= static_cast<double>(blockSize) * (after - measureFrom);
                     measureFrom = after;
                     measured = 0;
                 }
                 const bool ended = failure != 0 || read == 0;
-                std::string block(buffer.data(), read);
                 platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
                 shared->Publish([&] {
                     shared->queued += block.size();

@@ -53,6 +53,7 @@ public:
     UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, platform::MessagePump& pump, platform::Files& files,
                 FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3, std::string programFolder,
                 ProgramVersion version, std::string server);
+    ~UpdateCheck() { Inet_.StopWaitingWhen(nullptr); }
 
     // Sets the downloaders' event handlers: messages and captions for FD1 and FD2, progress for all.
     void ConnectEvents();
