@@ -99,6 +99,14 @@ TEST_F(NginxUpdateCheck, ProgramVersionOneTenIsOlderThanOneNine) {
     Click({1, 10});
     EXPECT_EQ(frame_.L[1], "Program Updates: Complete");
     EXPECT_EQ(Local("VTSetup.exe"), setup);
+
+    // An empty setup program is no update.
+    Serve("VTSetup.exe", "");
+    ::DeleteFileA((folder_ + "\\VTSetup.exe").c_str());
+    frame_.log.clear();
+    Click({1, 10});
+    EXPECT_EQ(frame_.log[2], "msgbox[Updates]:Error downloading program updates The downloaded setup program is empty.");
+    EXPECT_EQ(::GetFileAttributesA((folder_ + "\\VTSetup.exe").c_str()), INVALID_FILE_ATTRIBUTES);
 }
 
 TEST_F(NginxUpdateCheck, MissingDefinitionsOnTheServerKeepTheInstalledVersion) {

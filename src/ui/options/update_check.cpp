@@ -47,6 +47,11 @@ void UpdateCheck::ConnectEvents() {
         if (!cancelled_) frame_.MsgBoxExclamation("Error downloading program updates " + strError, kTitle);
     };
     FD2_.DowloadComplete = [this] { frame_.SetLCaption(1, "Program Updates: Complete"); };
+    FD2_.CheckFile = [this](const std::string& partialPath) -> std::string {
+        std::string text;
+        if (files_.ReadAll(partialPath, text) && text.empty()) return "The downloaded setup program is empty.";
+        return std::string();
+    };
     FD3_.DownloadErrors = nullptr;
     FD3_.DowloadComplete = nullptr;
     for (FileDownloader* fd : {&FD1_, &FD2_, &FD3_}) {
