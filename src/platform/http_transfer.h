@@ -48,8 +48,9 @@ public:
     virtual bool GetHeader(const std::string& name, std::string& value, TransferError& error) = 0;
 
     // The next piece of the body into `data`: exactly `size` bytes while the body lasts, fewer only
-    // at its end, none once it has ended. Waits as long as the data takes to arrive. False with
-    // `error` when reading fails.
+    // at its end, none once it has ended. Waits as long as the data takes to arrive, unless the
+    // stop test (StopWaitingWhen) ends the wait. False with `error` when reading fails or the wait
+    // was ended.
     virtual bool GetChunk(std::size_t size, std::string& data, TransferError& error) = 0;
 
     // Ends the request (running or finished) and frees what it holds. Harmless when idle.

@@ -105,7 +105,8 @@ TEST_F(NginxUpdateCheck, ProgramVersionOneTenIsOlderThanOneNine) {
     ::DeleteFileA((folder_ + "\\VTSetup.exe").c_str());
     frame_.log.clear();
     Click({1, 10});
-    EXPECT_EQ(frame_.log[2], "msgbox[Updates]:Error downloading program updates The downloaded setup program is empty.");
+    EXPECT_EQ(frame_.log[2],
+              "msgbox[Updates]:Error downloading program updates The downloaded setup program is empty.");
     EXPECT_EQ(::GetFileAttributesA((folder_ + "\\VTSetup.exe").c_str()), INVALID_FILE_ATTRIBUTES);
 }
 
@@ -137,7 +138,8 @@ TEST_F(NginxUpdateCheck, UnreachableServerIsReportedAndTheButtonComesBack) {
 TEST_F(NginxUpdateCheck, OnlyADefinitionsListReplacesTheInstalledOneAndTakesEffectAtOnce) {
     // Sizes that read as 0, an error page served as a success, binary bytes: refused before the
     // rename, and "defver" is not fetched, so the next check tries again.
-    for (const char* answer : {"length,0,0", "length,0.4,0", "length,.5,0", "length,-0.4,0", "status,200", "body,5000"}) {
+    for (const char* answer :
+         {"length,0,0", "length,0.4,0", "length,.5,0", "length,-0.4,0", "status,200", "body,5000"}) {
         SCOPED_TRACE(answer);
         SetServer(Scripted() + "/do/" + answer + "/sw2.def");
         frame_.log.clear();

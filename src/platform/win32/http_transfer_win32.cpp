@@ -260,7 +260,8 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
                     if (shared->stop) break;
                 }
                 DWORD ask = static_cast<DWORD>(blockSize), available = 0, read = 0, failure = 0;
-                if (!whole && ::InternetQueryDataAvailable(opened, &available, 0, 0) && available > 0 && available < ask)
+                if (!whole && ::InternetQueryDataAvailable(opened, &available, 0, 0) && available > 0 &&
+                    available < ask)
                     ask = available;
                 std::string block(ask, '\0');
                 double before = Ms();
@@ -275,7 +276,8 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
                     measureFrom = after;
                     measured = 0;
                 } else if ((measured += read, after - measureFrom >= kMeasureMs)) {
-                    whole = static_cast<double>(measured) * kWholeBlockMs >= static_cast<double>(blockSize) * (after - measureFrom);
+                    whole = static_cast<double>(measured) * kWholeBlockMs >=
+                            static_cast<double>(blockSize) * (after - measureFrom);
                     measureFrom = after;
                     measured = 0;
                 }

@@ -121,7 +121,8 @@ void UpdateCheck::BtnUpdate_Click() {
         if (FD1_.DownloadFile(server_ + "/vt/sw2.def", folder_ + "\\sw2.def") && !cancelled_) {
             std::optional<std::size_t> inUse = ReloadDefinitions ? ReloadDefinitions() : std::nullopt;
             if (inUse && !cancelled_) {
-                frame_.SetLCaption(0, "Definitions Updates: Complete, " + std::to_string(*inUse) + " definitions in use");
+                frame_.SetLCaption(0, "Definitions Updates: Complete, " + std::to_string(*inUse) +
+                                          " definitions in use");
             }
             FD3_.DownloadFile(server_ + "/vt/defver", folder_ + "\\defver");
         }
