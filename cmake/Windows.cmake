@@ -151,8 +151,8 @@ add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture
 set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
 
 vantorel_wine_test(update_check_win32_tests tests/win32/update_check_win32_test.cpp)
-set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
-    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1"
+set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx;http_server"
+    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1"
     RESOURCE_LOCK nginx_www)
 
 # The real options window's updates panel against the same nginx.
@@ -174,6 +174,8 @@ vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
 vantorel_wine_test(program_e2e_tests tests/e2e/program_test.cpp)
 add_dependencies(program_e2e_tests vantorel)
 target_link_libraries(program_e2e_tests PRIVATE ws2_32)
+set_tests_properties(program_e2e_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server"
+    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1")
 
 # The main window with the program's own resources (icons, manifest, version) linked in.
 vantorel_wine_test(main_window_win32_tests tests/win32/main_window_win32_test.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)

@@ -144,12 +144,12 @@ TEST(FileDownloader, AnswerWithoutAUsableSizeIsRefusedNotCountedAsComplete) {
         EXPECT_EQ(rig.inet.cancels, 1);
     }
 
-    // An announced size of 0 is an empty file: complete at once, nothing written.
+    // An announced size of 0 is an empty file, not a "Complete" that leaves the old file in place.
     Rig empty;
     empty.inet.Respond("HTTP/1.1 200 OK", "Content-Length: 0\r\n", 0);
     EXPECT_TRUE(empty.Run());
     EXPECT_EQ(empty.Without("event:"), (Events{"complete"}));
-    EXPECT_EQ(empty.disk.files, (std::map<std::string, std::string>{{kDest, kOld}}));
+    EXPECT_EQ(empty.disk.files, (std::map<std::string, std::string>{{kDest, ""}}));
 }
 
 TEST(FileDownloader, ConnectionResetAfterThreeChunksKeepsTheOldFileAndLeavesNothingBehind) {

@@ -25,6 +25,12 @@ using testing::FakeWebServer;
 using testing::FakeUpdatesFrame;
 
 const std::string kServer = "http://updates.test";
+// A definitions list of 6,000 bytes: six chunks.
+const std::string kList = [] {
+    std::string list;
+    for (int i = 0; i < 600; ++i) list += std::to_string(10000000 + i) + "\r\n";
+    return list;
+}();
 const std::string kFolder = "C:\\Vantorel";
 
 struct Rig {
@@ -56,11 +62,11 @@ using Log = std::vector<std::string>;
 TEST(UpdateCheck, NewerDefinitionsReplaceTheFileAndThenTheVersion) {
     Rig rig;
     rig.server.PutFile(kServer + "/vt/defver", "21\r\n");
-    rig.server.PutFile(kServer + "/vt/sw2.def", std::string(3000, 'd'));
+    rig.server.PutFile(kServer + "/vt/sw2.def", kList);
     rig.Click();
     EXPECT_EQ(rig.server.requests, (Log{kServer + "/vt/defver", kServer + "/vt/sw2.def", kServer + "/vt/defver",
                                         kServer + "/vt/mainver"}));
-    EXPECT_EQ(rig.File("sw2.def"), std::string(3000, 'd'));
+    EXPECT_EQ(rig.File("sw2.def"), kList);
     EXPECT_EQ(rig.File("defver"), "21\r\n");
     EXPECT_EQ(rig.frame.log, (Log{"disable", "L0:Definitions Updates: Complete", "L1:Program Updates: No Updates",
                                   "enable"}));
@@ -116,9 +122,9 @@ TEST(UpdateCheck, FailedDefinitionsDownloadKeepsTheInstalledVersionSoTheNextChec
     EXPECT_EQ(rig.File("sw2.def"), "old definitions");
 
     // The server is mended; the next check fetches both.
-    rig.server.PutFile(kServer + "/vt/sw2.def", "new definitions");
+    rig.server.PutFile(kServer + "/vt/sw2.def", kList);
     rig.Click();
-    EXPECT_EQ(rig.File("sw2.def"), "new definitions");
+    EXPECT_EQ(rig.File("sw2.def"), kList);
     EXPECT_EQ(rig.File("defver"), "21");
 }
 
@@ -131,7 +137,7 @@ TEST(UpdateCheck, MissingOrEmptyLocalVersionCountsAsZero) {
         else
             rig.disk.files[kFolder + "\\defver"] = "";
         rig.server.PutFile(kServer + "/vt/defver", "1");
-        rig.server.PutFile(kServer + "/vt/sw2.def", "defs");
+        rig.server.PutFile(kServer + "/vt/sw2.def", kList);
         rig.Click();
         EXPECT_EQ(rig.frame.log[1], "L0:Definitions Updates: defver has been corrupted");
         EXPECT_EQ(rig.frame.L[0], "Definitions Updates: Complete");
@@ -141,7 +147,7 @@ TEST(UpdateCheck, MissingOrEmptyLocalVersionCountsAsZero) {
     Rig locked;
     locked.disk.unreadable.insert(kFolder + "\\defver");
     locked.server.PutFile(kServer + "/vt/defver", "1");
-    locked.server.PutFile(kServer + "/vt/sw2.def", "defs");
+    locked.server.PutFile(kServer + "/vt/sw2.def", kList);
     locked.Click();
     EXPECT_EQ(locked.frame.log[1], "L0:Definitions Updates: Complete");
 }
@@ -176,7 +182,7 @@ TEST(UpdateCheck, DefinitionsWithoutASizeAreNotReportedComplete) {
     Rig rig;
     rig.server.PutFile(kServer + "/vt/defver", "21");
     rig.server.responses[kServer + "/vt/sw2.def"] = {"HTTP/1.1 200 OK\r\nConnection: close\r\n\r\n",
-                                                      std::string(3000, 'd')};
+                                                      kList};
     rig.Click();
     EXPECT_EQ(rig.frame.log,
               (Log{"disable",
@@ -193,7 +199,7 @@ TEST(UpdateCheck, ClosingTheWindowStopsTheCheckWithoutTouchingTheWindow) {
     for (const std::string stage : {"sw2.def", "VTSetup.exe"}) {
         Rig rig;
         rig.server.PutFile(kServer + "/vt/defver", stage == "sw2.def" ? "21" : "20");
-        rig.server.PutFile(kServer + "/vt/sw2.def", std::string(5000, 'd'));
+        rig.server.PutFile(kServer + "/vt/sw2.def", kList);
         rig.server.PutFile(kServer + "/vt/mainver", "2");
         rig.server.PutFile(kServer + "/vt/VTSetup.exe", std::string(5000, 's'));
         UpdateCheck check(rig.frame, rig.inet, rig.pump, rig.disk, rig.FD1, rig.FD2, rig.FD3, kFolder, rig.version,

@@ -9,6 +9,7 @@
 #include <windows.h>
 
 #include <chrono>
+#include <optional>
 #include <cstdio>
 #include <string>
 
@@ -48,10 +49,21 @@ public:
 
 class Program final : public vantorel::platform::Application {
 public:
-    explicit Program(vantorel::win32::MainWindow& window) : window_(window) {}
+    Program(vantorel::win32::MainWindow& window, vantorel::platform::Files& files) : window_(window), files_(files) {}
     void ShowOptionsModal(vantorel::platform::WindowHandle owner, int frameIndex) override {
         WriteStdout(frameIndex == 1 ? "Options window: Updates\n" : "Options window: Options\n");
-        vantorel::win32::ShowOptionsModal(reinterpret_cast<HWND>(owner), frameIndex);
+        vantorel::win32::ShowOptionsModal(reinterpret_cast<HWND>(owner), frameIndex, [this] { return Reload(); });
+    }
+    // A definitions list the update check installed is in force from the guard's next sweep.
+    std::optional<std::size_t> Reload() {
+        using namespace vantorel;
+        const std::string path = DefinitionsPath(win32::ProgramFolder());
+        DefinitionList fresh;
+        if (!LoadDefinitions(path, files_, nullptr, fresh)) return std::nullopt;
+        Definitions = std::move(fresh);
+        WriteStdout("Definitions updated: " + std::to_string(Definitions.size()) + " definitions from " + path +
+                    " in use.\n");
+        return Definitions.size();
     }
     void EndProgram() override {
         window_.Destroy();
@@ -60,6 +72,7 @@ public:
 
 private:
     vantorel::win32::MainWindow& window_;
+    vantorel::platform::Files& files_;
 };
 
 const char* LightName(const vantorel::win32::MainWindow& window) {
@@ -84,7 +97,7 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     win32::Win32MessagePump pump;
     ReportingShell shell;
     win32::MainWindow window;
-    Program program(window);
+    Program program(window, files);
 
     if (!window.Create(instance)) {
         char line[128];

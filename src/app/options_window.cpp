@@ -48,9 +48,10 @@ std::string AutostartPath() {
     return ProgramFolder() + "\\" + base + ".exe";
 }
 
-void ShowOptionsModal(HWND owner, int frameIndex) {
+void ShowOptionsModal(HWND owner, int frameIndex, std::function<std::optional<std::size_t>()> reloadDefinitions) {
     Win32Registry registry;
     OptionsWindow window(owner, frameIndex, registry, AutostartPath());
+    if (window.hwnd() != nullptr) window.SetReloadDefinitions(std::move(reloadDefinitions));
     window.ShowModal();
 }
 

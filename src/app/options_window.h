@@ -8,7 +8,9 @@
 
 #include <windows.h>
 
+#include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 
 #include "download/file_downloader.h"
@@ -48,6 +50,11 @@ public:
     // Shows the window modally: the owner takes no input until the window closes. Messages of
     // every window, the owner's timers included, keep flowing. Returns when the window is closed.
     void ShowModal();
+
+    // Puts a newly installed definitions list in force at once (see UpdateCheck::ReloadDefinitions).
+    void SetReloadDefinitions(std::function<std::optional<std::size_t>()> reload) {
+        check_->ReloadDefinitions = std::move(reload);
+    }
 
     HWND hwnd() const { return hwnd_; }
     const OptionsControls& controls() const { return controls_; }
@@ -98,8 +105,10 @@ private:
 
 // What the main window's "&Updates" and "&Options" buttons (and the missing-definitions start-up)
 // call: loads the options window on frame `frameIndex` (0 options, 1 updates), shows it modally
-// owned by `owner` and returns when it has closed.
-void ShowOptionsModal(HWND owner, int frameIndex);
+// owned by `owner` and returns when it has closed. `reloadDefinitions` puts a list the update check
+// installed in force at once.
+void ShowOptionsModal(HWND owner, int frameIndex,
+                      std::function<std::optional<std::size_t>()> reloadDefinitions = nullptr);
 
 // The path written as the autostart entry: the program's folder + "\" + base name + ".exe".
 std::string AutostartPath();

@@ -4,6 +4,7 @@
 #include <memory>
 
 #include "download/leading_number.h"
+#include "platform/http_header.h"
 
 namespace vantorel {
 namespace {
@@ -58,7 +59,7 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
         return false;
     }
     while (Inet_.StillExecuting()) {
-        pump_.YieldToMessages();
+        if (!pump_.YieldToMessages()) cancel_ = true;  // the program is quitting
         if (cancel_) return false;
     }
 
@@ -92,6 +93,14 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
         RequestError(error.description);
         return false;
     }
+    // Two different sizes in one answer: either could be the lie, so neither is believed.
+    for (std::size_t at = header.find('\n'); at != std::string::npos; at = header.find('\n', at + 1)) {
+        std::string other = platform::HeaderField(header.substr(at), "Content-Length");
+        if (!other.empty() && other != length) {
+            RequestError("Invalid size (the server announced both " + length + " and " + other + " bytes)");
+            return false;
+        }
+    }
     // Without a size there is no telling a whole file from a cut one: such an answer is refused
     // rather than counted as complete with nothing written.
     if (!HoldsNumber(length)) {
@@ -109,7 +118,6 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
         return false;
     }
     announced = size;
-    if (announced == 0) return false;
 
     if (strDestination.size() >= 3 && strDestination.compare(1, 2, ":\\") == 0) {
         std::string root = strDestination.substr(0, strDestination.find('\\') + 1);
@@ -145,10 +153,11 @@ void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t a
 
     std::string buffer;
     bool failed = false;
-    for (;;) {
+    // An announced size of 0 is an empty file: nothing to read.
+    for (bool more = announced > 0; more;) {
         platform::TransferError readError;
         if (!Inet_.GetChunk(kChunkSize, buffer, readError)) {
-            FileError({readError.number, readError.description});
+            if (!cancel_) FileError({readError.number, readError.description});
             failed = true;
             break;
         }
@@ -172,14 +181,19 @@ void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t a
         received += static_cast<std::int32_t>(buffer.size());
         double percent = std::nearbyint(static_cast<double>(received) / announced * 100.0);
         Raise(DownloadProgress, std::to_string(static_cast<long long>(percent)));
-        pump_.YieldToMessages();
-        if (buffer.size() <= 1) break;
+        if (!pump_.YieldToMessages()) cancel_ = true;  // the program is quitting
+        more = buffer.size() > 1;
     }
 
     // After a failure or a cancel the partial file goes anyway: a failing close adds nothing to say.
     if (!file->Close(fileError) && !failed && !cancel_) FileError(fileError);
     file.reset();
-    if (!cancel_ && received == announced && !files_.Replace(partial, strDestination, fileError)) {
+    if (cancel_ || received != announced) return;
+    std::string refusal = CheckFile ? CheckFile(partial) : std::string();
+    if (!refusal.empty()) {
+        Raise(DownloadErrors, refusal);
+        cancel_ = true;
+    } else if (!files_.Replace(partial, strDestination, fileError)) {
         FileError(fileError);
     }
 }
@@ -189,6 +203,10 @@ bool FileDownloader::DownloadFile(const std::string& strURL, const std::string& 
     cancel_ = false;
     std::int32_t received = 0;
     std::int32_t announced = 0;
+
+    // What a killed program left behind is no part of this download.
+    const std::string partial = PartialPath(strDestination);
+    if (files_.FileExists(partial)) files_.Delete(partial);
 
     Raise(DownloadEvents, "Getting file information");
     pump_.YieldToMessages();
@@ -200,7 +218,6 @@ bool FileDownloader::DownloadFile(const std::string& strURL, const std::string& 
 
     // Finish: the destination was replaced only if the download completed; whatever is left of the
     // partial file goes.
-    const std::string partial = PartialPath(strDestination);
     bool result = false;
     if (received == announced) {
         if (!cancel_) {

@@ -8,8 +8,11 @@
 // destination's place in one step only when the whole announced body has arrived: a download that
 // fails, is refused or is cancelled leaves an existing destination exactly as it was. An answer
 // that does not say how long the file is (no Content-Length, or one without a number) is refused:
-// it cannot be told from a cut transfer. An announced size of 0 counts as complete at once. Every problem
-// is reported through `DownloadErrors`; nothing is thrown to the caller.
+// it cannot be told from a cut transfer; so is one with two different Content-Length fields. An
+// announced size of 0 gives an empty file. The host may look at the complete file before it takes
+// the destination's place (`CheckFile`) and refuse it. A partial file left by a program that was
+// killed goes before the next download of the same file. Every problem is reported through
+// `DownloadErrors`; nothing is thrown to the caller.
 #pragma once
 
 #include <cstdint>
@@ -24,8 +27,12 @@ namespace vantorel {
 
 class FileDownloader {
 public:
+    // Every wait of `Inet` ends as soon as the download is cancelled.
     FileDownloader(platform::HttpTransfer& Inet, platform::FileSystem& files, platform::MessagePump& pump)
-        : Inet_(Inet), files_(files), pump_(pump) {}
+        : Inet_(Inet), files_(files), pump_(pump) {
+        Inet_.StopWaitingWhen([this] { return cancel_; });
+    }
+    ~FileDownloader() { Inet_.StopWaitingWhen(nullptr); }
     FileDownloader(const FileDownloader&) = delete;
     FileDownloader& operator=(const FileDownloader&) = delete;
 
@@ -34,6 +41,11 @@ public:
     std::function<void(const std::string& strEvent)> DownloadEvents;
     std::function<void()> DowloadComplete;
     std::function<void(const std::string& intPercent)> DownloadProgress;
+
+    // Asked with the partial file's path once the whole body is in it, before it replaces the
+    // destination: an empty answer lets it in; any other answer is raised through `DownloadErrors`
+    // and the download ends as refused, the destination untouched. Empty: every file is let in.
+    std::function<std::string(const std::string& partialPath)> CheckFile;
 
     // Fetches `strURL` into `strDestination` (a full local path). True when the file arrived
     // complete and the call was not cancelled.

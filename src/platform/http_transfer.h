@@ -9,6 +9,7 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <functional>
 #include <string>
 
 namespace vantorel::platform {
@@ -47,12 +48,19 @@ public:
     virtual bool GetHeader(const std::string& name, std::string& value, TransferError& error) = 0;
 
     // The next piece of the body into `data`: exactly `size` bytes while the body lasts, fewer only
-    // at its end, none once it has ended. Waits as long as the data takes to arrive. False with
-    // `error` when reading fails.
+    // at its end, none once it has ended. Waits as long as the data takes to arrive, unless the
+    // stop test (StopWaitingWhen) ends the wait. False with `error` when reading fails or the wait
+    // was ended.
     virtual bool GetChunk(std::size_t size, std::string& data, TransferError& error) = 0;
 
     // Ends the request (running or finished) and frees what it holds. Harmless when idle.
     virtual void Cancel() = 0;
+
+    // Every wait of the transfer (StillExecuting, GetHeader, GetChunk) also ends as soon as `stop`
+    // answers true, asked after the window messages that ran meanwhile (a click on "Close" sets
+    // the caller's cancel flag there): the request is then abandoned and the call fails as
+    // cancelled. A transfer that never waits may ignore it.
+    virtual void StopWaitingWhen(std::function<bool()> stop) { (void)stop; }
 };
 
 }  // namespace vantorel::platform

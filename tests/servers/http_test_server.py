@@ -14,6 +14,13 @@ so a test can check every byte it received:
   /slow/N/MS[/PIECE] N bytes in pieces of PIECE (1024) bytes with a pause of MS milliseconds before each
   /files/NAME        the file NAME from the --root folder, 404 when missing
   /stall/MS          answers 200 with 10 bytes only after MS milliseconds
+  /noanswer          accepts the request and never answers
+  /trickle/N/MS      announces N bytes and sends one byte every MS milliseconds
+  /endless           announces 1,000,000,000 bytes and sends as fast as it is read
+  /twolengths/A/B    Content-Length: A and Content-Length: B, then A bytes
+  /vt/NAME           an update server: "defver" 99, "mainver" 0, "sw2.def" a list of keys
+  /do/KIND,ARG,.../NAME/vt/FILE  the update server, answering FILE NAME as /KIND/ARG/... would
+                     (a bare "trickle" sends 2000 bytes at one a second)
 
 With --tls CERT KEY it speaks https instead. The listening port is chosen by the system and written to --port-file once the server listens.
 """
@@ -70,8 +77,31 @@ class Handler(BaseHTTPRequestHandler):
     def do_GET(self):
         parts = self.path.split("?")[0].strip("/").split("/")
         kind, args = parts[0], parts[1:]
+        if kind == "do":  # an update server with one file misbehaving
+            action, target, name = args[0].split(","), args[1], args[-1]
+            kind, args = (action[0], action[1:] or ["2000", "1000"]) if name == target else ("vt", [name])
         try:
-            if kind == "body":
+            if kind == "noanswer":
+                time.sleep(3600)
+            elif kind == "trickle" or kind == "endless":
+                n, pause = (int(args[0]), int(args[1]) / 1000.0) if kind == "trickle" else (10 ** 9, 0)
+                self.send_response(200)
+                self.send_header("Content-Length", str(n))
+                self.end_headers()
+                piece = b"7" if kind == "trickle" else body(1 << 16)
+                for start in range(0, n, len(piece)):
+                    self.wfile.write(piece[:n - start])
+                    self.wfile.flush()
+                    time.sleep(pause)
+            elif kind == "twolengths":
+                self.answer(200, body(int(args[0])), length=args[0], extra=[("Content-Length", args[1])])
+            elif kind == "vt":
+                files = {"defver": b"99\n", "mainver": b"0\n", "sw2.def": b"-939524086\r\n33554559\r\n"}
+                if args[0] in files:
+                    self.answer(200, files[args[0]])
+                else:
+                    self.answer(404, b"not found")
+            elif kind == "body":
                 self.answer(200, body(int(args[0])))
             elif kind == "range":
                 if self.headers.get("Range") == "bytes=0-":

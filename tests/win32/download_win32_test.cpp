@@ -10,6 +10,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <fstream>
@@ -152,11 +153,14 @@ TEST_F(WinInetDownload, MissingOrUnusableSizes) {
     EXPECT_EQ(ReadFile(dest_), kOld);
     EXPECT_FALSE(Exists(dest_ + ".part"));
 
-    // A size beyond 32 bits, and a negative one: refused with a clear error before any data.
-    for (const std::string length : {"99999999999", "-5"}) {
-        SCOPED_TRACE(length);
+    // A size beyond 32 bits, a negative one, and two different sizes: refused with a clear error
+    // before any data.
+    for (const std::string path : {"/length/99999999999/3000", "/length/-5/3000", "/twolengths/3000/5000"}) {
+        SCOPED_TRACE(path);
+        std::size_t from = path.find('/', 1) + 1;
+        std::string length = path.substr(from, path.find('/', from) - from);
         events_.clear();
-        EXPECT_FALSE(Get("/length/" + length + "/3000"));
+        EXPECT_FALSE(Get(path));
         ASSERT_EQ(events_.size(), 1u);
         EXPECT_EQ(events_[0].rfind("error:Error: ", 0), 0u) << events_[0];
         EXPECT_NE(events_[0].find(length), std::string::npos) << events_[0];
@@ -184,18 +188,51 @@ TEST_F(WinInetDownload, CancelDuringTheChunkLoopStopsAtOnce) {
     EXPECT_EQ(ReadFile(dest_), Pattern(2000));
 }
 
-TEST_F(WinInetDownload, CancelWhileTheServerHasNotAnsweredReturnsPromptly) {
-    // The server holds its answer for 8 s; the user cancels after about 300 ms of waiting (a
-    // thread timer stands for the click).
+TEST_F(WinInetDownload, SlowDataShowsProgressAndCancelEndsEveryWaitWithinASecond) {
+    // 2 KB/s: a chunk of progress every half second, not all of it once a 64 KiB block is full.
+    DWORD last = ::GetTickCount(), longest = 0;
+    fd_.DownloadProgress = [&](const std::string&) {
+        longest = std::max<DWORD>(longest, ::GetTickCount() - last);
+        last = ::GetTickCount();
+    };
+    EXPECT_TRUE(Get("/slow/4096/500/1024"));
+    EXPECT_LT(longest, 1000u) << "the longest wait for progress";
+    EXPECT_TRUE(ReadFile(dest_) == Pattern(4096));
+    WriteFile(dest_, kOld);
+
+    // The user cancels (a thread timer stands for the click) while the server does not answer,
+    // trickles a byte a second, or sends without end.
     static FileDownloader* target = nullptr;
+    static DWORD cancelledAt = 0;
     target = &fd_;
+    for (const char* path : {"/noanswer", "/trickle/2000/1000", "/endless"}) {
+        SCOPED_TRACE(path);
+        events_.clear();
+        fd_.DownloadProgress = nullptr;
+        UINT_PTR timer = ::SetTimer(nullptr, 0, 1500, [](HWND, UINT, UINT_PTR id, DWORD) {
+            ::KillTimer(nullptr, id);
+            cancelledAt = ::GetTickCount();
+            target->Cancel();
+        });
+        EXPECT_FALSE(Get(path));
+        DWORD took = ::GetTickCount() - cancelledAt;
+        ::KillTimer(nullptr, timer);
+        EXPECT_LT(took, 1000u) << "the download returned " << took << " ms after the cancel";
+        EXPECT_TRUE(events_.empty());
+        EXPECT_EQ(ReadFile(dest_), kOld);
+        EXPECT_FALSE(Exists(dest_ + ".part"));
+    }
+}
+
+TEST_F(WinInetDownload, AServerThatNeverAnswersIsGivenUpAfterTheSilenceLimit) {
+    win32::WinInetTransfer inet(pump_, win32::WinInetTransfer::kDefaultBlockSize, 500);
+    FileDownloader fd(inet, disk_, pump_);
+    fd.DownloadErrors = [this](const std::string& s) { events_.push_back("error:" + s); };
     DWORD started = ::GetTickCount();
-    UINT_PTR timer = ::SetTimer(nullptr, 0, 300, [](HWND, UINT, UINT_PTR, DWORD) { target->Cancel(); });
-    EXPECT_FALSE(Get("/stall/8000"));
-    DWORD took = ::GetTickCount() - started;
-    ::KillTimer(nullptr, timer);
-    EXPECT_LT(took, 3000u) << "cancelling a request the server has not answered took " << took << " ms";
-    EXPECT_TRUE(events_.empty());
+    EXPECT_FALSE(fd.DownloadFile(server_ + "/noanswer", dest_));
+    EXPECT_LT(::GetTickCount() - started, 3000u);
+    ASSERT_EQ(events_.size(), 1u);
+    EXPECT_NE(events_[0].find("timed out"), std::string::npos) << events_[0];
     EXPECT_EQ(ReadFile(dest_), kOld);
 }
 

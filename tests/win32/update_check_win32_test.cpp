@@ -10,6 +10,8 @@
 
 #include <cstdlib>
 #include <fstream>
+#include <functional>
+#include <optional>
 #include <sstream>
 
 #include "fakes/fake_updates_frame.h"
@@ -31,10 +33,18 @@ using testing::WriteFile;
 class NginxUpdateCheck : public testing::UpdateServerTest {
 protected:
     NginxUpdateCheck() : UpdateServerTest("vtupd-") {}
-    void Click(ProgramVersion version = {1, 0}) {
+    void Click(ProgramVersion version = {1, 0}, std::function<std::optional<std::size_t>()> reload = nullptr) {
         UpdateCheck check(frame_, inet_, pump_, files_, FD1_, FD2_, FD3_, folder_, version, ServerAddress(registry_));
         check.ConnectEvents();
+        check.ReloadDefinitions = std::move(reload);
         check.BtnUpdate_Click();
+    }
+    // The scriptable server on 127.0.0.1 (tests/servers/http_test_server.py): an update server
+    // under /vt/ whose files can be made to misbehave.
+    static std::string Scripted() {
+        const char* file = std::getenv("VANTOREL_HTTP_PORT_FILE");
+        std::string port = file == nullptr ? std::string() : ReadFile(std::string("Z:") + file);
+        return "http://127.0.0.1:" + port.substr(0, port.find_first_of("\r\n"));
     }
 
     win32::Win32MessagePump pump_;
@@ -89,6 +99,15 @@ TEST_F(NginxUpdateCheck, ProgramVersionOneTenIsOlderThanOneNine) {
     Click({1, 10});
     EXPECT_EQ(frame_.L[1], "Program Updates: Complete");
     EXPECT_EQ(Local("VTSetup.exe"), setup);
+
+    // An empty setup program is no update.
+    Serve("VTSetup.exe", "");
+    ::DeleteFileA((folder_ + "\\VTSetup.exe").c_str());
+    frame_.log.clear();
+    Click({1, 10});
+    EXPECT_EQ(frame_.log[2],
+              "msgbox[Updates]:Error downloading program updates The downloaded setup program is empty.");
+    EXPECT_EQ(::GetFileAttributesA((folder_ + "\\VTSetup.exe").c_str()), INVALID_FILE_ATTRIBUTES);
 }
 
 TEST_F(NginxUpdateCheck, MissingDefinitionsOnTheServerKeepTheInstalledVersion) {
@@ -114,6 +133,52 @@ TEST_F(NginxUpdateCheck, UnreachableServerIsReportedAndTheButtonComesBack) {
     EXPECT_EQ(frame_.log[1].rfind("msgbox[Updates]:Cannot check for updates", 0), 0u) << frame_.log[1];
     EXPECT_EQ(frame_.log[2], "enable");
     EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
+}
+
+TEST_F(NginxUpdateCheck, OnlyADefinitionsListReplacesTheInstalledOneAndTakesEffectAtOnce) {
+    // Sizes that read as 0, an error page served as a success, binary bytes: refused before the
+    // rename, and "defver" is not fetched, so the next check tries again.
+    for (const char* answer :
+         {"length,0,0", "length,0.4,0", "length,.5,0", "length,-0.4,0", "status,200", "body,5000"}) {
+        SCOPED_TRACE(answer);
+        SetServer(Scripted() + "/do/" + answer + "/sw2.def");
+        frame_.log.clear();
+        Click();
+        ASSERT_EQ(frame_.log.size(), 4u);
+        EXPECT_EQ(frame_.log[1].rfind("msgbox[Updates]:Error downloading definition updates The downloaded file is "
+                                      "not a definitions list",
+                                      0),
+                  0u)
+            << frame_.log[1];
+        EXPECT_EQ(frame_.log[3], "enable");
+        EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
+        EXPECT_EQ(Local("defver"), "20\r\n");
+        EXPECT_EQ(::GetFileAttributesA((folder_ + "\\sw2.def.part").c_str()), INVALID_FILE_ATTRIBUTES);
+    }
+    // A list is installed and put in force through the owner at once; the label says so.
+    SetServer(Scripted());
+    int reloads = 0;
+    Click({1, 0}, [&] {
+        ++reloads;
+        return std::optional<std::size_t>(Local("sw2.def") == "-939524086\r\n33554559\r\n" ? 2 : 0);
+    });
+    EXPECT_EQ(reloads, 1);
+    EXPECT_EQ(frame_.L[0], "Definitions Updates: Complete, 2 definitions in use");
+    EXPECT_EQ(Local("defver"), "99\n");
+}
+
+TEST_F(NginxUpdateCheck, AServerThatNeverAnswersEndsTheCheckWithAnErrorAfterTheSilenceLimit) {
+    SetServer(Scripted() + "/do/noanswer/defver");
+    win32::WinInetTransfer quiet(pump_, win32::WinInetTransfer::kDefaultBlockSize, 500);
+    UpdateCheck check(frame_, quiet, pump_, files_, FD1_, FD2_, FD3_, folder_, {1, 0}, ServerAddress(registry_));
+    check.ConnectEvents();
+    DWORD started = ::GetTickCount();
+    check.BtnUpdate_Click();
+    EXPECT_LT(::GetTickCount() - started, 5000u);
+    ASSERT_EQ(frame_.log.size(), 3u);
+    EXPECT_EQ(frame_.log[1].rfind("msgbox[Updates]:Cannot check for updates", 0), 0u) << frame_.log[1];
+    EXPECT_NE(frame_.log[1].find("timed out"), std::string::npos) << frame_.log[1];
+    EXPECT_EQ(frame_.log[2], "enable");
 }
 
 }  // namespace

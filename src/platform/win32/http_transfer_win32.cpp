@@ -13,6 +13,9 @@ namespace vantorel::win32 {
 namespace {
 
 constexpr std::size_t kBlocksAhead = 4;
+// Whole blocks are read while one arrives within this many milliseconds, judged over reads of at
+// least kMeasureMs.
+constexpr double kWholeBlockMs = 200, kMeasureMs = 5;
 
 using UniqueHinternet = UniqueHandle<NullInvalid<HINTERNET, ::InternetCloseHandle>>;
 
@@ -46,8 +49,9 @@ struct WinInetTransfer::Shared {
     bool stop = false, bodyEnded = false, bodyFailed = false;
     platform::TransferError error, bodyError;
     std::string header;
-    std::deque<std::string> blocks;
-    HINTERNET request = nullptr;  // the open request, closed by whoever takes it first
+    std::deque<std::string> blocks;  // what each read brought, in order
+    std::size_t queued = 0;          // bytes in `blocks`
+    std::uint64_t activity = 0;      // grows with every change the worker publishes
 
     template <typename Change>
     void Publish(Change change) {
@@ -55,32 +59,66 @@ struct WinInetTransfer::Shared {
         {
             std::lock_guard<std::mutex> lock(mutex);
             change();
+            ++activity;
             signal = waiting;
         }
         if (signal) ::SetEvent(wake.get());
     }
 };
 
-WinInetTransfer::WinInetTransfer(platform::MessagePump& pump, std::size_t blockSize)
-    : pump_(pump), blockSize_(blockSize) {}
+WinInetTransfer::WinInetTransfer(platform::MessagePump& pump, std::size_t blockSize, unsigned silenceLimitMs)
+    : pump_(pump), blockSize_(blockSize), silenceLimitMs_(silenceLimitMs) {}
 
 WinInetTransfer::~WinInetTransfer() { Cancel(); }
 
+bool WinInetTransfer::GivesUp(bool quitting) {
+    if (!shared_) return true;
+    if (quitting || (stop_ && stop_())) {
+        Abandon(ERROR_INTERNET_OPERATION_CANCELLED);
+        return true;
+    }
+    std::uint64_t activity = 0;
+    {
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        activity = shared_->activity;
+    }
+    unsigned long long now = ::GetTickCount64();
+    if (activity != activitySeen_) {
+        activitySeen_ = activity;
+        activityTick_ = now;
+    } else if (now - activityTick_ >= silenceLimitMs_) {
+        Abandon(ERROR_INTERNET_TIMEOUT);
+        return true;
+    }
+    return false;
+}
+
 template <typename Ready>
-void WinInetTransfer::WaitPumping(Ready ready) {
+bool WinInetTransfer::WaitPumping(Ready ready, platform::TransferError& error) {
     for (;;) {
-        {
-            std::lock_guard<std::mutex> lock(shared_->mutex);
-            shared_->waiting = !ready(*shared_);
-            if (!shared_->waiting) return;
+        std::shared_ptr<Shared> shared = shared_;
+        if (shared) {
+            std::lock_guard<std::mutex> lock(shared->mutex);
+            shared->waiting = !ready(*shared);
+            if (!shared->waiting) return true;
         }
-        HANDLE wake = shared_->wake.get();
-        DWORD woke = ::MsgWaitForMultipleObjectsEx(1, &wake, INFINITE, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
-        if (woke == WAIT_OBJECT_0 + 1) {
-            pump_.YieldToMessages();
-            // The pump may hold messages back for a moment (it rate-limits its looks at the queue);
-            // wait for the worker alone meanwhile instead of spinning on the same messages.
-            ::WaitForSingleObject(wake, 1);
+        bool quitting = false;
+        if (shared) {
+            HANDLE wake = shared->wake.get();
+            // A bounded wait, so the stop test and the silence limit are looked at even when
+            // neither the worker nor the queue has anything to say.
+            DWORD woke = ::MsgWaitForMultipleObjectsEx(1, &wake, 100, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
+            if (woke == WAIT_OBJECT_0 + 1) {
+                quitting = !pump_.YieldToMessages();
+                // The pump may hold messages back for a moment (it rate-limits its looks at the
+                // queue); wait for the worker alone meanwhile instead of spinning on them.
+                if (shared_ == shared) ::WaitForSingleObject(wake, 1);
+            }
+        }
+        // A handler that ran meanwhile may have cancelled the request under this wait.
+        if (shared_ != shared || GivesUp(quitting)) {
+            error = abandoned_ ? failure_ : InternetError(ERROR_INTERNET_OPERATION_CANCELLED);
+            return false;
         }
     }
 }
@@ -126,7 +164,7 @@ bool WinInetTransfer::ExecuteGet(const std::string& requestHeader, platform::Tra
         return false;
     }
     try {
-        std::thread(&WinInetTransfer::Work, shared, std::move(request), blockSize_).detach();
+        std::thread(&WinInetTransfer::Work, shared, std::move(request), blockSize_, silenceLimitMs_).detach();
     } catch (const std::system_error&) {
         error = InternetError(ERROR_NOT_ENOUGH_MEMORY);
         return false;
@@ -134,12 +172,15 @@ bool WinInetTransfer::ExecuteGet(const std::string& requestHeader, platform::Tra
     shared_ = std::move(shared);
     current_.clear();
     offset_ = 0;
+    activitySeen_ = 0;
+    activityTick_ = ::GetTickCount64();
     return true;
 }
 
 // The worker: the request, the response header, then the body in blocks. It touches nothing but
 // `shared`, which it keeps alive, so it may outlive the transfer that started it.
-void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize) {
+void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize,
+                           unsigned silenceMs) {
     auto fail = [&shared](DWORD code) {
         platform::TransferError error = InternetError(code);
         shared->Publish([&] {
@@ -150,6 +191,11 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
     UniqueHinternet session(::InternetOpenA("Vantorel", INTERNET_OPEN_TYPE_PRECONFIG, nullptr, nullptr, 0));
     UniqueHinternet connection;
     if (session) {
+        // WinINet's own time-outs end an abandoned worker that a silent server would hold forever.
+        DWORD ms = silenceMs;
+        for (DWORD option : {INTERNET_OPTION_CONNECT_TIMEOUT, INTERNET_OPTION_SEND_TIMEOUT,
+                             INTERNET_OPTION_RECEIVE_TIMEOUT})
+            ::InternetSetOptionA(session.get(), option, &ms, sizeof ms);
         connection.reset(::InternetConnectA(session.get(), request.host.c_str(), request.port,
                                             request.userName.empty() ? nullptr : request.userName.c_str(),
                                             request.password.empty() ? nullptr : request.password.c_str(),
@@ -162,9 +208,8 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
         opened = ::HttpOpenRequestA(connection.get(), "GET", request.path.c_str(), nullptr, nullptr, nullptr, flags, 0);
     }
     bool stopped = false;
-    if (opened != nullptr) {
+    {
         std::lock_guard<std::mutex> lock(shared->mutex);
-        shared->request = opened;
         stopped = shared->stop;
     }
 
@@ -191,47 +236,68 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
                 shared->header = header;
                 shared->stage = Shared::Stage::Answered;
             });
-            // The body, in blocks, a few ahead of the window thread.
+            // The body: whatever each read brings goes to the window thread at once, a few blocks'
+            // worth ahead of it at most. A read returns only once its buffer is full or the body
+            // has ended, so while the data comes slowly the worker asks for no more than has
+            // arrived (waiting until something has): a slow server's bytes reach the window thread
+            // as they come. Once a whole block arrives within kWholeBlockMs, whole blocks are read
+            // (one call each, the fast path); a block that takes longer goes back to the careful way.
+            LARGE_INTEGER frequency, now;
+            ::QueryPerformanceFrequency(&frequency);
+            auto Ms = [&] {
+                ::QueryPerformanceCounter(&now);
+                return static_cast<double>(now.QuadPart) * 1000.0 / static_cast<double>(frequency.QuadPart);
+            };
+            bool whole = false;
+            double measureFrom = Ms();
+            std::size_t measured = 0;
             for (;;) {
                 {
                     std::unique_lock<std::mutex> lock(shared->mutex);
-                    shared->room.wait(lock, [&] { return shared->stop || shared->blocks.size() < kBlocksAhead; });
+                    shared->room.wait(lock, [&] {
+                        return shared->stop || shared->queued < kBlocksAhead * blockSize;
+                    });
                     if (shared->stop) break;
                 }
-                std::string block(blockSize, '\0');
-                std::size_t filled = 0;
-                bool ended = false;
-                DWORD failure = 0;
-                while (filled < block.size()) {
-                    DWORD read = 0;
-                    if (!::InternetReadFile(opened, block.data() + filled, static_cast<DWORD>(block.size() - filled),
-                                            &read)) {
-                        failure = ::GetLastError();
-                        break;
-                    }
-                    if (read == 0) {
-                        ended = true;
-                        break;
-                    }
-                    filled += read;
+                DWORD ask = static_cast<DWORD>(blockSize), available = 0, read = 0, failure = 0;
+                if (!whole && ::InternetQueryDataAvailable(opened, &available, 0, 0) && available > 0 &&
+                    available < ask)
+                    ask = available;
+                std::string block(ask, '\0');
+                double before = Ms();
+                if (!::InternetReadFile(opened, block.data(), ask, &read)) {
+                    failure = ::GetLastError();
+                    read = 0;
                 }
-                block.resize(filled);
+                block.resize(read);
+                double after = Ms();
+                if (whole) {
+                    whole = after - before <= kWholeBlockMs;
+                    measureFrom = after;
+                    measured = 0;
+                } else if ((measured += read, after - measureFrom >= kMeasureMs)) {
+                    whole = static_cast<double>(measured) * kWholeBlockMs >=
+                            static_cast<double>(blockSize) * (after - measureFrom);
+                    measureFrom = after;
+                    measured = 0;
+                }
+                const bool ended = failure != 0 || read == 0;
                 platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
                 shared->Publish([&] {
+                    shared->queued += block.size();
                     if (!block.empty()) shared->blocks.push_back(std::move(block));
                     if (failure != 0) {
                         shared->bodyFailed = true;
                         shared->bodyError = error;
                     }
-                    shared->bodyEnded = ended || failure != 0;
+                    shared->bodyEnded = ended;
                 });
-                if (ended || failure != 0) break;
+                if (ended) break;
             }
         }
     }
+    if (opened != nullptr) ::InternetCloseHandle(opened);
     shared->Publish([&] {
-        if (shared->request != nullptr) ::InternetCloseHandle(shared->request);
-        shared->request = nullptr;
         if (shared->stage == Shared::Stage::Requesting) {
             shared->stage = Shared::Stage::Failed;
             shared->error = InternetError(ERROR_INTERNET_OPERATION_CANCELLED);
@@ -250,17 +316,25 @@ bool WinInetTransfer::StillExecuting() {
     // A short wait keeps the caller's poll loop from spinning; a waiting message ends it at once.
     HANDLE wake = shared_->wake.get();
     ::MsgWaitForMultipleObjectsEx(1, &wake, 10, QS_ALLINPUT, MWMO_INPUTAVAILABLE);
-    std::lock_guard<std::mutex> lock(shared_->mutex);
-    shared_->waiting = false;
-    return shared_->stage == Shared::Stage::Requesting;
+    {
+        std::lock_guard<std::mutex> lock(shared_->mutex);
+        shared_->waiting = false;
+        if (shared_->stage != Shared::Stage::Requesting) return false;
+    }
+    // The caller pumps between polls: its stop test and the silence limit are asked here.
+    return !GivesUp(false);
 }
 
 bool WinInetTransfer::GetHeader(std::string& header, platform::TransferError& error) {
+    if (abandoned_) {
+        error = failure_;
+        return false;
+    }
     if (!shared_) {
         header.clear();
         return true;
     }
-    WaitPumping([](Shared& s) { return s.stage != Shared::Stage::Requesting; });
+    if (!WaitPumping([](Shared& s) { return s.stage != Shared::Stage::Requesting; }, error)) return false;
     std::lock_guard<std::mutex> lock(shared_->mutex);
     if (shared_->stage == Shared::Stage::Failed) {
         error = shared_->error;
@@ -279,6 +353,10 @@ bool WinInetTransfer::GetHeader(const std::string& name, std::string& value, pla
 
 bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::TransferError& error) {
     data.clear();
+    if (abandoned_) {
+        error = failure_;
+        return false;
+    }
     if (!shared_) return true;
     {
         std::lock_guard<std::mutex> lock(shared_->mutex);
@@ -294,13 +372,17 @@ bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::Tr
             offset_ += take;
             continue;
         }
-        WaitPumping([](Shared& s) { return !s.blocks.empty() || s.bodyEnded; });
+        if (!WaitPumping([](Shared& s) { return !s.blocks.empty() || s.bodyEnded; }, error)) {
+            data.clear();
+            return false;
+        }
         bool failed = false;
         {
             std::lock_guard<std::mutex> lock(shared_->mutex);
             if (!shared_->blocks.empty()) {
                 current_ = std::move(shared_->blocks.front());
                 shared_->blocks.pop_front();
+                shared_->queued -= current_.size();
                 offset_ = 0;
             } else {
                 failed = shared_->bodyFailed;
@@ -318,17 +400,27 @@ bool WinInetTransfer::GetChunk(std::size_t size, std::string& data, platform::Tr
     return true;
 }
 
+void WinInetTransfer::Abandon(unsigned long code) {
+    Release();
+    abandoned_ = true;
+    failure_ = InternetError(code);
+}
+
 void WinInetTransfer::Cancel() {
+    Release();
+    abandoned_ = false;
+}
+
+void WinInetTransfer::Release() {
     if (!shared_) return;
-    HINTERNET request = nullptr;
     {
         std::lock_guard<std::mutex> lock(shared_->mutex);
         shared_->stop = true;
-        std::swap(request, shared_->request);
     }
     shared_->room.notify_all();
-    // Closing the request handle ends the worker's next call on it; the worker closes the rest.
-    if (request != nullptr) ::InternetCloseHandle(request);
+    // The worker closes its handles itself once its current call returns: a close from here could
+    // read out the rest of the body on the window thread (WinINet drains a connection to keep it),
+    // and a handle closed behind the worker's back could be reused under it.
     shared_.reset();
     current_.clear();
     offset_ = 0;

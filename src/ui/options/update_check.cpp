@@ -5,6 +5,7 @@
 
 #include "download/leading_number.h"
 #include "download/open_url.h"
+#include "guard/definitions_check.h"
 #include "ui/options/draw_progress.h"
 
 namespace vantorel {
@@ -26,17 +27,31 @@ UpdateCheck::UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, plat
       FD3_(FD3),
       folder_(std::move(programFolder)),
       version_(version),
-      server_(std::move(server)) {}
+      server_(std::move(server)) {
+    Inet_.StopWaitingWhen([this] { return cancelled_; });
+}
 
 void UpdateCheck::ConnectEvents() {
     FD1_.DownloadErrors = [this](const std::string& strError) {
         if (!cancelled_) frame_.MsgBoxExclamation("Error downloading definition updates " + strError, kTitle);
     };
     FD1_.DowloadComplete = [this] { frame_.SetLCaption(0, "Definitions Updates: Complete"); };
+    FD1_.CheckFile = [this](const std::string& partialPath) -> std::string {
+        std::string text;
+        if (!files_.ReadAll(partialPath, text)) return "The downloaded file could not be read back.";
+        std::string problem = DefinitionsListProblem(text);
+        if (problem.empty()) return std::string();
+        return "The downloaded file is not a definitions list (" + problem + "). The installed definitions are kept.";
+    };
     FD2_.DownloadErrors = [this](const std::string& strError) {
         if (!cancelled_) frame_.MsgBoxExclamation("Error downloading program updates " + strError, kTitle);
     };
     FD2_.DowloadComplete = [this] { frame_.SetLCaption(1, "Program Updates: Complete"); };
+    FD2_.CheckFile = [this](const std::string& partialPath) -> std::string {
+        std::string text;
+        if (files_.ReadAll(partialPath, text) && text.empty()) return "The downloaded setup program is empty.";
+        return std::string();
+    };
     FD3_.DownloadErrors = nullptr;
     FD3_.DowloadComplete = nullptr;
     for (FileDownloader* fd : {&FD1_, &FD2_, &FD3_}) {
@@ -104,6 +119,11 @@ void UpdateCheck::BtnUpdate_Click() {
     } else {
         frame_.ShowPb();
         if (FD1_.DownloadFile(server_ + "/vt/sw2.def", folder_ + "\\sw2.def") && !cancelled_) {
+            std::optional<std::size_t> inUse = ReloadDefinitions ? ReloadDefinitions() : std::nullopt;
+            if (inUse && !cancelled_) {
+                frame_.SetLCaption(0, "Definitions Updates: Complete, " + std::to_string(*inUse) +
+                                          " definitions in use");
+            }
             FD3_.DownloadFile(server_ + "/vt/defver", folder_ + "\\defver");
         }
         if (cancelled_) return;

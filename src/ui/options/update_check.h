@@ -3,12 +3,16 @@
 // newer into the program's folder, painting progress into `pb` and reporting in `L(0)`, `L(1)` and
 // message boxes.
 //
-// The definitions version file "defver" is fetched only after "sw2.def" arrived complete: a
-// version file that ran ahead of the definitions it describes would stop the next check from ever
-// fetching them again.
+// The definitions version file "defver" is fetched only after "sw2.def" arrived complete and read
+// as a definitions list: a version file that ran ahead of the definitions it describes would stop
+// the next check from ever fetching them again. A new list replaces the installed one only when it
+// reads as a list, and then takes effect at once through the owner's `ReloadDefinitions`.
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
+#include <functional>
+#include <optional>
 #include <string>
 
 #include "download/file_downloader.h"
@@ -49,11 +53,16 @@ public:
     UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, platform::MessagePump& pump, platform::Files& files,
                 FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3, std::string programFolder,
                 ProgramVersion version, std::string server);
+    ~UpdateCheck() { Inet_.StopWaitingWhen(nullptr); }
 
     // Sets the downloaders' event handlers: messages and captions for FD1 and FD2, progress for all.
     void ConnectEvents();
 
     void BtnUpdate_Click();
+
+    // Set by the owner: puts the newly installed "sw2.def" in force and answers how many
+    // definitions are now in use, or nothing when it could not be read.
+    std::function<std::optional<std::size_t>()> ReloadDefinitions;
 
     // The window is going away: the running check stops at its next step without touching the
     // window again (the running download stops at its next check of its cancel flag).
