@@ -2,7 +2,11 @@
 
 #include <gtest/gtest.h>
 
+#include "fakes/fake_file_system.h"
+#include "fakes/fake_http_transfer.h"
+#include "fakes/fake_message_pump.h"
 #include "fakes/fake_registry.h"
+#include "fakes/fake_updates_frame.h"
 #include "fakes/fake_task_scheduler.h"
 #include "fakes/fake_widgets.h"
 #include "settings/settings.h"
@@ -27,12 +31,18 @@ struct OptionsWindow {
     std::vector<std::string> messages;
     FakeRegistry& registry;
     FakeTaskScheduler scheduler;
+    FakeMessagePump pump;
+    FakeFileSystem disk;
+    FakeHttpTransfer inet, fd1, fd2, fd3;
+    FakeUpdatesFrame frame;
     FrmOptions form;
 
     explicit OptionsWindow(FakeRegistry& r)
         : registry(r),
-          form(OptionsControls{{&options, &updates}, {&start, &tray, &debugger}, &close, &update, {&definitions, &program}},
-               r, scheduler, kExe, [this] { ++unloads; }, [this](const std::string& m) { messages.push_back(m); }) {}
+          form(OptionsPlatform{r, scheduler, pump, disk, disk, inet, fd1, fd2, fd3},
+               OptionsControls{{&options, &updates}, {&start, &tray, &debugger}, &close, &update, {&definitions, &program}},
+               frame, UpdateTarget{"C:\\Program Files\\Vantorel", {1, 0}}, kExe, [this] { ++unloads; },
+               [this](const std::string& m) { messages.push_back(m); }) {}
 };
 
 Variant Read(FakeRegistry& registry, std::int32_t root, const std::string& key, const std::string& name) {

@@ -41,11 +41,6 @@ int MetricForDpi(int index, UINT dpi) {
     return ::MulDiv(::GetSystemMetrics(index), static_cast<int>(dpi), 96);
 }
 
-void DestroyIcons(std::array<HICON, 2> icons) {
-    for (HICON icon : icons)
-        if (icon != nullptr) ::DestroyIcon(icon);
-}
-
 }  // namespace
 
 xpbutton::PropertyBag BtnOnOffDesign() {
@@ -84,9 +79,6 @@ MainWindow::MainWindow() = default;
 
 MainWindow::~MainWindow() {
     Destroy();
-    for (const auto* set : {&lights_, &sized_})
-        for (const IconPair& pair : *set) DestroyIcons({pair.large, pair.small});
-    if (font_ != nullptr) ::DeleteObject(font_);
 }
 
 void MainWindow::Destroy() {
@@ -97,17 +89,17 @@ bool MainWindow::Create(HINSTANCE instance) {
     const int largeSize = ::GetSystemMetrics(SM_CXICON), smallSize = ::GetSystemMetrics(SM_CXSMICON);
     const int ids[3] = {IDI_BULB_DARK, IDI_BULB_LIT, IDI_PADLOCK};
     for (int i = 0; i < 3; ++i) {
-        lights_[static_cast<std::size_t>(i)] = {LoadIconSized(instance, ids[i], largeSize),
-                                                LoadIconSized(instance, ids[i], smallSize)};
+        lights_[static_cast<std::size_t>(i)] = {UniqueHicon(LoadIconSized(instance, ids[i], largeSize)),
+                                                UniqueHicon(LoadIconSized(instance, ids[i], smallSize))};
     }
-    icon_ = lights_[2].large;  // the design icon: the padlock
+    icon_ = lights_[2].large.get();  // the design icon: the padlock
 
     WNDCLASSEXA windowClass{};
     windowClass.cbSize = sizeof windowClass;
     windowClass.lpfnWndProc = &MainWindow::WindowProc;
     windowClass.hInstance = instance;
-    windowClass.hIcon = lights_[2].large;
-    windowClass.hIconSm = lights_[2].small;
+    windowClass.hIcon = lights_[2].large.get();
+    windowClass.hIconSm = lights_[2].small.get();
     windowClass.hCursor = ::LoadCursorA(nullptr, reinterpret_cast<LPCSTR>(IDC_ARROW));
     windowClass.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
     windowClass.lpszClassName = kClassName;
@@ -122,8 +114,8 @@ bool MainWindow::Create(HINSTANCE instance) {
     ::AdjustWindowRectEx(&outer, kStyle, FALSE, WS_EX_CONTROLPARENT);
     ::SetWindowPos(hwnd, nullptr, 0, 0, outer.right - outer.left, outer.bottom - outer.top,
                    SWP_NOMOVE | SWP_NOZORDER | SWP_NOACTIVATE);
-    font_ = CreateDesignFont(dpi_);
-    ::SendMessageA(hwnd, WM_SETFONT, reinterpret_cast<WPARAM>(font_), FALSE);
+    font_.reset(CreateDesignFont(dpi_));
+    ::SendMessageA(hwnd, WM_SETFONT, reinterpret_cast<WPARAM>(font_.get()), FALSE);
 
     RECT r = ToPixels(kBtnOnOffRect, dpi_);
     xpbutton::PropertyBag design = BtnOnOffDesign();
@@ -136,15 +128,15 @@ bool MainWindow::Create(HINSTANCE instance) {
 
     for (int i = 1; i >= 0; --i) {  // "Options" above "Update"
         auto index = static_cast<std::size_t>(i);
-        uf_[index] = std::make_unique<Win32Frame>(hwnd, kUfCaptions[i], kUfRects[i], dpi_, font_);
+        uf_[index] = std::make_unique<Win32Frame>(hwnd, kUfCaptions[i], kUfRects[i], dpi_, font_.get());
         HWND panel = uf_[index]->hwnd();
-        l_[static_cast<std::size_t>(1 - i)] = std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_);
+        l_[static_cast<std::size_t>(1 - i)] = std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_.get());
         const int buttonIndex = i == 1 ? 4 : 3;
         btnO_[static_cast<std::size_t>(buttonIndex)] =
-            std::make_unique<Win32Button>(panel, kBtnOCaptions[buttonIndex], kPanelButtonRect, dpi_, font_);
+            std::make_unique<Win32Button>(panel, kBtnOCaptions[buttonIndex], kPanelButtonRect, dpi_, font_.get());
     }
     for (int i = 0; i < 3; ++i) {
-        btnO_[static_cast<std::size_t>(i)] = std::make_unique<Win32Button>(hwnd, kBtnOCaptions[i], kRowRects[i], dpi_, font_);
+        btnO_[static_cast<std::size_t>(i)] = std::make_unique<Win32Button>(hwnd, kBtnOCaptions[i], kRowRects[i], dpi_, font_.get());
     }
 
     // Explorer announces a restart with this message; the program runs elevated, so it has to be let
@@ -170,35 +162,37 @@ bool MainWindow::Create(HINSTANCE instance) {
 
 void MainWindow::ApplyDpi(UINT dpi) {
     dpi_ = dpi;
-    HFONT old = font_;
-    font_ = CreateDesignFont(dpi);
-    ::SendMessageA(hwnd_, WM_SETFONT, reinterpret_cast<WPARAM>(font_), FALSE);
+    UniqueHfont old = std::move(font_);  // deleted once every control has the new one
+    font_.reset(CreateDesignFont(dpi));
+    ::SendMessageA(hwnd_, WM_SETFONT, reinterpret_cast<WPARAM>(font_.get()), FALSE);
     RECT r = ToPixels(kBtnOnOffRect, dpi);
     ::SetWindowPos(onOff_.hwnd(), nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
                    SWP_NOZORDER | SWP_NOACTIVATE);
     onOff_.SetDpi(dpi);
-    for (auto& frame : uf_) frame->Relayout(dpi, font_);
-    for (auto& label : l_) label->Relayout(dpi, font_);
-    for (auto& button : btnO_) button->Relayout(dpi, font_);
-    if (old != nullptr && old != font_) ::DeleteObject(old);
+    for (auto& frame : uf_) frame->Relayout(dpi, font_.get());
+    for (auto& label : l_) label->Relayout(dpi, font_.get());
+    for (auto& button : btnO_) button->Relayout(dpi, font_.get());
 
     HINSTANCE instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(hwnd_, GWLP_HINSTANCE));
     const int ids[3] = {IDI_BULB_DARK, IDI_BULB_LIT, IDI_PADLOCK};
-    std::array<IconPair, 3> previous = sized_;
+    std::array<IconPair, 3> previous = std::move(sized_);  // destroyed once the window shows the new ones
     for (std::size_t i = 0; i < 3; ++i)
-        sized_[i] = {LoadIconSized(instance, ids[i], MetricForDpi(SM_CXICON, dpi)),
-                     LoadIconSized(instance, ids[i], MetricForDpi(SM_CXSMICON, dpi))};
+        sized_[i] = {UniqueHicon(LoadIconSized(instance, ids[i], MetricForDpi(SM_CXICON, dpi))),
+                     UniqueHicon(LoadIconSized(instance, ids[i], MetricForDpi(SM_CXSMICON, dpi)))};
     ShowIcon();
-    for (const IconPair& pair : previous) DestroyIcons({pair.large, pair.small});
 }
 
 void MainWindow::ShowIcon() {
     if (hwnd_ == nullptr) return;
-    IconPair shown{icon_, icon_};
-    for (std::size_t i = 0; i < 3; ++i)
-        if (lights_[i].large == icon_) shown = sized_[i];
-    ::SendMessageA(hwnd_, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(shown.large));
-    ::SendMessageA(hwnd_, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(shown.small));
+    HICON large = icon_, small = icon_;
+    for (std::size_t i = 0; i < 3; ++i) {
+        if (lights_[i].large.get() == icon_) {
+            large = sized_[i].large.get();
+            small = sized_[i].small.get();
+        }
+    }
+    ::SendMessageA(hwnd_, WM_SETICON, ICON_BIG, reinterpret_cast<LPARAM>(large));
+    ::SendMessageA(hwnd_, WM_SETICON, ICON_SMALL, reinterpret_cast<LPARAM>(small));
 }
 
 void MainWindow::SetIcon(platform::IconHandle icon) {
@@ -256,19 +250,6 @@ std::int32_t MainWindow::Height() const {
 
 void MainWindow::Move(std::int32_t left, std::int32_t top) {
     if (hwnd_ != nullptr) ::SetWindowPos(hwnd_, nullptr, left, top, 0, 0, SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
-}
-
-LRESULT CALLBACK MainWindow::WindowProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
-    MainWindow* self = nullptr;
-    if (message == WM_NCCREATE) {
-        self = static_cast<MainWindow*>(reinterpret_cast<CREATESTRUCTA*>(lParam)->lpCreateParams);
-        self->hwnd_ = hwnd;
-        ::SetWindowLongPtrA(hwnd, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(self));
-    } else {
-        self = reinterpret_cast<MainWindow*>(::GetWindowLongPtrA(hwnd, GWLP_USERDATA));
-    }
-    if (self == nullptr) return ::DefWindowProcA(hwnd, message, wParam, lParam);
-    return self->HandleMessage(message, wParam, lParam);
 }
 
 LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
@@ -340,7 +321,6 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             ::PostQuitMessage(0);
             return 0;
         case WM_NCDESTROY:
-            hwnd_ = nullptr;
             tmr_.hwnd_ = nullptr;
             timer_.hwnd_ = nullptr;
             break;

@@ -16,6 +16,8 @@
 #include "controls/xpbutton/property_bag.h"
 #include "platform/window.h"
 #include "platform/win32/controls_win32.h"
+#include "platform/win32/gdi_objects.h"
+#include "platform/win32/message_window.h"
 #include "controls/xpbutton/xpbutton_window_win32.h"
 #include "ui/main/frm_main.h"
 
@@ -72,7 +74,7 @@ struct MainWindowHandlers {
 // The switch's design: the look, scheme and font stored for BtnOnOff in the window's design.
 xpbutton::PropertyBag BtnOnOffDesign();
 
-class MainWindow final : public platform::Window {
+class MainWindow final : public platform::Window, public MessageWindow<MainWindow> {
 public:
     // Design layout in twips.
     static constexpr int kClientWidth = 9120, kClientHeight = 4335;
@@ -115,11 +117,10 @@ public:
     Win32Label& L(int index) { return *l_[static_cast<std::size_t>(index)]; }
     // Lights(0) dark bulb, (1) lit bulb, (2) padlock: each the large icon; the small one goes with it.
     platform::IconHandle Lights(int index) const {
-        return reinterpret_cast<platform::IconHandle>(lights_[static_cast<std::size_t>(index)].large);
+        return reinterpret_cast<platform::IconHandle>(lights_[static_cast<std::size_t>(index)].large.get());
     }
     // The picture the window shows for Lights(index), at the window's DPI.
-    HICON ShownLight(int index) const { return sized_[static_cast<std::size_t>(index)].large; }
-    HWND Hwnd() const { return hwnd_; }
+    HICON ShownLight(int index) const { return sized_[static_cast<std::size_t>(index)].large.get(); }
     UINT Dpi() const { return dpi_; }
 
     // The window and its controls as the window logic takes them.
@@ -130,20 +131,19 @@ public:
 
 private:
     struct IconPair {
-        HICON large = nullptr;
-        HICON small = nullptr;
+        UniqueHicon large;
+        UniqueHicon small;
     };
-    static LRESULT CALLBACK WindowProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
+    friend class MessageWindow<MainWindow>;
     LRESULT HandleMessage(UINT message, WPARAM wParam, LPARAM lParam);
     // Lays the window out for `dpi`: controls in twips, the design font and the switch's font, and
     // the window's icons at that DPI's sizes.
     void ApplyDpi(UINT dpi);
     void ShowIcon();
 
-    HWND hwnd_ = nullptr;
     bool destroying_ = false;
     UINT dpi_ = 96;
-    HFONT font_ = nullptr;
+    UniqueHfont font_;
     HICON icon_ = nullptr;
     std::array<IconPair, 3> lights_{};  // what the window logic holds; the identity of each light
     std::array<IconPair, 3> sized_{};   // the same pictures at the window's DPI, as the window shows them

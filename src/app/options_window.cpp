@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "platform/win32/files_win32.h"
+#include "platform/win32/gdi_objects.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/settings.h"
 #include "version.h"
@@ -59,7 +60,7 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
                              const std::string& executablePath, const UpdateTarget& target)
     : owner_(owner) {
     HINSTANCE instance = ::GetModuleHandleA(nullptr);
-    RegisterWindowClass(instance, kOptionsClass, Proc);
+    RegisterWindowClass(instance, kOptionsClass, WindowProc);
     RegisterWindowClass(instance, kPictureClass, PictureProc);
     hwnd_ = ::CreateWindowExA(kExStyle, kOptionsClass, "Options", kStyle, CW_USEDEFAULT, CW_USEDEFAULT, 100, 100,
                               owner, nullptr, instance, this);
@@ -72,17 +73,17 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     ::SetWindowPos(hwnd_, nullptr, (ownerRect.left + ownerRect.right - width) / 2,
                    (ownerRect.top + ownerRect.bottom - height) / 2, width, height, SWP_NOZORDER | SWP_NOACTIVATE);
 
-    font_ = CreateDesignFont(dpi);
-    frames_[0] = std::make_unique<Win32Frame>(hwnd_, "Options", kFrameRect, dpi, font_, frameIndex == 0);
-    frames_[1] = std::make_unique<Win32Frame>(hwnd_, "Updates", kFrameRect, dpi, font_, frameIndex == 1);
+    font_.reset(CreateDesignFont(dpi));
+    frames_[0] = std::make_unique<Win32Frame>(hwnd_, "Options", kFrameRect, dpi, font_.get(), frameIndex == 0);
+    frames_[1] = std::make_unique<Win32Frame>(hwnd_, "Updates", kFrameRect, dpi, font_.get(), frameIndex == 1);
     const char* boxCaptions[3] = {"Boot when Windows boots", "Start minimized to system tray",
                                   "Disable script debugging in Interent Explorer"};
     for (int i = 0; i < 3; ++i)
-        boxes_[i] = std::make_unique<Win32CheckBox>(frames_[0]->hwnd(), boxCaptions[i], kBoxRects[i], dpi, font_);
-    hint_ = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Click to check for updates ->", kHintRect, dpi, font_);
-    update_ = std::make_unique<Win32Button>(frames_[1]->hwnd(), "&Check for Updates", kUpdateRect, dpi, font_);
-    labels_[0] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Definitions Updates:", kLabelRects[0], dpi, font_);
-    labels_[1] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Program Updates:", kLabelRects[1], dpi, font_);
+        boxes_[i] = std::make_unique<Win32CheckBox>(frames_[0]->hwnd(), boxCaptions[i], kBoxRects[i], dpi, font_.get());
+    hint_ = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Click to check for updates ->", kHintRect, dpi, font_.get());
+    update_ = std::make_unique<Win32Button>(frames_[1]->hwnd(), "&Check for Updates", kUpdateRect, dpi, font_.get());
+    labels_[0] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Definitions Updates:", kLabelRects[0], dpi, font_.get());
+    labels_[1] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Program Updates:", kLabelRects[1], dpi, font_.get());
     // pb: a sunken white box whose inside shows the picture box's image.
     RECT pb = ToPixels(kProgressRect, dpi);
     pbWindow_ = ::CreateWindowExA(WS_EX_CLIENTEDGE, kPictureClass, "", WS_CHILD, pb.left, pb.top,
@@ -92,7 +93,7 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     ::GetClientRect(pbWindow_, &inside);
     pb_ = std::make_unique<GdiPictureBox>(inside.right, inside.bottom, pbWindow_);
     ::SetWindowLongPtrA(pbWindow_, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(pb_.get()));
-    close_ = std::make_unique<Win32Button>(hwnd_, "&Close", kCloseRect, dpi, font_);
+    close_ = std::make_unique<Win32Button>(hwnd_, "&Close", kCloseRect, dpi, font_.get());
     if (frameIndex == 1) ::SetWindowTextA(hwnd_, "Updates");
     // Focus rectangles and access-key underlines shown from the start, not only after a key press.
     ::SendMessageA(hwnd_, WM_CHANGEUISTATE, MAKEWPARAM(UIS_CLEAR, UISF_HIDEFOCUS | UISF_HIDEACCEL), 0);
@@ -103,32 +104,28 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     controls_.BtnUpdate = update_.get();
     controls_.L = {labels_[0].get(), labels_[1].get()};
     form_ = std::make_unique<FrmOptions>(
-        controls_, registry, scheduler_, executablePath,
+        OptionsPlatform{registry, scheduler_, pump_, files_, disk_, inet_, transfer1_, transfer2_, transfer3_}, controls_,
+        *this, target, executablePath,
         [this] {
-            if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
+            if (live() != nullptr) ::DestroyWindow(hwnd_);
         },
         [this](const std::string& text) {
-            if (hwnd_ != nullptr) ::MessageBoxA(hwnd_, text.c_str(), "Options", MB_OK | MB_ICONEXCLAMATION);
+            if (live() != nullptr) ::MessageBoxA(hwnd_, text.c_str(), "Options", MB_OK | MB_ICONEXCLAMATION);
         });
     form_->Form_Load();
 
-    check_ = std::make_unique<UpdateCheck>(*this, inet_, pump_, files_, FD1_, FD2_, FD3_, target.programFolder,
-                                           target.version, ServerAddress(registry));
-    check_->ConnectEvents();
-    update_->Click = [this] { check_->BtnUpdate_Click(); };
 }
 
 void OptionsWindow::ApplyDpi(UINT dpi) {
     dpi_ = dpi;
-    HFONT old = font_;
-    font_ = CreateDesignFont(dpi);
-    for (auto& frame : frames_) frame->Relayout(dpi, font_);
-    for (auto& box : boxes_) box->Relayout(dpi, font_);
-    for (auto& label : labels_) label->Relayout(dpi, font_);
-    hint_->Relayout(dpi, font_);
-    update_->Relayout(dpi, font_);
-    close_->Relayout(dpi, font_);
-    if (old != nullptr) ::DeleteObject(old);
+    UniqueHfont old = std::move(font_);  // deleted once every control has the new one
+    font_.reset(CreateDesignFont(dpi));
+    for (auto& frame : frames_) frame->Relayout(dpi, font_.get());
+    for (auto& box : boxes_) box->Relayout(dpi, font_.get());
+    for (auto& label : labels_) label->Relayout(dpi, font_.get());
+    hint_->Relayout(dpi, font_.get());
+    update_->Relayout(dpi, font_.get());
+    close_->Relayout(dpi, font_.get());
     // pb: the box at its new size, with an image of the new size (the next progress step paints it).
     RECT pb = ToPixels(kProgressRect, dpi), inside{};
     ::SetWindowPos(pbWindow_, nullptr, pb.left, pb.top, pb.right - pb.left, pb.bottom - pb.top,
@@ -140,28 +137,26 @@ void OptionsWindow::ApplyDpi(UINT dpi) {
 }
 
 void OptionsWindow::SetBtnUpdateEnabled(bool enabled) {
-    if (hwnd_ != nullptr) update_->SetEnabled(enabled);
+    if (live() != nullptr) update_->SetEnabled(enabled);
 }
 
 void OptionsWindow::SetLCaption(int index, const std::string& caption) {
-    if (hwnd_ != nullptr && (index == 0 || index == 1)) labels_[index]->SetCaption(caption);
+    if (live() != nullptr && (index == 0 || index == 1)) labels_[index]->SetCaption(caption);
 }
 
 void OptionsWindow::ShowPb() {
-    if (hwnd_ != nullptr) ::ShowWindow(pbWindow_, SW_SHOW);
+    if (live() != nullptr) ::ShowWindow(pbWindow_, SW_SHOW);
 }
 
 void OptionsWindow::MsgBoxExclamation(const std::string& prompt, const std::string& title) {
-    if (hwnd_ != nullptr) ::MessageBoxA(hwnd_, prompt.c_str(), title.c_str(), MB_OK | MB_ICONEXCLAMATION);
+    if (live() != nullptr) ::MessageBoxA(hwnd_, prompt.c_str(), title.c_str(), MB_OK | MB_ICONEXCLAMATION);
 }
 
 LRESULT CALLBACK OptionsWindow::PictureProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
     if (message == WM_PAINT) {
-        PAINTSTRUCT paint;
-        HDC dc = ::BeginPaint(hwnd, &paint);
+        PaintGuard paint(hwnd);
         auto* picture = reinterpret_cast<GdiPictureBox*>(::GetWindowLongPtrA(hwnd, GWLP_USERDATA));
-        if (picture != nullptr) picture->Show(dc, 0, 0);
-        ::EndPaint(hwnd, &paint);
+        if (picture != nullptr) picture->Show(paint.dc(), 0, 0);
         return 0;
     }
     if (message == WM_ERASEBKGND) return 1;  // the image covers the whole inside
@@ -171,7 +166,6 @@ LRESULT CALLBACK OptionsWindow::PictureProc(HWND hwnd, UINT message, WPARAM wPar
 OptionsWindow::~OptionsWindow() {
     if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
     pbWindow_ = nullptr;
-    if (font_ != nullptr) ::DeleteObject(font_);
 }
 
 void OptionsWindow::ShowModal() {
@@ -193,20 +187,16 @@ void OptionsWindow::ShowModal() {
         ::EnableWindow(owner_, TRUE);
         ::SetActiveWindow(owner_);
     }
-    if (hwnd_ != nullptr) ::DestroyWindow(hwnd_);
+    if (live() != nullptr) ::DestroyWindow(hwnd_);
 }
 
-LRESULT CALLBACK OptionsWindow::Proc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
-    if (message == WM_NCCREATE) {
-        auto* create = reinterpret_cast<CREATESTRUCTA*>(lParam);
-        ::SetWindowLongPtrA(hwnd, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(create->lpCreateParams));
-    }
-    auto* self = reinterpret_cast<OptionsWindow*>(::GetWindowLongPtrA(hwnd, GWLP_USERDATA));
+LRESULT OptionsWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
+    HWND hwnd = hwnd_;
     switch (message) {
         case WM_COMMAND:
             if (RouteCommand(wParam, lParam)) return 0;
-            if (LOWORD(wParam) == IDCANCEL && self != nullptr) {  // Escape
-                self->form_->BtnCancel_Click();
+            if (LOWORD(wParam) == IDCANCEL && form_) {  // Escape
+                form_->BtnCancel_Click();
                 return 0;
             }
             if (LOWORD(wParam) == IDOK && lParam == 0) {  // Enter: the push button with the focus
@@ -218,31 +208,29 @@ LRESULT CALLBACK OptionsWindow::Proc(HWND hwnd, UINT message, WPARAM wParam, LPA
             }
             break;
         case WM_DPICHANGED:
-            if (self != nullptr && self->form_) {
+            if (form_) {
                 // Moved to a monitor of another DPI: lay out again and take the size the system suggests.
-                self->ApplyDpi(HIWORD(wParam));
+                ApplyDpi(HIWORD(wParam));
                 const RECT* suggested = reinterpret_cast<const RECT*>(lParam);
                 ::SetWindowPos(hwnd, nullptr, suggested->left, suggested->top, suggested->right - suggested->left,
                                suggested->bottom - suggested->top, SWP_NOZORDER | SWP_NOACTIVATE);
                 return 0;
             }
             break;
-        case WM_GETMINMAXINFO:
-            if (self != nullptr) {
-                // The design's size at the window's DPI is never cut to the screen's.
-                auto* info = reinterpret_cast<MINMAXINFO*>(lParam);
-                SIZE outer = OuterSize(self->dpi_);
-                info->ptMaxTrackSize.x = std::max<LONG>(info->ptMaxTrackSize.x, outer.cx);
-                info->ptMaxTrackSize.y = std::max<LONG>(info->ptMaxTrackSize.y, outer.cy);
-                return 0;
-            }
-            break;
+        case WM_GETMINMAXINFO: {
+            // The design's size at the window's DPI is never cut to the screen's.
+            auto* info = reinterpret_cast<MINMAXINFO*>(lParam);
+            SIZE outer = OuterSize(dpi_);
+            info->ptMaxTrackSize.x = std::max<LONG>(info->ptMaxTrackSize.x, outer.cx);
+            info->ptMaxTrackSize.y = std::max<LONG>(info->ptMaxTrackSize.y, outer.cy);
+            return 0;
+        }
         case WM_SETFOCUS:
             // The keyboard starts on the first control of the visible frame.
-            if (self != nullptr && self->close_) {
-                HWND first = self->frames_[0]->Visible() ? self->boxes_[0]->hwnd()
-                             : self->update_->Enabled()  ? self->update_->hwnd()
-                                                         : self->close_->hwnd();
+            if (close_) {
+                HWND first = frames_[0]->Visible() ? boxes_[0]->hwnd()
+                             : update_->Enabled()  ? update_->hwnd()
+                                                         : close_->hwnd();
                 ::SetFocus(first);
             }
             return 0;
@@ -250,12 +238,9 @@ LRESULT CALLBACK OptionsWindow::Proc(HWND hwnd, UINT message, WPARAM wParam, LPA
             ::DestroyWindow(hwnd);
             return 0;
         case WM_DESTROY:
-            if (self != nullptr) {
-                self->closed_ = true;
-                self->hwnd_ = nullptr;
-                // A check running below this message (it pumps messages) stops at its next step.
-                if (self->check_) self->check_->Cancel();
-            }
+            closed_ = true;
+            // A check running below this message (it pumps messages) stops at its next step.
+            if (form_) form_->Updates().Cancel();
             return 0;
         default:
             break;

@@ -1,7 +1,7 @@
 // The options window on Windows: the controls of FrmOptions laid out in twips, a modal loop that
 // keeps the owner's timers running, and the window procedure that hands clicks to the controls.
-// The window is the updates panel of the update check: "&Check for Updates" runs the check with
-// the window's own downloaders FD1 to FD3 (WinINet), painting progress into the picture box pb.
+// The window is the view of FrmOptions: its update check and downloaders FD1 to FD3 run on the
+// WinINet transfers made here, painting progress into the picture box pb.
 // Closing the window while a check runs stops the check at its next step. Moved to a monitor of
 // another DPI, the window lays itself out again in twips at that DPI.
 #pragma once
@@ -19,6 +19,8 @@
 #include "platform/win32/file_system_win32.h"
 #include "platform/win32/files_win32.h"
 #include "platform/win32/http_transfer_win32.h"
+#include "platform/win32/gdi_objects.h"
+#include "platform/win32/message_window.h"
 #include "platform/win32/picture_box_win32.h"
 #include "platform/win32/shell_win32.h"
 #include "platform/win32/task_scheduler_win32.h"
@@ -27,20 +29,13 @@
 
 namespace vantorel::win32 {
 
-// Where the update check puts what it downloads and which program version it compares.
-struct UpdateTarget {
-    std::string programFolder;  // without a trailing backslash
-    ProgramVersion version;
-};
-
 // The running program's folder and version.
 UpdateTarget InstalledProgram();
 
-class OptionsWindow final : public UpdatesFrame {
+class OptionsWindow final : public UpdatesFrame, public MessageWindow<OptionsWindow> {
 public:
     // Creates the window (hidden) owned by `owner`, with frame `frameIndex` (0 options, 1 updates)
-    // visible; the updates frame also sets the caption "Updates". Runs the load step. The update
-    // server's address is read from `registry` when the window is created.
+    // visible; the updates frame also sets the caption "Updates". Runs the load step.
     OptionsWindow(HWND owner, int frameIndex, platform::Registry& registry, const std::string& executablePath,
                   const UpdateTarget& target = InstalledProgram());
     ~OptionsWindow() override;
@@ -53,10 +48,9 @@ public:
 
     // Puts a newly installed definitions list in force at once (see UpdateCheck::ReloadDefinitions).
     void SetReloadDefinitions(std::function<std::optional<std::size_t>()> reload) {
-        check_->ReloadDefinitions = std::move(reload);
+        form_->Updates().ReloadDefinitions = std::move(reload);
     }
 
-    HWND hwnd() const { return hwnd_; }
     const OptionsControls& controls() const { return controls_; }
     Win32Button& closeButton() { return *close_; }
     Win32CheckBox& box(int index) { return *boxes_[index]; }
@@ -73,14 +67,16 @@ public:
     void MsgBoxExclamation(const std::string& prompt, const std::string& title) override;
 
 private:
-    static LRESULT CALLBACK Proc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
+    friend class MessageWindow<OptionsWindow>;
+    LRESULT HandleMessage(UINT message, WPARAM wParam, LPARAM lParam);
+    // The window while it is not being destroyed.
+    HWND live() const { return closed_ ? nullptr : hwnd_; }
     static LRESULT CALLBACK PictureProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
     // Lays the window out for `dpi`: controls in twips, the design font, pb at its new size.
     void ApplyDpi(UINT dpi);
 
     HWND owner_;
-    HWND hwnd_ = nullptr;
-    HFONT font_ = nullptr;
+    UniqueHfont font_;
     UINT dpi_ = 96;
     bool closed_ = false;
     std::unique_ptr<Win32Frame> frames_[2];
@@ -90,17 +86,14 @@ private:
     HWND pbWindow_ = nullptr;  // pb's window: hidden until a download starts
     std::unique_ptr<GdiPictureBox> pb_;
     OptionsControls controls_;
-    Win32TaskScheduler scheduler_;
-    std::unique_ptr<FrmOptions> form_;
 
-    // The update check's transfers, downloaders and the check itself: they live while the window
-    // is loaded.
+    // The system under the logic; made before it and gone after it.
+    Win32TaskScheduler scheduler_;
     Win32MessagePump pump_;
     Win32FileSystem disk_;
     Win32Files files_;
     WinInetTransfer inet_{pump_}, transfer1_{pump_}, transfer2_{pump_}, transfer3_{pump_};
-    FileDownloader FD1_{transfer1_, disk_, pump_}, FD2_{transfer2_, disk_, pump_}, FD3_{transfer3_, disk_, pump_};
-    std::unique_ptr<UpdateCheck> check_;
+    std::unique_ptr<FrmOptions> form_;
 };
 
 // What the main window's "&Updates" and "&Options" buttons (and the missing-definitions start-up)

@@ -65,7 +65,7 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
 
     // A restarted taskbar announces itself with the registered message: the icon is added again.
     ASSERT_NE(window.TaskbarCreatedMessage(), 0u);
-    ::SendMessageA(window.Hwnd(), window.TaskbarCreatedMessage(), 0, 0);
+    ::SendMessageA(window.hwnd(), window.TaskbarCreatedMessage(), 0, 0);
     ASSERT_EQ(tray.calls.size(), 5u);
     EXPECT_EQ(tray.calls[4].message, platform::kNimAdd);
     EXPECT_TRUE(tray.calls[4].ok);
@@ -79,7 +79,7 @@ TEST(TrayWin32, IconClicksBringTheHiddenWindowBackRaisedNotTopmost) {
     win32::MainWindowHandlers handlers;
     handlers.mouseMove = [&](std::uint32_t code) { TrayMouseNotification(window, windows, pump, code); };
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers));
-    HWND hwnd = window.Hwnd();
+    HWND hwnd = window.hwnd();
 
     // As the icon reports a left click: the mouse-move message with the code in the low word.
     ASSERT_FALSE(window.Visible());
@@ -199,7 +199,7 @@ TEST_F(StartUpWin32, FirstStartOnAnEmptyRegistryThenTwoClicks) {
 
     // The window is centred on the screen.
     RECT r;
-    ::GetWindowRect(program.frmMain.Hwnd(), &r);
+    ::GetWindowRect(program.frmMain.hwnd(), &r);
     EXPECT_EQ(r.left, (::GetSystemMetrics(SM_CXSCREEN) - (r.right - r.left)) / 2);
     EXPECT_EQ(r.top, (::GetSystemMetrics(SM_CYSCREEN) - (r.bottom - r.top)) / 2);
 

@@ -101,7 +101,7 @@ TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     win32::MainWindow window;
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
     const UINT dpi = window.Dpi();
-    HWND hwnd = window.Hwnd();
+    HWND hwnd = window.hwnd();
 
     // The client area and the controls where the design puts them, at this DPI.
     RECT client;
@@ -199,7 +199,7 @@ TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     EXPECT_TRUE(form.Unloaded());
     EXPECT_EQ(application.ends, 1);
     EXPECT_FALSE(window.Timer().Enabled());
-    EXPECT_EQ(window.Hwnd(), nullptr);
+    EXPECT_EQ(window.hwnd(), nullptr);
     MSG quit;
     EXPECT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE)) << "the message loop is told to end";
 }
@@ -207,7 +207,7 @@ TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
 TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
     win32::MainWindow window;
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
-    HWND hwnd = window.Hwnd();
+    HWND hwnd = window.hwnd();
     ::ShowWindow(hwnd, SW_SHOWNA);
     for (UINT dpi : {144u, 192u, 120u, 96u}) {
         const int d = static_cast<int>(dpi);

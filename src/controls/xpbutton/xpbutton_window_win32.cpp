@@ -88,23 +88,6 @@ void XPButtonWindow::SetDefault(bool isDefault) {
     button_->Paint(button_->lastState(), true);
 }
 
-LRESULT CALLBACK XPButtonWindow::WindowProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
-    if (message == WM_NCCREATE) {
-        auto* create = reinterpret_cast<CREATESTRUCTA*>(lParam);
-        auto* self = static_cast<XPButtonWindow*>(create->lpCreateParams);
-        self->hwnd_ = hwnd;
-        ::SetWindowLongPtrA(hwnd, GWLP_USERDATA, reinterpret_cast<LONG_PTR>(self));
-    }
-    auto* self = reinterpret_cast<XPButtonWindow*>(::GetWindowLongPtrA(hwnd, GWLP_USERDATA));
-    if (!self) return ::DefWindowProcA(hwnd, message, wParam, lParam);
-    if (message == WM_NCDESTROY) {
-        ::SetWindowLongPtrA(hwnd, GWLP_USERDATA, 0);
-        self->hwnd_ = nullptr;
-        return ::DefWindowProcA(hwnd, message, wParam, lParam);
-    }
-    return self->HandleMessage(message, wParam, lParam);
-}
-
 std::int16_t XPButtonWindow::ShiftState() {
     std::int16_t shift = 0;
     if (::GetKeyState(VK_SHIFT) < 0) shift |= 1;
@@ -125,10 +108,8 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
     };
     switch (message) {
         case WM_PAINT: {
-            PAINTSTRUCT ps;
-            HDC dc = ::BeginPaint(hwnd_, &ps);
-            if (dc) canvas_.PaintTo(dc);
-            ::EndPaint(hwnd_, &ps);
+            PaintGuard paint(hwnd_);
+            if (paint.dc()) canvas_.PaintTo(paint.dc());
             return 0;
         }
         case WM_ERASEBKGND: return 1;

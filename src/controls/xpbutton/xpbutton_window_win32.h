@@ -20,10 +20,11 @@
 #include "controls/xpbutton/kirel_xp_button.h"
 #include "platform/button_host.h"
 #include "platform/win32/gdi_canvas.h"
+#include "platform/win32/message_window.h"
 
 namespace vantorel::win32 {
 
-class XPButtonWindow final : public platform::ButtonHost {
+class XPButtonWindow final : public platform::ButtonHost, public MessageWindow<XPButtonWindow> {
 public:
     static constexpr const char* kClassName = "KirelXPButton";
 
@@ -42,7 +43,6 @@ public:
     void Hide();
     void Destroy();
 
-    HWND hwnd() const { return hwnd_; }
     xpbutton::KirelXPButton& button() { return *button_; }
     xpbutton::XPButtonEvents& events() { return button_->events; }
     GdiCanvas& canvas() { return canvas_; }
@@ -83,11 +83,10 @@ public:
     platform::Rgb SystemColour(int index) const override;
 
 private:
-    static LRESULT CALLBACK WindowProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam);
+    friend class MessageWindow<XPButtonWindow>;
     LRESULT HandleMessage(UINT message, WPARAM wParam, LPARAM lParam);
     static std::int16_t ShiftState();
 
-    HWND hwnd_ = nullptr;
     HWND parent_ = nullptr;
     std::string name_;
     GdiCanvas canvas_;

@@ -1,5 +1,7 @@
 #include "platform/win32/controls_win32.h"
 
+#include "platform/win32/gdi_objects.h"
+
 #include <algorithm>
 #include <string>
 #include <vector>
@@ -63,10 +65,9 @@ LRESULT CALLBACK FrameProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam
             return result;
         }
         case WM_PAINT: {
-            PAINTSTRUCT paint;
-            HDC dc = ::BeginPaint(hwnd, &paint);
-            HFONT font = reinterpret_cast<HFONT>(::SendMessageA(hwnd, WM_GETFONT, 0, 0));
-            HGDIOBJ old = font != nullptr ? ::SelectObject(dc, font) : nullptr;
+            PaintGuard paint(hwnd);
+            HDC dc = paint.dc();
+            SelectGuard font(dc, reinterpret_cast<HFONT>(::SendMessageA(hwnd, WM_GETFONT, 0, 0)));
             TEXTMETRICA metrics{};
             ::GetTextMetricsA(dc, &metrics);
             RECT client;
@@ -86,8 +87,6 @@ LRESULT CALLBACK FrameProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam
                 text.right = text.left + size.cx + 4;
                 ::DrawTextA(dc, (" " + caption + " ").c_str(), -1, &text, DT_SINGLELINE | DT_LEFT | DT_NOPREFIX);
             }
-            if (old != nullptr) ::SelectObject(dc, old);
-            ::EndPaint(hwnd, &paint);
             return 0;
         }
         case WM_SETFONT:

@@ -26,18 +26,25 @@ std::string Describe(const platform::TaskFailure& failure) {
 
 }  // namespace
 
-FrmOptions::FrmOptions(const OptionsControls& controls, platform::Registry& registry, platform::TaskScheduler& scheduler,
-                       std::string executablePath, std::function<void()> unload,
+FrmOptions::FrmOptions(OptionsPlatform platform, const OptionsControls& controls, UpdatesFrame& frame,
+                       const UpdateTarget& target, std::string executablePath, std::function<void()> unload,
                        std::function<void(const std::string&)> showMessage)
     : controls_(controls),
-      registry_(registry),
-      scheduler_(scheduler),
+      registry_(platform.registry),
+      scheduler_(platform.scheduler),
       executablePath_(std::move(executablePath)),
       unload_(std::move(unload)),
-      showMessage_(std::move(showMessage)) {
+      showMessage_(std::move(showMessage)),
+      FD1_(platform.fd1, platform.disk, platform.pump),
+      FD2_(platform.fd2, platform.disk, platform.pump),
+      FD3_(platform.fd3, platform.disk, platform.pump),
+      check_(frame, platform.inet, platform.pump, platform.files, FD1_, FD2_, FD3_, target.programFolder,
+             target.version, ServerAddress(platform.registry)) {
     for (int i = 0; i < 3; ++i)
         if (controls_.Box[i]) controls_.Box[i]->Click = [this, i] { Box_Click(i); };
     if (controls_.BtnCancel) controls_.BtnCancel->Click = [this] { BtnCancel_Click(); };
+    check_.ConnectEvents();
+    if (controls_.BtnUpdate) controls_.BtnUpdate->Click = [this] { check_.BtnUpdate_Click(); };
 }
 
 void FrmOptions::Form_Load() {
