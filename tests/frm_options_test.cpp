@@ -142,7 +142,7 @@ TEST(FrmOptions, StartWithWindowsThatTheSchedulerRefusesIsUndoneAndSaysWhy) {
     FakeRegistry registry;
     OptionsWindow window(registry);
     window.form.Form_Load();
-    window.scheduler.failure = {"ITaskFolder::RegisterTaskDefinition", static_cast<std::int32_t>(0x80070005u),
+    window.scheduler.failure = {"ITaskFolder::RegisterTask", static_cast<std::int32_t>(0x80070005u),
                                 "Access is denied."};
     window.start.UserToggle();  // on, refused
     EXPECT_FALSE(window.start.Value()) << "the box shows unchecked again";
@@ -159,7 +159,7 @@ TEST(FrmOptions, StartWithWindowsThatTheSchedulerRefusesIsUndoneAndSaysWhy) {
     EXPECT_EQ(window.messages,
               (std::vector<std::string>{
                   "Vantorel cannot be set to start when Windows boots: the Task Scheduler refused its task "
-                  "\"Vantorel\".\n\nITaskFolder::RegisterTaskDefinition failed with HRESULT 0x80070005: Access is denied.",
+                  "\"Vantorel\".\n\nITaskFolder::RegisterTask failed with HRESULT 0x80070005: Access is denied.",
                   "Vantorel still starts when Windows boots: the Task Scheduler refused its task \"Vantorel\".\n\n"
                   "ITaskFolder::DeleteTask failed with HRESULT 0x80070005: Access is denied."}));
 }

@@ -11,15 +11,6 @@ namespace vantorel::win32 {
 
 namespace {
 
-// The logon trigger's own interface, which mingw-w64's taskschd.h does not declare.
-struct ILogonTrigger : public ITrigger {
-    virtual HRESULT STDMETHODCALLTYPE get_Delay(BSTR* delay) = 0;
-    virtual HRESULT STDMETHODCALLTYPE put_Delay(BSTR delay) = 0;
-    virtual HRESULT STDMETHODCALLTYPE get_UserId(BSTR* user) = 0;
-    virtual HRESULT STDMETHODCALLTYPE put_UserId(BSTR user) = 0;
-};
-constexpr IID kIidLogonTrigger = {0x72dade38, 0xfae4, 0x4b3e, {0xba, 0xf4, 0x5d, 0x00, 0x9a, 0xf0, 0x2b, 0x1c}};
-
 // Owns one COM interface pointer.
 template <typename T>
 class Com {
@@ -95,6 +86,22 @@ std::wstring Wide(const std::string& text) {
     return wide;
 }
 
+// `text` with the characters XML reserves written as entities.
+std::wstring XmlEscaped(const std::wstring& text) {
+    std::wstring escaped;
+    for (wchar_t c : text) {
+        switch (c) {
+            case L'&': escaped += L"&amp;"; break;
+            case L'<': escaped += L"&lt;"; break;
+            case L'>': escaped += L"&gt;"; break;
+            case L'"': escaped += L"&quot;"; break;
+            case L'\'': escaped += L"&apos;"; break;
+            default: escaped += c;
+        }
+    }
+    return escaped;
+}
+
 // Records the first failing call; true while every call so far succeeded.
 class Calls {
 public:
@@ -145,41 +152,33 @@ platform::TaskFailure Win32TaskScheduler::RegisterLogonTask(const std::string& n
     Calls ok;
     Com<ITaskService> service;
     Com<ITaskFolder> folder;
-    Com<ITaskDefinition> task;
-    if (!OpenRootFolder(ok, service, folder) || !ok(service->NewTask(0, task.put()), "ITaskService::NewTask"))
-        return ok.failure();
+    if (!OpenRootFolder(ok, service, folder)) return ok.failure();
 
     // The account of the user who checked the box, as DOMAIN\user.
     std::wstring account;
     if (!ok(CurrentAccount(account), "LookupAccountSidW")) return ok.failure();
 
-    Com<ITriggerCollection> triggers;
-    Com<ITrigger> trigger;
-    Com<ILogonTrigger> logon;
-    Com<IPrincipal> principal;
-    Com<ITaskSettings> settings;
-    Com<IActionCollection> actions;
-    Com<IAction> action;
-    Com<IExecAction> exec;
+    // One definition, registered whole: started by this user's next logon (no start boundary), run with the highest
+    // privileges under the user's interactive logon, never stopped for time or battery, one instance at a time.
+    const std::wstring user = XmlEscaped(account);
+    std::wstring xml =
+        L"<?xml version=\"1.0\"?><Task version=\"1.2\" "
+        L"xmlns=\"http://schemas.microsoft.com/windows/2004/02/mit/task\">";
+    xml += L"<Triggers><LogonTrigger><Enabled>true</Enabled><UserId>" + user + L"</UserId></LogonTrigger></Triggers>";
+    xml += L"<Principals><Principal id=\"Author\"><UserId>" + user +
+           L"</UserId><LogonType>InteractiveToken</LogonType>"
+           L"<RunLevel>HighestAvailable</RunLevel></Principal></Principals>";
+    xml +=
+        L"<Settings><MultipleInstancesPolicy>IgnoreNew</MultipleInstancesPolicy>"
+        L"<DisallowStartIfOnBatteries>false</DisallowStartIfOnBatteries>"
+        L"<StopIfGoingOnBatteries>false</StopIfGoingOnBatteries>"
+        L"<ExecutionTimeLimit>PT0S</ExecutionTimeLimit><Enabled>true</Enabled></Settings>";
+    xml += L"<Actions Context=\"Author\"><Exec><Command>" + XmlEscaped(Wide(command)) + L"</Command></Exec></Actions>";
+    xml += L"</Task>";
     Com<IRegisteredTask> registered;
-    ok(task->get_Triggers(triggers.put()), "ITaskDefinition::get_Triggers") &&
-        ok(triggers->Create(TASK_TRIGGER_LOGON, trigger.put()), "ITriggerCollection::Create") &&
-        ok(trigger->QueryInterface(kIidLogonTrigger, logon.putVoid()), "ITrigger::QueryInterface(ILogonTrigger)") &&
-        ok(logon->put_UserId(Bstr(account)), "ILogonTrigger::put_UserId") &&
-        ok(task->get_Principal(principal.put()), "ITaskDefinition::get_Principal") &&
-        ok(principal->put_LogonType(TASK_LOGON_INTERACTIVE_TOKEN), "IPrincipal::put_LogonType") &&
-        ok(principal->put_RunLevel(TASK_RUNLEVEL_HIGHEST), "IPrincipal::put_RunLevel") &&
-        ok(task->get_Settings(settings.put()), "ITaskDefinition::get_Settings") &&
-        ok(settings->put_ExecutionTimeLimit(Bstr(L"PT0S")), "ITaskSettings::put_ExecutionTimeLimit") &&
-        ok(settings->put_DisallowStartIfOnBatteries(VARIANT_FALSE), "ITaskSettings::put_DisallowStartIfOnBatteries") &&
-        ok(settings->put_StopIfGoingOnBatteries(VARIANT_FALSE), "ITaskSettings::put_StopIfGoingOnBatteries") &&
-        ok(task->get_Actions(actions.put()), "ITaskDefinition::get_Actions") &&
-        ok(actions->Create(TASK_ACTION_EXEC, action.put()), "IActionCollection::Create") &&
-        ok(action->QueryInterface(IID_IExecAction, exec.putVoid()), "IAction::QueryInterface(IExecAction)") &&
-        ok(exec->put_Path(Bstr(Wide(command))), "IExecAction::put_Path") &&
-        ok(folder->RegisterTaskDefinition(Bstr(Wide(name)), task.get(), TASK_CREATE_OR_UPDATE, Variant(account),
-                                          Variant(), TASK_LOGON_INTERACTIVE_TOKEN, Variant(L""), registered.put()),
-           "ITaskFolder::RegisterTaskDefinition");
+    ok(folder->RegisterTask(Bstr(Wide(name)), Bstr(xml), TASK_CREATE_OR_UPDATE, Variant(account), Variant(),
+                            TASK_LOGON_INTERACTIVE_TOKEN, Variant(L""), registered.put()),
+       "ITaskFolder::RegisterTask");
     return ok.failure();
 }
 
@@ -190,7 +189,8 @@ platform::TaskFailure Win32TaskScheduler::DeleteTask(const std::string& name) {
     Com<ITaskFolder> folder;
     if (!OpenRootFolder(ok, service, folder)) return ok.failure();
     HRESULT hr = folder->DeleteTask(Bstr(Wide(name)), 0);
-    if (hr == HRESULT_FROM_WIN32(ERROR_FILE_NOT_FOUND)) hr = S_OK;  // nothing to remove
+    if (hr == HRESULT_FROM_WIN32(ERROR_FILE_NOT_FOUND) || hr == HRESULT_FROM_WIN32(ERROR_PATH_NOT_FOUND))
+        hr = S_OK;  // nothing to remove: the box unchecks cleanly
     ok(hr, "ITaskFolder::DeleteTask");
     return ok.failure();
 }
