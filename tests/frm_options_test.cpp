@@ -1,3 +1,5 @@
+// What the options window's boxes show for stored texts that are not exactly "1" or "yes"; the real
+// window on the real registry, with real clicks, is tests/win32/options_window_test.cpp.
 #include "ui/options/frm_options.h"
 
 #include <gtest/gtest.h>
@@ -10,136 +12,40 @@ namespace vantorel {
 namespace {
 
 using namespace vantorel::testing;
-using platform::kHkeyCurrentUser;
-using platform::kHkeyLocalMachine;
 
-constexpr const char* kExe = "C:\\Program Files\\Vantorel\\vantorel.exe";
-
-struct OptionsWindow {
-    FakeFrame options{"Options", false}, updates{"Updates", false};
-    FakeCheckBox start{"Boot when Windows boots"}, tray{"Start minimized to system tray"},
-        debugger{"Disable script debugging in Interent Explorer"};
-    FakeButton close{"&Close"}, update{"&Check for Updates"};
-    FakeLabel definitions{"Definitions Updates:"}, program{"Program Updates:"};
-    int unloads = 0;
-    FakeRegistry& registry;
-    FrmOptions form;
-
-    explicit OptionsWindow(FakeRegistry& r)
-        : registry(r),
-          form(OptionsControls{{&options, &updates}, {&start, &tray, &debugger}, &close, &update, {&definitions, &program}},
-               r, kExe, [this] { ++unloads; }) {}
-};
-
-Variant Read(FakeRegistry& registry, std::int32_t root, const std::string& key, const std::string& name) {
-    RegistryRoutines reg(registry);
-    reg.hkey(root);
-    reg.KeyRoot(key);
-    return reg.GetRegistryValue(name);
-}
-
-std::size_t ValueCount(FakeRegistry& registry, std::int32_t root, const std::string& key) {
-    RegistryRoutines reg(registry);
-    return reg.EnumRegistryValues(root, key).size();
-}
-
-TEST(FrmOptions, EmptyRegistryShowsWhatIsInEffectAndWritesNothing) {
+TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
     FakeRegistry registry;
-    OptionsWindow window(registry);
-    window.form.Form_Load();
-    EXPECT_FALSE(window.start.Value()) << "no Run value exists: the program does not start with Windows";
-    EXPECT_FALSE(window.tray.Value()) << "start-up reads a missing Tray as 0";
-    EXPECT_TRUE(window.debugger.Value()) << "Internet Explorer's own default";
-    EXPECT_EQ(ValueCount(registry, kHkeyLocalMachine, "SOFTWARE\\Vantorel"), 0u);
-    EXPECT_EQ(ValueCount(registry, kHkeyCurrentUser, "SOFTWARE\\Microsoft\\Internet Explorer\\Main"), 0u);
-    EXPECT_EQ(ValueCount(registry, kHkeyLocalMachine, kRunKey), 0u);
-}
-
-TEST(FrmOptions, LoadShowsStoredValuesAndOnlyExactMatchesCheck) {
-    FakeRegistry registry;
-    {
-        OptionsWindow window(registry);
-        window.form.Form_Load();
-        window.start.UserToggle();
-        window.tray.UserToggle();
-    }
-    OptionsWindow window(registry);
-    window.form.Form_Load();
-    EXPECT_TRUE(window.start.Value());
-    EXPECT_TRUE(window.tray.Value());
-
-    RegistryRoutines vantorel(registry);
-    vantorel.hkey(kHkeyLocalMachine);
+    RegistryRoutines vantorel(registry), ie(registry), run(registry);
+    vantorel.hkey(platform::kHkeyLocalMachine);
     vantorel.KeyRoot(kVantorelKey);
-    RegistryRoutines ie(registry);
-    ie.hkey(kHkeyCurrentUser);
+    vantorel.CreateKey();
+    ie.hkey(platform::kHkeyCurrentUser);
     ie.KeyRoot(kInternetExplorerMainKey);
-    for (const auto& [start, tray, debugger, expectStart, expectTray, expectDebugger] :
-         std::vector<std::tuple<Variant, Variant, std::string, bool, bool, bool>>{
-             {std::string("2"), std::string("0"), "Yes", false, false, false},
-             {std::string("abc"), std::string(" 1 "), "no", false, true, false},
-             {std::int32_t{1}, std::string("1x"), "yes", true, false, true},
-         }) {
+    ie.CreateKey();
+    run.hkey(platform::kHkeyLocalMachine);
+    run.KeyRoot(std::string(kRunKey) + "\\");
+    run.CreateKey();
+    run.SetRegistryValue("Vantorel", std::string("C:\\vantorel.exe"), platform::kRegSz);
+    const std::tuple<Variant, std::string, std::string, bool, bool, bool> cases[] = {
+        {std::string("2"), "0", "Yes", false, false, false},
+        {std::string("abc"), " 1 ", "no", false, true, false},
+        {std::int32_t{1}, "1x", "yes", true, false, true},
+    };
+    for (const auto& [start, tray, debugger, expectStart, expectTray, expectDebugger] : cases) {
         vantorel.SetRegistryValue("Start", start, std::holds_alternative<std::int32_t>(start) ? 4 : 1);
         vantorel.SetRegistryValue("Tray", tray, 1);
         ie.SetRegistryValue("Disable Script Debugger", debugger, 1);
-        OptionsWindow again(registry);
-        again.form.Form_Load();
-        EXPECT_EQ(again.start.Value(), expectStart) << VariantText(start);
-        EXPECT_EQ(again.tray.Value(), expectTray) << VariantText(tray);
-        EXPECT_EQ(again.debugger.Value(), expectDebugger) << debugger;
+        FakeFrame f[2];
+        FakeCheckBox box[3];
+        FakeButton close, update;
+        FakeLabel l[2];
+        FrmOptions form(OptionsControls{{&f[0], &f[1]}, {&box[0], &box[1], &box[2]}, &close, &update, {&l[0], &l[1]}},
+                        registry, "C:\\vantorel.exe", [] {});
+        form.Form_Load();
+        EXPECT_EQ(std::make_tuple(box[0].Value(), box[1].Value(), box[2].Value()),
+                  std::make_tuple(expectStart, expectTray, expectDebugger))
+            << VariantText(start) << " " << tray << " " << debugger;
     }
-}
-
-TEST(FrmOptions, TogglingStoresEachOptionAtOnce) {
-    FakeRegistry registry;
-    OptionsWindow window(registry);
-    window.form.Form_Load();
-
-    window.start.UserToggle();  // on
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(std::string(kExe)));
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("1")));
-    window.start.UserToggle();  // off
-    EXPECT_TRUE(IsEmpty(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"))) << "autostart entry removed";
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
-    window.start.UserToggle();
-    window.start.UserToggle();  // removing a value twice is harmless
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
-
-    window.tray.UserToggle();
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Tray"), Variant(std::string("1")));
-    window.tray.UserToggle();
-    EXPECT_EQ(Read(registry, kHkeyLocalMachine, kVantorelKey, "Tray"), Variant(std::string("0")));
-
-    window.debugger.UserToggle();  // was checked by default
-    EXPECT_EQ(Read(registry, kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"),
-              Variant(std::string("no")));
-    window.debugger.UserToggle();
-    EXPECT_EQ(Read(registry, kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"),
-              Variant(std::string("yes")));
-
-    window.close.UserClick();
-    EXPECT_EQ(window.unloads, 1);
-}
-
-TEST(FrmOptions, LoadLeavesStoredValuesAloneEvenWhenSettingABoxClicksIt) {
-    FakeRegistry registry;
-    RegistryRoutines vantorel(registry);
-    vantorel.hkey(kHkeyLocalMachine);
-    vantorel.KeyRoot(kVantorelKey);
-    vantorel.CreateKey();
-    vantorel.SetRegistryValue("Start", std::string("1"), 1);  // stored, but the Run value was removed by hand
-    vantorel.SetRegistryValue("Tray", std::string("1"), 1);
-
-    OptionsWindow window(registry);
-    window.start.RaiseClickWhenSet(true);
-    window.tray.RaiseClickWhenSet(true);
-    window.debugger.RaiseClickWhenSet(true);
-    window.form.Form_Load();
-    EXPECT_TRUE(window.start.Value());
-    EXPECT_TRUE(IsEmpty(Read(registry, kHkeyLocalMachine, kRunKey, "Vantorel"))) << "no autostart path rewritten";
-    EXPECT_EQ(ValueCount(registry, kHkeyCurrentUser, "SOFTWARE\\Microsoft\\Internet Explorer\\Main"), 0u);
-    EXPECT_EQ(registry.OpenHandles(), 0u);
 }
 
 }  // namespace

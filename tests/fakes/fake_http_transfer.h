@@ -33,15 +33,11 @@ public:
     FakeWebServer* server = nullptr;  // when set, answers come from it
     std::string header = "HTTP/1.1 200 OK\r\n\r\n";
     std::string body;
-    std::size_t deliverOnly = std::string::npos;    // the connection ends after this many body bytes
-    int pollsUntilDone = 0;                          // StillExecuting answers true this often
     std::optional<platform::TransferError> executeFails, headerFails, lengthFails, chunkFails;
     std::size_t chunkFailsAt = 0;                    // GetChunk fails once this many bytes were handed out
 
     // What happened.
     std::string url, userName, password, requestHeader;
-    int executes = 0, polls = 0, chunkCalls = 0, cancels = 0;
-    std::vector<std::size_t> chunkSizesAsked;
 
     // A response with the given status line and fields, and a body of `size` bytes.
     void Respond(const std::string& statusLine, const std::string& fields, std::size_t size) {
@@ -60,10 +56,8 @@ public:
     void SetPassword(const std::string& value) override { password = value; }
 
     bool ExecuteGet(const std::string& headerToSend, platform::TransferError& error) override {
-        ++executes;
         requestHeader = headerToSend;
         position_ = 0;
-        pollsLeft_ = pollsUntilDone;
         if (server != nullptr) {
             server->requests.push_back(url);
             auto it = server->responses.find(url);
@@ -78,10 +72,7 @@ public:
         }
         return true;
     }
-    bool StillExecuting() override {
-        ++polls;
-        return pollsLeft_-- > 0;
-    }
+    bool StillExecuting() override { return false; }
     bool GetHeader(std::string& value, platform::TransferError& error) override {
         if (headerFails) {
             error = *headerFails;
@@ -99,23 +90,19 @@ public:
         return true;
     }
     bool GetChunk(std::size_t size, std::string& data, platform::TransferError& error) override {
-        ++chunkCalls;
-        chunkSizesAsked.push_back(size);
         if (chunkFails && position_ >= chunkFailsAt) {
             error = *chunkFails;
             return false;
         }
-        std::size_t end = std::min(body.size(), deliverOnly);
-        std::size_t take = position_ < end ? std::min(size, end - position_) : 0;
+        std::size_t take = position_ < body.size() ? std::min(size, body.size() - position_) : 0;
         data = body.substr(position_, take);
         position_ += take;
         return true;
     }
-    void Cancel() override { ++cancels; }
+    void Cancel() override {}
 
 private:
     std::size_t position_ = 0;
-    int pollsLeft_ = 0;
 };
 
 }  // namespace vantorel::testing

@@ -11,7 +11,7 @@
 #include <string>
 #include <vector>
 
-#include "fakes/fake_files.h"
+#include "fakes/fake_file_system.h"
 #include "fakes/fake_guard_platform.h"
 #include "guard/attempts.h"
 #include "platform/win32/connection_table_win32.h"
@@ -130,8 +130,8 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     ::RegDeleteKeyA(HKEY_CURRENT_USER, "SOFTWARE\\Vantorel");
     ::RegDeleteKeyA(HKEY_LOCAL_MACHINE, "SOFTWARE\\Vantorel");
     win32::Win32Registry registry;
-    FakeFiles files;
-    files.Put("C:\\vt\\sw2.def", "67305985");
+    FakeFileSystem files;
+    files.files["C:\\vt\\sw2.def"] = "67305985";
     win32::Win32ConnectionTable table;
     win32::Win32NotifyArea tray;
     win32::Win32WindowManager windows;
