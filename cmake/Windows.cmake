@@ -158,11 +158,6 @@ target_link_libraries(connection_table_win32_tests PRIVATE ws2_32)
 
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
 
-# Black-box tests of vantorel.exe itself.
-vantorel_wine_test(program_e2e_tests tests/e2e/program_test.cpp)
-add_dependencies(program_e2e_tests vantorel)
-target_link_libraries(program_e2e_tests PRIVATE ws2_32)
-
 # The main window with the program's own resources (icons, manifest, version) linked in.
 vantorel_wine_test(main_window_win32_tests tests/win32/main_window_win32_test.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
 target_link_libraries(main_window_win32_tests PRIVATE version)
