@@ -18,7 +18,6 @@ add_executable(vantorel_tests
     tests/file_downloader_test.cpp
     tests/http_header_test.cpp
     tests/leading_number_test.cpp
-    tests/update_check_test.cpp
     tests/contract/file_system_contract.cpp
     tests/contract/file_system_contract_fake.cpp
     tests/sweep_test.cpp

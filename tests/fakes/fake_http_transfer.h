@@ -2,9 +2,6 @@
 // into chunks, failures of each call, and a log of what the downloader asked.
 #pragma once
 
-#include <deque>
-#include <map>
-#include <utility>
 #include <optional>
 #include <string>
 #include <vector>
@@ -14,23 +11,9 @@
 
 namespace vantorel::testing {
 
-// Files on a pretend web server, shared by every transfer that points at it: a full address maps
-// to a whole response. Unknown addresses answer 404 with an error page; an unreachable server fails
-// every request as a refused connection would.
-struct FakeWebServer {
-    std::map<std::string, std::pair<std::string, std::string>> responses;  // address -> header, body
-    bool reachable = true;
-    std::vector<std::string> requests;
-
-    void PutFile(const std::string& address, const std::string& body) {
-        responses[address] = {"HTTP/1.1 200 OK\r\nContent-Length: " + std::to_string(body.size()) + "\r\n\r\n", body};
-    }
-};
-
 class FakeHttpTransfer final : public platform::HttpTransfer {
 public:
     // Scripting.
-    FakeWebServer* server = nullptr;  // when set, answers come from it
     std::string header = "HTTP/1.1 200 OK\r\n\r\n";
     std::string body;
     std::optional<platform::TransferError> executeFails, headerFails, lengthFails, chunkFails;
@@ -58,14 +41,6 @@ public:
     bool ExecuteGet(const std::string& headerToSend, platform::TransferError& error) override {
         requestHeader = headerToSend;
         position_ = 0;
-        if (server != nullptr) {
-            server->requests.push_back(url);
-            auto it = server->responses.find(url);
-            header = it != server->responses.end() ? it->second.first
-                                                   : "HTTP/1.1 404 Not Found\r\nContent-Length: 22\r\n\r\n";
-            body = it != server->responses.end() ? it->second.second : "<html>Not Found</html>";
-            if (!server->reachable) headerFails = platform::TransferError{12029, "The attempt to connect to the server failed."};
-        }
         if (executeFails) {
             error = *executeFails;
             return false;
