@@ -1,5 +1,6 @@
-// The connection sweep against a scripted table: which rows are torn down, what one teardown shows
-// and stores, what a refused teardown leaves alone, and tables larger than the first buffer.
+// The connection sweep against a scripted table: which rows are torn down and what a teardown shows
+// and stores, the count's wrap, the table buffer, failed fetches and a quit mid-sweep. Real
+// teardowns (and refused ones) are proved with the Linux table in tests/linux/.
 #include "guard/sweep.h"
 
 #include <gtest/gtest.h>
@@ -101,13 +102,10 @@ TEST(SweepConnections, TablesLargerThanTheFirstBufferAreFetchedWhole) {
     rig.list = ListOf({Ipv4(1, 2, 3, 4)});
     for (std::uint32_t i = 0; i < 5000; ++i) rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 1, 1) + i));
     rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(1, 2, 3, 4)));  // row 5001, beyond 1001
-    const std::size_t firstBuffer = rig.sweep.BufferBytes();
-    EXPECT_EQ(firstBuffer, 20'024u);
+    EXPECT_EQ(rig.sweep.BufferBytes(), 20'024u);
 
     rig.sweep.SweepConnections();
     EXPECT_EQ(rig.sweep.LastSweep().rows, 5001u);
-    EXPECT_EQ(rig.table.entries.size(), 1u);
-    EXPECT_EQ(rig.count, 1);
     const std::size_t grown = rig.sweep.BufferBytes();
     EXPECT_GE(grown, platform::TcpTableBytes(5001));
 

@@ -56,22 +56,16 @@ struct Pair {
         f(a, rasterHost);
         f(b, gdiHost);
     }
-    // Describes the first few differing pixels, empty when the surfaces agree.
-    // For the oval look only the corners outside the ellipse are compared.
-    std::string Differences(bool cornersOnly = false) const {
+    // The first differing pixels, empty when the surfaces agree; for the oval look only the corners
+    // outside the ellipse are compared.
+    std::string Differences(bool cornersOnly) const {
         std::ostringstream out;
-        int count = 0;
-        const int w = raster.width();
-        const int h = raster.height();
+        const int w = raster.width(), h = raster.height();
         for (int y = 0; y < h; ++y)
-            for (int x = 0; x < w; ++x) {
-                if (cornersOnly && !((x == 0 || x == w - 1) && (y == 0 || y == h - 1))) continue;
-                const Rgb want = raster.At(x, y);
-                const Rgb got = gdi.At(x, y);
-                if (want != got && count++ < 6) out << "(" << x << "," << y << ") raster " << std::hex << want
-                                                    << " gdi " << got << std::dec << "; ";
-            }
-        if (count) out << count << " pixels differ";
+            for (int x = 0; x < w; ++x)
+                if ((!cornersOnly || ((x == 0 || x == w - 1) && (y == 0 || y == h - 1))) && raster.At(x, y) != gdi.At(x, y) &&
+                    out.tellp() < 200)
+                    out << "(" << x << "," << y << ") raster " << std::hex << raster.At(x, y) << " gdi " << gdi.At(x, y) << std::dec << "; ";
         return out.str();
     }
 };
@@ -199,26 +193,17 @@ TEST(XPButtonWindow, MessagesBecomeEvents) {
     h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
     EXPECT_EQ(h.button.button().lastState(), 2);
     h.Send(WM_LBUTTONUP);
-    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click"}));
-
-    h.log.clear();
-    h.Send(WM_RBUTTONDOWN, MK_RBUTTON);
+    h.Send(WM_RBUTTONDOWN, MK_RBUTTON);  // the right button: no click
     h.Send(WM_RBUTTONUP);
-    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 2", "MouseUp 2"}));
-
-    // A double click: down, up, double-click, up gives one Click.
-    h.log.clear();
-    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);  // a double click gives one more click
     h.Send(WM_LBUTTONUP);
     h.Send(WM_LBUTTONDBLCLK, MK_LBUTTON);
     h.Send(WM_LBUTTONUP);
-    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}));
-
-    // A release outside the control raises MouseUp but no Click.
-    h.log.clear();
-    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
+    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);  // released outside the control: no click
     h.Send(WM_LBUTTONUP, 0, MAKELPARAM(500, 10));
-    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1"}));
+    EXPECT_EQ(h.log, (std::vector<std::string>{"MouseDown 1", "MouseUp 1", "Click", "MouseDown 2", "MouseUp 2",
+                                               "MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1",
+                                               "MouseDown 1", "MouseUp 1"}));
 
     // The two-state switch: space toggles Value before Click; BM_CLICK is the access key path.
     h.button.button().SetCheckBoxBehaviour(true);
