@@ -46,12 +46,11 @@ public:
 
     std::uint32_t SetTcpEntry(const platform::TcpRow& row) override {
         entries.push_back(row);
-        return teardownResult;
+        return platform::kNoError;
     }
 
     std::vector<platform::TcpRow> rows;
     std::uint32_t failWith = platform::kNoError;
-    std::uint32_t teardownResult = platform::kNoError;
     std::uint32_t overstateCount = 0;  // a count larger than the rows written
     std::function<void()> beforeFetch;
 
@@ -137,26 +136,13 @@ public:
 
 class FakeWindowManager final : public platform::WindowManager {
 public:
-    struct Call {
-        platform::WindowHandle window, insertAfter;
-        std::int32_t x, y, cx, cy;
-        std::uint32_t flags;
-    };
-    bool SetWindowPos(platform::WindowHandle window, platform::WindowHandle insertAfter, std::int32_t x, std::int32_t y,
-                      std::int32_t cx, std::int32_t cy, std::uint32_t flags) override {
-        calls.push_back({window, insertAfter, x, y, cx, cy, flags});
+    bool SetWindowPos(platform::WindowHandle, platform::WindowHandle, std::int32_t, std::int32_t, std::int32_t,
+                      std::int32_t, std::uint32_t) override {
         return true;
     }
-    std::int32_t ScreenWidth() const override { return screenWidth; }
-    std::int32_t ScreenHeight() const override { return screenHeight; }
-    bool DeleteSystemMenuCommand(platform::WindowHandle window, std::uint32_t command) override {
-        deletedCommands.push_back({window, command});
-        return true;
-    }
-
-    std::vector<std::pair<platform::WindowHandle, std::uint32_t>> deletedCommands;
-    std::vector<Call> calls;
-    std::int32_t screenWidth = 1024, screenHeight = 768;
+    std::int32_t ScreenWidth() const override { return 1024; }
+    std::int32_t ScreenHeight() const override { return 768; }
+    bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t) override { return true; }
 };
 
 class FakeInstance final : public platform::Instance {

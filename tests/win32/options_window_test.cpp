@@ -1,7 +1,7 @@
-// The options window on the real registry under Wine: its load step on an empty registry, its
-// boxes writing the settings Windows and Internet Explorer read, and the modal loop ending on
-// "&Close"; once with queued BM_CLICKs, once with the real pointer (SendInput, hit-tested by the
-// system, pressed and released on the control). Runs on the virtual display; the values it touches are removed afterwards.
+// The options window on the real registry under Wine: what its boxes show on an empty registry, the
+// settings Windows and Internet Explorer read written by real pointer clicks (SendInput, hit-tested
+// by the system), the updates frame, and the modal loop ending on "&Close" or the close request.
+// The values it touches are removed afterwards.
 #include <windows.h>
 
 #include <gtest/gtest.h>
@@ -21,113 +21,77 @@ class OptionsWindowTest : public ::testing::Test {
 protected:
     void SetUp() override { Clean(); }
     void TearDown() override { Clean(); }
-
-    Variant Read(std::int32_t root, const std::string& key, const std::string& name) {
+    std::string Read(std::int32_t root, const std::string& key, const std::string& name) {
         RegistryRoutines reg(registry_);
         reg.hkey(root);
         reg.KeyRoot(key);
-        return reg.GetRegistryValue(name);
+        Variant value = reg.GetRegistryValue(name);
+        return IsEmpty(value) ? "<none>" : VariantText(value);
     }
-    void Remove(std::int32_t root, const std::string& key, const std::string& name) {
-        RegistryRoutines reg(registry_);
-        reg.hkey(root);
-        reg.KeyRoot(key);
-        reg.DeleteValue(name);
+    // Start, Tray, the Run entry and the script debugger setting, in that order.
+    std::string Settings() {
+        return Read(kHkeyLocalMachine, kVantorelKey, "Start") + " " + Read(kHkeyLocalMachine, kVantorelKey, "Tray") + " " +
+               Read(kHkeyLocalMachine, kRunKey, "Vantorel") + " " +
+               Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger");
     }
     void Clean() {
-        Remove(kHkeyLocalMachine, kVantorelKey, "Start");
-        Remove(kHkeyLocalMachine, kVantorelKey, "Tray");
-        Remove(kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel");
-        Remove(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger");
+        for (auto [root, key, name] : {std::tuple{kHkeyLocalMachine, std::string(kVantorelKey), "Start"},
+                                       std::tuple{kHkeyLocalMachine, std::string(kVantorelKey), "Tray"},
+                                       std::tuple{kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel"},
+                                       std::tuple{kHkeyCurrentUser, std::string(kInternetExplorerMainKey), "Disable Script Debugger"}}) {
+            RegistryRoutines reg(registry_);
+            reg.hkey(root);
+            reg.KeyRoot(key);
+            reg.DeleteValue(name);
+        }
     }
-
     Win32Registry registry_;
 };
 
-TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
+TEST_F(OptionsWindowTest, PointerClicksStoreEachOptionAtOnce) {
     const std::string exe = AutostartPath();
     EXPECT_NE(exe.find("options_window_tests.exe"), std::string::npos) << exe;
-
     OptionsWindow window(nullptr, 0, registry_, exe);
     ASSERT_NE(window.hwnd(), nullptr) << "no display?";
     char caption[64];
     ::GetWindowTextA(window.hwnd(), caption, sizeof caption);
     EXPECT_STREQ(caption, "Options");
-    EXPECT_TRUE(window.controls().F[0]->Visible());
-    EXPECT_FALSE(window.controls().F[1]->Visible());
-    EXPECT_FALSE(window.box(0).Value());
-    EXPECT_FALSE(window.box(1).Value());
-    EXPECT_TRUE(window.box(2).Value());
-    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kVantorelKey, "Start"))) << "loading writes nothing";
-    EXPECT_TRUE(IsEmpty(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger")));
+    EXPECT_TRUE(window.controls().F[0]->Visible() && !window.controls().F[1]->Visible());
+    EXPECT_EQ(std::make_tuple(window.box(0).Value(), window.box(1).Value(), window.box(2).Value()),
+              std::make_tuple(false, false, true)) << "what is in effect on an empty registry";
+    EXPECT_EQ(Settings(), "<none> <none> <none> <none>") << "loading writes nothing";
 
-    // The user checks "Boot when Windows boots", then unchecks it, then closes the window; the
-    // clicks are queued and handled by the modal loop.
-    ::PostMessageA(window.box(0).hwnd(), BM_CLICK, 0, 0);
-    ::PostMessageA(window.box(1).hwnd(), BM_CLICK, 0, 0);
-    ::PostMessageA(window.box(2).hwnd(), BM_CLICK, 0, 0);
-    ::PostMessageA(window.closeButton().hwnd(), BM_CLICK, 0, 0);
-    window.ShowModal();
-    EXPECT_EQ(window.hwnd(), nullptr) << "closed";
-    EXPECT_EQ(Read(kHkeyLocalMachine, kRunKey, "Vantorel"), Variant(exe));
-    EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("1")));
-    EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Tray"), Variant(std::string("1")));
-    EXPECT_EQ(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"),
-              Variant(std::string("no")));
-
-    OptionsWindow again(nullptr, 1, registry_, exe);
-    ::GetWindowTextA(again.hwnd(), caption, sizeof caption);
-    EXPECT_STREQ(caption, "Updates");
-    EXPECT_TRUE(again.controls().F[1]->Visible());
-    EXPECT_FALSE(again.controls().F[0]->Visible());
-    EXPECT_TRUE(again.box(0).Value());
-    EXPECT_TRUE(again.box(1).Value());
-    EXPECT_FALSE(again.box(2).Value());
-    ::PostMessageA(again.box(0).hwnd(), BM_CLICK, 0, 0);
-    ::PostMessageA(again.hwnd(), WM_CLOSE, 0, 0);
-    again.ShowModal();
-    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kRunKey, "Vantorel"))) << "unchecking removes the autostart entry";
-    EXPECT_EQ(Read(kHkeyLocalMachine, kVantorelKey, "Start"), Variant(std::string("0")));
-}
-
-TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsWriteAndRemoveTheAutostartEntry) {
-    const std::string exe = AutostartPath();
-    OptionsWindow window(nullptr, 0, registry_, exe);
-    ASSERT_NE(window.hwnd(), nullptr) << "no display?";
-    ASSERT_FALSE(window.box(0).Value()) << "an empty registry: the program does not start with Windows";
-
-    Variant runAfterCheck, startAfterCheck, runAfterUncheck, startAfterUncheck;
-    int step = 0;
+    // The user clicks each box, then the first again, then "&Close"; the registry after each click.
+    std::vector<std::string> seen;
+    const int order[] = {0, 1, 2, 0};
+    std::size_t step = 0;
+    int pending = -1;
+    bool want = false;
     Ticker user(30, [&] {
-        switch (step) {
-            case 0:  // the window is up: check the box
-                if (!::IsWindowVisible(window.hwnd())) return false;
-                PointerClick(window.box(0).hwnd());
-                break;
-            case 1:  // checked: look at the registry, uncheck it
-                if (!window.box(0).Value()) return false;
-                runAfterCheck = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
-                startAfterCheck = Read(kHkeyLocalMachine, kVantorelKey, "Start");
-                PointerClick(window.box(0).hwnd());
-                break;
-            case 2:  // unchecked: look again, then "&Close"
-                if (window.box(0).Value()) return false;
-                runAfterUncheck = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
-                startAfterUncheck = Read(kHkeyLocalMachine, kVantorelKey, "Start");
-                PointerClick(window.closeButton().hwnd());
-                return true;
+        if (!::IsWindowVisible(window.hwnd()) || (pending >= 0 && window.box(pending).Value() != want)) return false;
+        if (pending >= 0) seen.push_back(Settings());
+        if (step == std::size(order)) {
+            PointerClick(window.closeButton().hwnd());
+            return true;
         }
-        ++step;
+        pending = order[step++];
+        want = !window.box(pending).Value();
+        PointerClick(window.box(pending).hwnd());
         return false;
     });
     window.ShowModal();
     EXPECT_EQ(window.hwnd(), nullptr) << "the pointer click on \"&Close\" closed the window";
-    EXPECT_EQ(runAfterCheck, Variant(exe)) << "checking writes the running executable's path";
-    EXPECT_EQ(startAfterCheck, Variant(std::string("1")));
-    EXPECT_TRUE(IsEmpty(runAfterUncheck)) << "unchecking removes the Run value";
-    EXPECT_EQ(startAfterUncheck, Variant(std::string("0")));
-    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kVantorelKey, "Tray"))) << "the other boxes wrote nothing";
-    EXPECT_TRUE(IsEmpty(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger")));
+    EXPECT_EQ(seen, (std::vector<std::string>{"1 <none> " + exe + " <none>", "1 1 " + exe + " <none>", "1 1 " + exe + " no",
+                                              "0 1 <none> no"}));
+
+    OptionsWindow again(nullptr, 1, registry_, exe);
+    ::GetWindowTextA(again.hwnd(), caption, sizeof caption);
+    EXPECT_STREQ(caption, "Updates");
+    EXPECT_TRUE(again.controls().F[1]->Visible() && !again.controls().F[0]->Visible());
+    EXPECT_EQ(std::make_tuple(again.box(0).Value(), again.box(1).Value(), again.box(2).Value()), std::make_tuple(false, true, false));
+    ::PostMessageA(again.hwnd(), WM_CLOSE, 0, 0);
+    again.ShowModal();
+    EXPECT_EQ(again.hwnd(), nullptr);
 }
 
 }  // namespace
