@@ -37,9 +37,9 @@ public:
     }
     void StopOverTimer() override { timerRunning = false; }
     void SendKeys(const std::string& keys) override { sentKeys.push_back(keys); }
-    void CaptureMouse() override { ++captures; }
-    void Present() override { ++presents; }
-    void SetAccessKey(char key) override { accessKey = key; }
+    void CaptureMouse() override {}
+    void Present() override {}
+    void SetAccessKey(char) override {}
     std::int32_t ScreenDpi() const override { return dpi; }
     bool DesignMode() const override { return designMode; }
     bool IsDefault() const override { return isDefault; }
@@ -64,9 +64,6 @@ public:
     bool timerRunning = false;
     std::int32_t timerPeriod = 0;
     std::vector<std::string> sentKeys;
-    int captures = 0;
-    int presents = 0;
-    char accessKey = 0;
     std::int32_t dpi = 96;
     bool designMode = false;
     bool isDefault = false;
@@ -95,7 +92,6 @@ public:
         himetricW_ = w;
         himetricH_ = h;
     }
-    mutable int renders = 0;
 
 private:
     platform::PictureKind kind_;
