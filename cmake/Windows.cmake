@@ -64,7 +64,6 @@ function(vantorel_wine_test name)
     set_tests_properties(${name} PROPERTIES FIXTURES_REQUIRED wine TIMEOUT 300)
 endfunction()
 
-vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
 vantorel_wine_test(controls_win32_tests tests/win32/controls_win32_test.cpp)
 vantorel_wine_test(options_window_tests tests/win32/options_window_test.cpp)
 
@@ -152,9 +151,6 @@ set_tests_properties(options_updates_win32_tests PROPERTIES FIXTURES_REQUIRED "w
 # The per-row yield's cost, run by hand under Wine (not a test).
 add_executable(pump_bench bench/win32/pump_bench.cpp)
 target_link_libraries(pump_bench PRIVATE vantorel_win32)
-
-vantorel_wine_test(connection_table_win32_tests tests/win32/connection_table_win32_test.cpp)
-target_link_libraries(connection_table_win32_tests PRIVATE ws2_32)
 
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
 

@@ -47,7 +47,8 @@ TEST(FastSplit, SplitsAtTheChosenSeparatorAndNormalisesTheLastPiece) {
         {"-77", "-77"}, {"0042", "42"}, {"00", "0"}, {"-0", "0"}, {"+5", "5"}, {"123\x1a", "123"}, {"1.5", "1.5"},
         {"1e3", "1000"}, {"2e", "2"}, {".5", "0.5"}, {"&HFF", "255"}, {"&o17", "15"}, {"1 2\t3", "123"},
         {"99999999999999999999999", "99999999999999999999999"}, {"1e999999999999", "0"}};
-    for (auto [piece, normalised] : last) EXPECT_EQ(Split(std::string("1\n") + piece, "\n").back(), normalised) << piece;
+    for (auto [piece, normalised] : last)
+        EXPECT_EQ(Split(std::string("1\n") + piece, "\n").back(), normalised) << piece;
 }
 
 TEST(CanonicalKeys, ParseAndFormatRoundTrip) {
@@ -67,8 +68,9 @@ TEST(CanonicalKeys, ParseAndFormatRoundTrip) {
 TEST(DefinitionList, EveryLineCountsAndATrailingLineBreakBlocksNoListeningRow) {
     DefinitionList list = DefinitionList::FromText("-9\n12\n5");
     ASSERT_EQ(Elements(list), (Pieces{"-9", "12", "5"}));
-    EXPECT_EQ((std::vector<std::int32_t>{FindDefinition(list, "-9"), FindDefinition(list, "5"), FindDefinition(list, std::int32_t{-9}),
-                                         FindDefinition(list, "7"), FindDefinition(list, std::int32_t{0})}),
+    EXPECT_EQ((std::vector<std::int32_t>{FindDefinition(list, "-9"), FindDefinition(list, "5"),
+                                         FindDefinition(list, std::int32_t{-9}), FindDefinition(list, "7"),
+                                         FindDefinition(list, std::int32_t{0})}),
               (std::vector<std::int32_t>{0, 2, 0, kNoDefinition, kNoDefinition}));
     // All keys negative: a stray "0" would sort last and match every listening row.
     DefinitionList negative = DefinitionList::FromText("-100\r\n-200\r\n-300\r\n");

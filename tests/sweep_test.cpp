@@ -70,7 +70,8 @@ TEST(SweepConnections, WhichRowsAreListedAndWhatOneTeardownLeaves) {
     EXPECT_EQ(rig.table.entries[0].remoteAddr, Ipv4(10, 0, 0, 200));
     const platform::TcpRow& sent = rig.table.entries[1];
     EXPECT_EQ(std::make_tuple(sent.state, sent.localAddr, sent.localPort, sent.remoteAddr, sent.remotePort),
-              std::make_tuple(kTcpStateDeleteTcb, listed.localAddr, listed.localPort, listed.remoteAddr, listed.remotePort));
+              std::make_tuple(kTcpStateDeleteTcb, listed.localAddr, listed.localPort, listed.remoteAddr,
+                              listed.remotePort));
     EXPECT_EQ(rig.count, 2);
     EXPECT_EQ(rig.window.caption, "Vantorel - 2 attempts intercepted") << "no blank before the count here";
     EXPECT_EQ(StoredAttempts(rig.registry), "2") << "the key is created when missing";
@@ -100,7 +101,8 @@ TEST(SweepConnections, CountWrapsPastTheLargestValue) {
 TEST(SweepConnections, TablesLargerThanTheFirstBufferAreFetchedWhole) {
     SweepRig rig;
     rig.list = ListOf({Ipv4(1, 2, 3, 4)});
-    for (std::uint32_t i = 0; i < 5000; ++i) rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 1, 1) + i));
+    for (std::uint32_t i = 0; i < 5000; ++i)
+        rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 1, 1) + i));
     rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(1, 2, 3, 4)));  // row 5001, beyond 1001
     EXPECT_EQ(rig.sweep.BufferBytes(), 20'024u);
 

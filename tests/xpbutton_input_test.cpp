@@ -44,12 +44,14 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     RasterCanvas canvas;
     KirelXPButton fresh(host, canvas);
     fresh.InitNewControl();
-    EXPECT_EQ(std::make_tuple(fresh.ButtonType(), fresh.Caption(), fresh.FontName(), host.windowFont.name, fresh.Version()),
-              std::make_tuple(3, std::string("KirelXPButton1"), std::string("Verdana"), std::string("Verdana"), std::string("2.0.6")));
-    EXPECT_EQ((std::vector<Rgb>{fresh.BackColor(), fresh.BackOver(), fresh.ForeColor(), fresh.ForeOver(), fresh.MaskColor()}),
+    EXPECT_EQ(fresh.Caption() + " " + fresh.FontName() + " " + host.windowFont.name + " " + fresh.Version(),
+              "KirelXPButton1 Verdana Verdana 2.0.6");
+    EXPECT_EQ((std::vector<Rgb>{fresh.BackColor(), fresh.BackOver(), fresh.ForeColor(), fresh.ForeOver(),
+                                fresh.MaskColor()}),
               (std::vector<Rgb>{0xFFFFFF, 0xFFFFFF, 0x123456, 0xFF0000, 0xC0C0C0}));
-    EXPECT_EQ(std::make_tuple(fresh.ColorScheme(), fresh.Enabled(), fresh.ShowFocusRect(), fresh.UseMaskColor(), fresh.SoftBevel()),
-              std::make_tuple(1, true, true, true, false));
+    EXPECT_EQ(std::make_tuple(fresh.ButtonType(), fresh.ColorScheme(), fresh.Enabled(), fresh.ShowFocusRect(),
+                              fresh.UseMaskColor(), fresh.SoftBevel()),
+              std::make_tuple(3, 1, true, true, true, false));
     EXPECT_TRUE(host.notified.empty()) << "no setter ran";
     EXPECT_EQ(canvas.clears, 0);
 
@@ -84,9 +86,10 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     b.SetImageIndex(7);
     PropertyBag bag;
     b.WriteProperties(bag);
-    EXPECT_EQ(bag.Keys(), (std::vector<std::string>{"BTYPE", "TX", "ENAB", "FONT", "COLTYPE", "FOCUSR", "BCOL", "BCOLO",
-                                                    "FCOL", "FCOLO", "MCOL", "MPTR", "MICON", "PICN", "PICH", "UMCOL",
-                                                    "SOFT", "PICPOS", "NGREY", "FX", "HAND", "CHECK", "VALUE", "ImageIndex"}));
+    EXPECT_EQ(bag.Keys(), (std::vector<std::string>{"BTYPE", "TX", "ENAB", "FONT", "COLTYPE", "FOCUSR", "BCOL",
+                                                    "BCOLO", "FCOL", "FCOLO", "MCOL", "MPTR", "MICON", "PICN", "PICH",
+                                                    "UMCOL", "SOFT", "PICPOS", "NGREY", "FX", "HAND", "CHECK", "VALUE",
+                                                    "ImageIndex"}));
     EXPECT_TRUE(std::holds_alternative<std::int16_t>(*bag.Find("MPTR")));
     EXPECT_TRUE(bag.ReadBool("HAND", false));
 
@@ -100,8 +103,10 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     for (const std::string& key : bag.Keys())
         if (key != "HAND") EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
     EXPECT_FALSE(again.ReadBool("HAND", true));
-    EXPECT_EQ(std::make_tuple(c.accessKey(), host2.windowEnabled, host2.windowFont, host2.pointer, host2.mouseIcon, c.pictureRect().width),
-              std::make_tuple('g', false, font, 11, platform::PicturePtr(cursor), 2)) << "the window follows what was read";
+    EXPECT_EQ(std::make_tuple(c.accessKey(), host2.windowEnabled, host2.windowFont, host2.pointer, host2.mouseIcon,
+                              c.pictureRect().width),
+              std::make_tuple('g', false, font, 11, platform::PicturePtr(cursor), 2))
+        << "the window follows what was read";
     EXPECT_TRUE(host2.notified.empty()) << "reading runs no setter";
     EXPECT_EQ(canvas2.clears, 0);
     c.SetImageIndex(0);
@@ -151,7 +156,8 @@ TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
     f.host.notified.clear();
     b.SetFontBold(true);
     b.SetFontSize(12);
-    EXPECT_EQ(std::make_tuple(f.host.windowFont.bold, f.host.windowFont.size, f.host.notified.empty()), std::make_tuple(true, 12.0, true));
+    EXPECT_EQ(std::make_tuple(f.host.windowFont.bold, f.host.windowFont.size, f.host.notified.empty()),
+              std::make_tuple(true, 12.0, true));
     EXPECT_GT(f.canvas.clears, clears);
     for (auto [size, rounded] : {std::pair{10.5, 10}, std::pair{11.5, 12}}) {
         FontDesc font = b.Font();
@@ -270,9 +276,10 @@ TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
 }
 
 TEST(XPButtonInput, AccessKeyParsing) {
+    // Only the first doubled "&&" is skipped.
     const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"A&&B &Run", 'r'}, {"Go&", 0},
                                                   {"&", 0}, {"x", 0}, {"A&&B &&C &D", 0}, {"E&xit", 'x'}};
-    for (auto [caption, key] : cases) EXPECT_EQ(AccessKeyOf(caption), key) << caption;  // only the first "&&" is skipped
+    for (auto [caption, key] : cases) EXPECT_EQ(AccessKeyOf(caption), key) << caption;
 }
 
 }  // namespace

@@ -76,9 +76,11 @@ TEST(XPButtonColour, ShiftBlendAndRounding) {
     };
     for (const Shift& s : shifts) EXPECT_EQ(ShiftColor(s.from, s.amount, s.blue, s.soft), s.to) << std::hex << s.from;
     EXPECT_EQ(BlendToWhite(0x000000, 176), MakeRgb(176, 176, 176));  // c × (255 − a) / 255 + a, truncating
-    EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176), MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
+    EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176),
+              MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
     EXPECT_EQ(BlendToWhite(0xFFFFFF, 128), 0xFFFFFFu);
-    const std::pair<double, int> halves[] = {{0.5, 0}, {1.5, 2}, {-0.5, 0}, {-1.5, -2}, {-2.5, -2}, {76.5, 76}, {2.6, 3}};
+    const std::pair<double, int> halves[] = {{0.5, 0},   {1.5, 2},   {-0.5, 0}, {-1.5, -2},
+                                             {-2.5, -2}, {76.5, 76}, {2.6, 3}};
     for (auto [value, rounded] : halves) EXPECT_EQ(RoundHalfEven(value), rounded) << value;
 }
 
@@ -140,22 +142,27 @@ struct LookCase {
 TEST(XPButtonLooks, EveryLookInEveryState) {
     const Rgb b = 0xF0F0F0;  // BaseColor of scheme 3 (above), shifted with blue scaling by the gradient look
     const std::vector<LookCase> cases = {
-        {1, 1, "", {{0, 0, {D}}, {39, 19, {D}}, {1, 1, {H}}, {38, 1, {Sh}}, {1, 18, {Sh}}, {2, 2, {H}}, {37, 17, {Sh}}, {20, 10, {F}}}},
+        {1, 1, "", {{0, 0, {D}}, {39, 19, {D}}, {1, 1, {H}}, {38, 1, {Sh}}, {1, 18, {Sh}}, {2, 2, {H}}}},
+        {1, 1, "", {{37, 17, {Sh}}, {20, 10, {F}}}},
         {1, 1, "p", {{1, 1, {Sh}}, {38, 18, {H}}, {0, 0, {D}}}},
         {2, 1, "", {{0, 0, {H}}, {39, 0, {D}}, {0, 19, {D}}, {1, 1, {L}}, {38, 18, {Sh}}}},
         {2, 1, "p", {{0, 0, {D}}, {39, 19, {H}}, {1, 1, {Sh}}, {38, 18, {L}}}},
         {2, 1, "D", {{0, 0, {D}}, {1, 1, {H}}, {38, 18, {D}}}},  // the default: dark frame round an inset bevel
         {2, 1, "Dp", {{1, 1, {Sh}}, {38, 18, {Sh}}, {2, 2, {F}}}},
         {2, 1, "Dpd", {{0, 0, {H}}}},
-        {3, 3, "", {{0, 5, Fixed(0x733C00)}, {1, 1, Fixed(0x7B4D10)}, {38, 18, Fixed(0x7B4D10)}, {1, 5, Fixed(SB(b, -5))},
-                    {2, 5, Fixed(SB(b, -10))}, {38, 5, Fixed(SB(b, -36))}, {5, 18, Fixed(SB(b, -48))}, {5, 1, Fixed(SB(b, 16))}}},
+        {3, 3, "", {{0, 5, Fixed(0x733C00)}, {1, 1, Fixed(0x7B4D10)}, {38, 18, Fixed(0x7B4D10)}}},
+        {3, 3, "", {{1, 5, Fixed(SB(b, -5))}, {2, 5, Fixed(SB(b, -10))}, {38, 5, Fixed(SB(b, -36))}}},
+        {3, 3, "", {{5, 18, Fixed(SB(b, -48))}, {5, 1, Fixed(SB(b, 16))}}},
         {3, 3, "f", {{1, 5, Fixed(0xE7AE8C)}, {5, 18, Fixed(0xEF826B)}}},  // the blue trim
-        {3, 3, "fh", {{1, 5, Fixed(0x31B2FF)}, {5, 2, Fixed(0x8CDBFF)}, {2, 5, Fixed(0x6BCBFF)}}},  // the orange trim wins
-        {3, 3, "fhp", {{37, 5, Fixed(b)}, {1, 5, Fixed(SB(SB(b, -32), -32))}, {5, 1, Fixed(SB(SB(b, -32), -32))}, {0, 5, Fixed(0x733C00)}}},
+        {3, 3, "fh", {{1, 5, Fixed(0x31B2FF)}, {5, 2, Fixed(0x8CDBFF)}, {2, 5, Fixed(0x6BCBFF)}}},  // orange wins
+        {3, 3, "fhp", {{37, 5, Fixed(b)}, {1, 5, Fixed(SB(SB(b, -32), -32))}, {5, 1, Fixed(SB(SB(b, -32), -32))}}},
+        {3, 3, "fhp", {{0, 5, Fixed(0x733C00)}}},
         {3, 3, "fhpd", {{5, 5, Fixed(SB(b, -24))}, {0, 5, Fixed(SB(b, -84))}, {1, 1, Fixed(SB(b, -72))}}},
-        {4, 1, "", {{20, 10, {L}}, {0, 10, {D}}, {38, 10, {Sh}}, {37, 10, {F}}, {2, 10, {H}}, {3, 3, {H}}, {37, 17, {Sh}}}},
+        {4, 1, "", {{20, 10, {L}}, {0, 10, {D}}, {38, 10, {Sh}}, {37, 10, {F}}, {2, 10, {H}}, {3, 3, {H}}}},
+        {4, 1, "", {{37, 17, {Sh}}}},
         {4, 1, "p", {{20, 10, {Sh, -16}}, {1, 10, {Sh, -64}}, {2, 10, {Sh, -32}}, {37, 10, {Sh}}, {38, 10, {Sh, -16}}}},
-        {5, 1, "", {{20, 10, {F, 12}}, {1, 10, {H}}, {0, 10, {Sh, -26}}, {39, 10, {H}}, {38, 10, {Sh, -26}}, {1, 18, {Sh, 26}}}},
+        {5, 1, "", {{20, 10, {F, 12}}, {1, 10, {H}}, {0, 10, {Sh, -26}}, {39, 10, {H}}, {38, 10, {Sh, -26}}}},
+        {5, 1, "", {{1, 18, {Sh, 26}}}},
         {5, 1, "p", {{20, 10, {Sh, 16}}, {39, 10, {H}}}},
         {5, 1, "pd", {{0, 10, {Sh}}, {39, 10, {Sh}}}},
         {6, 1, "", {{0, 0, {L, 8}}, {39, 19, {Sh}}, {1, 1, {L, 8}}}},
@@ -175,7 +182,8 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         {9, 1, "", {{0, 0, {F}}}},
         {9, 1, "h", {{0, 0, {A}}, {20, 10, {AL}}}},
         {9, 1, "hp", {{0, 0, {A}}}},
-        {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}, {20, 10, {H, -29}}}},  // 58/20 × 10
+        {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}}},
+        {14, 1, "", {{20, 10, {H, -29}}}},  // 58/20 × 10
         {14, 1, "Dh", {{20, 10, {L}}}},
         {14, 1, "Dhp", {{20, 10, {F, -9}}, {0, 10, {Sh, -48}}, {38, 10, {H}}}},
         {0, 1, "", {{0, 0, {F}}}},  // outside 1 to 14: the face only
@@ -185,7 +193,8 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         look.Play(c.steps);
         for (const Pixel& px : c.pixels) {
             const Rgb want = px.want.entry ? S(look.p().*px.want.entry, px.want.shift) : px.want.fixed;
-            EXPECT_EQ(look.At(px.x, px.y), want) << "type " << c.type << " \"" << c.steps << "\" (" << px.x << ", " << px.y << ")";
+            EXPECT_EQ(look.At(px.x, px.y), want)
+                << "type " << c.type << " \"" << c.steps << "\" (" << px.x << ", " << px.y << ")";
         }
     }
 }
@@ -232,7 +241,8 @@ TEST(XPButtonLooks, GradientRowsRoundHalvesToEven) {
     // H = 50: step 0.5; rows 3, 4, 5, 6, 7 use −2 (−1.5), −2, −2 (−2.5), −3, −4 (−3.5).
     Look g(3, 20, 50, 3);
     EXPECT_EQ((std::vector<Rgb>{g.At(10, 3), g.At(10, 4), g.At(10, 5), g.At(10, 6), g.At(10, 7)}),
-              (std::vector<Rgb>{SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -3), MakeRgb(236, 236, 235)}));
+              (std::vector<Rgb>{SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -3),
+                                MakeRgb(236, 236, 235)}));
     // SoftBevel halves every amount, the gradient steps included: H = 25, row 3 uses −3 → −1.
     Look soft(3, 20, 25, 3);
     soft.button.SetSoftBevel(true);
@@ -247,7 +257,8 @@ TEST(XPButtonLooks, SpecialLooksAndStates) {
     EXPECT_TRUE(face.canvas.texts.empty());
 
     Look parent(11);  // the parent's pixels in place of the face
-    EXPECT_EQ(std::make_pair(parent.At(0, 0), parent.At(39, 19)), std::make_pair(parent.host.parentPixel, parent.host.parentPixel));
+    EXPECT_EQ(std::make_pair(parent.At(0, 0), parent.At(39, 19)),
+              std::make_pair(parent.host.parentPixel, parent.host.parentPixel));
     // A resize arriving while the background is captured is ignored; Refresh captures again.
     parent.host.duringCapture = [&] {
         parent.host.height = 0;
@@ -322,7 +333,8 @@ TEST(XPButtonGeometry, RegionsFocusAndCaption) {
     EXPECT_EQ(l.button.captionRect(), (Box{24, 5, 52, 18}));
     EXPECT_EQ(l.button.captionRectDown(), (Box{25, 6, 53, 19}));
     // A 16 × 16 picture to the left: box (17, 1, 73, 21), caption moved by (15, 4).
-    l.button.SetPictureNormal(std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 16, 16, std::vector<Rgb>(256)));
+    l.button.SetPictureNormal(
+        std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 16, 16, std::vector<Rgb>(256)));
     auto placed = [&] {
         const auto r = l.button.pictureRect();
         return std::make_tuple(l.button.captionRect(), r.x, r.y);
@@ -334,7 +346,8 @@ TEST(XPButtonGeometry, RegionsFocusAndCaption) {
     EXPECT_EQ(l.button.captionRect().top, -4);
     EXPECT_EQ(l.button.pictureRect().y, l.button.captionRect().bottom + 2);
     l.button.SetCaption("  ");  // an empty caption centres the picture
-    EXPECT_EQ(std::make_pair(l.button.pictureRect().x, l.button.pictureRect().y), std::make_pair((75 - 16) / 2, (23 - 16) / 2));
+    EXPECT_EQ(std::make_pair(l.button.pictureRect().x, l.button.pictureRect().y),
+              std::make_pair((75 - 16) / 2, (23 - 16) / 2));
 
     // At 127 dpi one pixel is 20 HIMETRIC: 50 → 2.5 → 2, 70 → 3.5 → 4, 61 → 3.05 → 3.
     l.host.dpi = 127;
@@ -406,7 +419,8 @@ TEST(XPButtonPictures, PictureByStateAndEffects) {
     l.button.SetEnabled(false);  // engraved: highlight at (+1, +1) under the shadow silhouette
     EXPECT_EQ(std::make_pair(at(1, 0), at(2, 2)), std::make_pair(p.ShadowColor, p.HighlightColor));
     l.button.SetEnabled(true);
-    l.button.SetPictureOver(std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4, 0x0000FF)));
+    l.button.SetPictureOver(
+        std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4, 0x0000FF)));
     l.Hover();
     EXPECT_EQ(at(0, 0), 0x0000FFu) << "hovering shows PictureOver";
     l.host.pointerOver = false;
@@ -417,7 +431,8 @@ TEST(XPButtonPictures, PictureByStateAndEffects) {
         {1, S(kFace, -40), S(kFace, 40)}, {2, S(kFace, 40), S(kFace, -40)}, {3, S(kFace, -40), kFace}};
     for (const auto& [effect, belowRight, aboveLeft] : effects) {
         l.button.SetSpecialEffect(effect);
-        EXPECT_EQ(std::make_tuple(at(2, 2), at(0, -1), at(1, 0), at(-1, -1)), std::make_tuple(belowRight, aboveLeft, Rgb{0}, kFace))
+        EXPECT_EQ(std::make_tuple(at(2, 2), at(0, -1), at(1, 0), at(-1, -1)),
+                  std::make_tuple(belowRight, aboveLeft, Rgb{0}, kFace))
             << effect;
     }
     // Caption copies: sunken puts the lighter copy below-right, then the darker, then the text.

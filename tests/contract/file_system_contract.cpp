@@ -24,7 +24,8 @@ bool WriteWhole(platform::FileSystem& disk, const std::string& path, const std::
 
 TEST_P(FileSystemContract, FoldersFilesReplaceAndFreeSpace) {
     platform::FileError error;
-    const std::string one = fs_.folder + "\\one", two = one + "\\two", part = one + "\\sw2.def.part", to = one + "\\sw2.def";
+    const std::string one = fs_.folder + "\\one", two = one + "\\two";
+    const std::string part = one + "\\sw2.def.part", to = one + "\\sw2.def";
     EXPECT_TRUE(fs_.disk->FolderExists(fs_.folder + "\\")) << "a trailing backslash names the same folder";
     EXPECT_FALSE(fs_.disk->CreateFolder(two, error));
     EXPECT_EQ(error.number, 3) << "folders are created one level at a time";

@@ -77,10 +77,12 @@ TEST_F(RealTeardown, RowsAreLaidOutLikeTheWindowsTable) {
     auto find = [&](auto predicate) { return *std::find_if(rows.begin(), rows.end(), predicate); };
     auto listening = find([](const platform::TcpRow& r) { return r.state == platform::kTcpStateListen; });
     EXPECT_EQ(std::make_tuple(listening.remoteAddr, listening.localAddr, listening.localPort),
-              std::make_tuple(0u, AddressField("127.0.0.3"), std::uint32_t{htons(listener.port)})) << "a listening row's key is 0";
+              std::make_tuple(0u, AddressField("127.0.0.3"), std::uint32_t{htons(listener.port)}))
+        << "a listening row's key is 0";
     auto client = find([&](const platform::TcpRow& r) { return r.localPort == htons(connection.clientPort); });
     EXPECT_EQ(std::make_tuple(client.state, client.localAddr, client.remoteAddr, client.remotePort),
-              std::make_tuple(platform::kTcpStateEstablished, 0x0100007Fu, 0x0300007Fu, std::uint32_t{htons(listener.port)}))
+              std::make_tuple(platform::kTcpStateEstablished, 0x0100007Fu, 0x0300007Fu,
+                              std::uint32_t{htons(listener.port)}))
         << "127.0.0.3 in network order, read little-endian";
 
     // A sorted table comes back in address and port order.

@@ -88,7 +88,8 @@ TEST_F(WinInetDownload, BodiesOfEverySizeArriveWholeWithProgressPerChunk) {
         WriteFile(dest_, kOld);
         EXPECT_TRUE(Get(path)) << path;
         EXPECT_EQ(events_, events) << path;
-        EXPECT_EQ(ReadFile(dest_), path == "/body/0" ? kOld : Pattern(std::stoul(path.substr(path.rfind('/') + 1)))) << path;
+        const std::size_t size = std::stoul(path.substr(path.rfind('/') + 1));
+        EXPECT_EQ(ReadFile(dest_), size == 0 ? kOld : Pattern(size)) << path;
     }
     // Several worker blocks (64 KiB) and a last short chunk: every byte in place.
     EXPECT_TRUE(Get("/body/300001"));
@@ -114,7 +115,8 @@ TEST_F(WinInetDownload, RefusalsCutsAndUnusableSizesLeaveTheInstalledFile) {
         EXPECT_EQ(events_, "error:" + message + " ");
     }
     EXPECT_FALSE(Get("/cut/5000/3072"));
-    EXPECT_EQ(events_, "progress:20 progress:41 progress:61 progress:61 error:The connection with the server was reset. ");
+    EXPECT_EQ(events_,
+              "progress:20 progress:41 progress:61 progress:61 error:The connection with the server was reset. ");
     // Sizes beyond a signed 32-bit integer, and negative ones: refused with a message naming them.
     for (const std::string length : {"99999999999", "-5", "2147483648", "1e999"}) {
         EXPECT_FALSE(Get("/length/" + length + "/3000"));
@@ -201,8 +203,10 @@ TEST_F(WinInetDownload, TrustedCertificateDeliversAndUntrustedIsRefused) {
     std::string der = ReadFile(std::string("Z:") + dir + "/certs/ca.der");
     HCERTSTORE root = ::CertOpenStore(CERT_STORE_PROV_SYSTEM_A, 0, 0, CERT_SYSTEM_STORE_LOCAL_MACHINE, "ROOT");
     ASSERT_NE(root, nullptr);
-    ASSERT_TRUE(::CertAddEncodedCertificateToStore(root, X509_ASN_ENCODING, reinterpret_cast<const BYTE*>(der.data()),
-                                                   static_cast<DWORD>(der.size()), CERT_STORE_ADD_REPLACE_EXISTING, nullptr));
+    ASSERT_TRUE(::CertAddEncodedCertificateToStore(root, X509_ASN_ENCODING,
+                                                   reinterpret_cast<const BYTE*>(der.data()),
+                                                   static_cast<DWORD>(der.size()), CERT_STORE_ADD_REPLACE_EXISTING,
+                                                   nullptr));
     ::CertCloseStore(root, 0);
     EXPECT_FALSE(Get(server("untrusted") + "/body/5000"));
     EXPECT_NE(events_.find("certificate authority"), std::string::npos) << events_;

@@ -49,7 +49,8 @@ std::vector<std::vector<int>> IconGroup(int id) {
     for (WORD i = 0; i < count; ++i) {
         GroupIconEntry entry;
         std::memcpy(&entry, data + 6 + i * sizeof entry, sizeof entry);
-        entries.push_back({entry.width == 0 ? 256 : entry.width, entry.height == 0 ? 256 : entry.height, entry.bitCount});
+        entries.push_back(
+            {entry.width == 0 ? 256 : entry.width, entry.height == 0 ? 256 : entry.height, entry.bitCount});
     }
     return entries;
 }
@@ -116,7 +117,8 @@ TEST(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
     char className[64] = {};
     ::GetClassNameA(window.BtnOnOff().Handle(), className, sizeof className);
     EXPECT_STREQ(className, "KirelXPButton");
-    EXPECT_EQ(std::make_tuple(window.BtnOnOffWindow().button().CheckBoxBehaviour(), window.BtnOnOffWindow().button().Font().name),
+    const auto& onOffButton = window.BtnOnOffWindow().button();
+    EXPECT_EQ(std::make_tuple(onOffButton.CheckBoxBehaviour(), onOffButton.Font().name),
               std::make_tuple(true, std::string("Verdana")));
 
     EXPECT_EQ(window.Icon(), window.Lights(kLightPadlock)) << "the design icon is the padlock";

@@ -77,7 +77,9 @@ protected:
         };
         bool clicked = false;
         HWND answered = nullptr;
+        int ticks = 0;
         Ticker user(30, [&] {
+            if (++ticks == 1000 && window.hwnd() != nullptr) ::PostMessageA(window.hwnd(), WM_CLOSE, 0, 0);  // 30 s
             if (!clicked && ::IsWindowVisible(window.hwnd())) {
                 if (pointer) PointerClick(window.updateButton().hwnd());
                 else ::PostMessageA(window.updateButton().hwnd(), BM_CLICK, 0, 0);
@@ -117,34 +119,37 @@ TEST_F(OptionsUpdatesTest, PointerClickFetchesNewerDefinitionsAndPaintsProgress)
     Serve("mainver", "1.0\n");
     Shown shown = Check(true);
     EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.pbVisible, shown.enabled),
-              std::make_tuple(std::string("Definitions Updates: Complete"), std::string("Program Updates: No Updates"), true, true));
+              std::make_tuple(std::string("Definitions Updates: Complete"), std::string("Program Updates: No Updates"),
+                              true, true));
     EXPECT_TRUE(shown.boxes.empty());
     EXPECT_EQ(Local("sw2.def"), definitions);
     EXPECT_EQ(Local("defver"), "21\n");
     // The last progress painted was 100 %: the bar (highlight colour) reaches across pb.
-    EXPECT_EQ(std::make_pair(shown.pbLeft, shown.pbRight), std::make_pair(::GetSysColor(COLOR_HIGHLIGHT), ::GetSysColor(COLOR_HIGHLIGHT)));
+    EXPECT_EQ(std::make_pair(shown.pbLeft, shown.pbRight),
+              std::make_pair(::GetSysColor(COLOR_HIGHLIGHT), ::GetSysColor(COLOR_HIGHLIGHT)));
 }
 
 TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndFailuresKeepTheInstalledVersion) {
     const std::string installed = "installed definitions\r\n";
+    const char *kNoDefs = "Definitions Updates: No Updates", *kNoProgram = "Program Updates: No Updates";
     struct Case {
         const char *localDefver, *defver, *sw2, *mainver, *setup;
         ProgramVersion version;
         const char *L0, *L1, *box, *defverAfter;
     } cases[] = {
         // Equal versions fetch nothing and pb stays hidden.
-        {"20\r\n", "20", "not fetched", "1.0", nullptr, {1, 0}, "Definitions Updates: No Updates", "Program Updates: No Updates", "", "20\r\n"},
+        {"20\r\n", "20", "not fetched", "1.0", nullptr, {1, 0}, kNoDefs, kNoProgram, "", "20\r\n"},
         // 3 against 10: older as numbers, though "3" sorts after "10" as text.
-        {"10\r\n", "3", "not fetched", "1.0", nullptr, {1, 0}, "Definitions Updates: No Updates", "Program Updates: No Updates", "", "10\r\n"},
+        {"10\r\n", "3", "not fetched", "1.0", nullptr, {1, 0}, kNoDefs, kNoProgram, "", "10\r\n"},
         // Program 1.10 reads as 1.1, below the server's 1.9: the setup program is fetched.
-        {"20\r\n", "20", nullptr, "1.9\r\n", "setup", {1, 10}, "Definitions Updates: No Updates", "Program Updates: Complete", "", "20\r\n"},
+        {"20\r\n", "20", nullptr, "1.9\r\n", "setup", {1, 10}, kNoDefs, "Program Updates: Complete", "", "20\r\n"},
         // A newer version without sw2.def on the server: defver stays, so the next check retries.
-        {"20\r\n", "21", nullptr, "1.0", nullptr, {1, 0}, "Definitions Updates:", "Program Updates: No Updates",
+        {"20\r\n", "21", nullptr, "1.0", nullptr, {1, 0}, "Definitions Updates:", kNoProgram,
          "Updates owned: Error downloading definition updates The file, \"", "20\r\n"},
         // A missing local version counts as 0.
-        {nullptr, "1", "new definitions", "1.0", nullptr, {1, 0}, "Definitions Updates: Complete", "Program Updates: No Updates", "", "1"},
+        {nullptr, "1", "new definitions", "1.0", nullptr, {1, 0}, "Definitions Updates: Complete", kNoProgram, "", "1"},
         // The setup program's own failure has its own message; the caption keeps its text.
-        {"20\r\n", "20", nullptr, "2", nullptr, {1, 0}, "Definitions Updates: No Updates", "Program Updates:",
+        {"20\r\n", "20", nullptr, "2", nullptr, {1, 0}, kNoDefs, "Program Updates:",
          "Updates owned: Error downloading program updates The file, \"", "20\r\n"},
     };
     for (const Case& c : cases) {
@@ -159,12 +164,15 @@ TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndFailuresKeepTheInstalledVe
         if (c.sw2) Serve("sw2.def", c.sw2);
         if (c.setup) Serve("VTSetup.exe", c.setup);
         Shown shown = Check(false, c.version);
-        EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.enabled), std::make_tuple(std::string(c.L0), std::string(c.L1), true));
+        EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.enabled),
+                  std::make_tuple(std::string(c.L0), std::string(c.L1), true));
         ASSERT_EQ(shown.boxes.size(), *c.box ? 1u : 0u);
         if (*c.box) EXPECT_EQ(shown.boxes[0].rfind(c.box, 0), 0u) << shown.boxes[0];
         EXPECT_EQ(Local("defver"), c.defverAfter);
-        EXPECT_EQ(Local("sw2.def"), std::string(c.L0) == "Definitions Updates: Complete" ? std::string(c.sw2) : installed);
-        EXPECT_EQ(Local("VTSetup.exe"), c.setup && std::string(c.L1).find("Complete") != std::string::npos ? c.setup : "");
+        const bool definitions = std::string(c.L0).find("Complete") != std::string::npos;
+        const bool program = std::string(c.L1).find("Complete") != std::string::npos;
+        EXPECT_EQ(Local("sw2.def"), definitions ? std::string(c.sw2) : installed);
+        EXPECT_EQ(Local("VTSetup.exe"), program ? c.setup : "");
     }
 }
 

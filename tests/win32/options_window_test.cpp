@@ -30,15 +30,16 @@ protected:
     }
     // Start, Tray, the Run entry and the script debugger setting, in that order.
     std::string Settings() {
-        return Read(kHkeyLocalMachine, kVantorelKey, "Start") + " " + Read(kHkeyLocalMachine, kVantorelKey, "Tray") + " " +
-               Read(kHkeyLocalMachine, kRunKey, "Vantorel") + " " +
+        return Read(kHkeyLocalMachine, kVantorelKey, "Start") + " " + Read(kHkeyLocalMachine, kVantorelKey, "Tray") +
+               " " + Read(kHkeyLocalMachine, kRunKey, "Vantorel") + " " +
                Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger");
     }
     void Clean() {
-        for (auto [root, key, name] : {std::tuple{kHkeyLocalMachine, std::string(kVantorelKey), "Start"},
-                                       std::tuple{kHkeyLocalMachine, std::string(kVantorelKey), "Tray"},
-                                       std::tuple{kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel"},
-                                       std::tuple{kHkeyCurrentUser, std::string(kInternetExplorerMainKey), "Disable Script Debugger"}}) {
+        using Value = std::tuple<std::int32_t, std::string, const char*>;
+        for (auto [root, key, name] : {Value{kHkeyLocalMachine, kVantorelKey, "Start"},
+                                       Value{kHkeyLocalMachine, kVantorelKey, "Tray"},
+                                       Value{kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel"},
+                                       Value{kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"}}) {
             RegistryRoutines reg(registry_);
             reg.hkey(root);
             reg.KeyRoot(key);
@@ -81,14 +82,15 @@ TEST_F(OptionsWindowTest, PointerClicksStoreEachOptionAtOnce) {
     });
     window.ShowModal();
     EXPECT_EQ(window.hwnd(), nullptr) << "the pointer click on \"&Close\" closed the window";
-    EXPECT_EQ(seen, (std::vector<std::string>{"1 <none> " + exe + " <none>", "1 1 " + exe + " <none>", "1 1 " + exe + " no",
-                                              "0 1 <none> no"}));
+    EXPECT_EQ(seen, (std::vector<std::string>{"1 <none> " + exe + " <none>", "1 1 " + exe + " <none>",
+                                              "1 1 " + exe + " no", "0 1 <none> no"}));
 
     OptionsWindow again(nullptr, 1, registry_, exe);
     ::GetWindowTextA(again.hwnd(), caption, sizeof caption);
     EXPECT_STREQ(caption, "Updates");
     EXPECT_TRUE(again.controls().F[1]->Visible() && !again.controls().F[0]->Visible());
-    EXPECT_EQ(std::make_tuple(again.box(0).Value(), again.box(1).Value(), again.box(2).Value()), std::make_tuple(false, true, false));
+    EXPECT_EQ(std::make_tuple(again.box(0).Value(), again.box(1).Value(), again.box(2).Value()),
+              std::make_tuple(false, true, false));
     ::PostMessageA(again.hwnd(), WM_CLOSE, 0, 0);
     again.ShowModal();
     EXPECT_EQ(again.hwnd(), nullptr);

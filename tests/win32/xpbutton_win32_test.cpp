@@ -61,8 +61,10 @@ std::string Compare(int type, int scheme, int state, const platform::PicturePtr&
     std::ostringstream out;
     for (int y = 0; y < 23; ++y)
         for (int x = 0; x < 37; ++x)
-            if ((type != 13 || ((x == 0 || x == 36) && (y == 0 || y == 22))) && raster.At(x, y) != gdi.At(x, y) && out.tellp() < 200)
-                out << "(" << x << "," << y << ") raster " << std::hex << raster.At(x, y) << " gdi " << gdi.At(x, y) << std::dec << "; ";
+            if ((type != 13 || ((x == 0 || x == 36) && (y == 0 || y == 22))) && raster.At(x, y) != gdi.At(x, y) &&
+                out.tellp() < 200)
+                out << "(" << x << "," << y << ") raster " << std::hex << raster.At(x, y) << " gdi " << gdi.At(x, y)
+                    << std::dec << "; ";
     return out.str();
 }
 
