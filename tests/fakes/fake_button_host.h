@@ -27,9 +27,9 @@ public:
     }
     void SetShape(const platform::WindowShape& value) override {
         shape = value;
-        ++shapesSet;
+        shapeHeld = true;
     }
-    void ReleaseShape() override { ++shapesReleased; }
+    void ReleaseShape() override { shapeHeld = false; }
     bool PointerOverSelf() const override { return pointerOver; }
     void StartOverTimer(std::int32_t ms) override {
         timerRunning = true;
@@ -58,8 +58,7 @@ public:
     bool refuseMouseIcon = false;
     platform::PicturePtr mouseIcon;
     platform::WindowShape shape;
-    int shapesSet = 0;
-    int shapesReleased = 0;
+    bool shapeHeld = false;
     bool pointerOver = false;
     bool timerRunning = false;
     std::int32_t timerPeriod = 0;
@@ -72,7 +71,6 @@ public:
     platform::Rgb parentBack = 0x00FFEEDD;
     platform::Rgb parentText = 0x00112233;
     platform::Rgb parentPixel = 0x00336699;
-    int backgroundCaptures = 0;
     // Runs inside CaptureParentPixels, as pending window messages would.
     std::function<void()> duringCapture;
     std::map<int, platform::Rgb> systemColours;

@@ -29,7 +29,6 @@ inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint
 class FakeConnectionTable final : public platform::ConnectionTable {
 public:
     std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool order) override {
-        ++fetches;
         lastOrder = order;
         if (beforeFetch) beforeFetch();
         if (failWith != platform::kNoError) return failWith;
@@ -54,7 +53,6 @@ public:
     std::uint32_t overstateCount = 0;  // a count larger than the rows written
     std::function<void()> beforeFetch;
 
-    int fetches = 0;
     bool lastOrder = true;
     std::vector<platform::TcpRow> entries;    // every SetTcpEntry call
 };
