@@ -31,9 +31,9 @@ const std::string kFolder = "C:\\Vantorel";
 const std::string kDefinitionsPath = kFolder + "\\sw2.def";
 constexpr platform::IconHandle kDark = 0xD0, kBright = 0xB0, kPadlock = 0xA0;
 
-class FakeShell final : public platform::Shell {
+// The shell and the application, noting what the window asks of them in one event log.
+class FakeDesktop final : public platform::Shell, public platform::Application {
 public:
-    explicit FakeShell(std::vector<std::string>& log) : events(log) {}
     std::intptr_t Execute(platform::WindowHandle owner, const std::string& operation, const std::string& file,
                           const std::string& parameters, const std::string& directory, std::int32_t show) override {
         events.push_back("Execute " + std::to_string(owner) + " " + operation + " " + file + " [" + parameters +
@@ -45,13 +45,6 @@ public:
         events.push_back("MessageBox " + title + " " + std::to_string(style) + " " + std::to_string(owner));
         texts.push_back(text);
     }
-    std::vector<std::string>& events;
-    std::vector<std::string> texts;
-};
-
-class FakeApplication final : public platform::Application {
-public:
-    explicit FakeApplication(std::vector<std::string>& log) : events(log) {}
     void ShowOptionsModal(platform::WindowHandle, int frameIndex) override {
         events.push_back("Options " + std::to_string(frameIndex));
         if (onOptions) onOptions();
@@ -61,12 +54,13 @@ public:
         if (onEnd) onEnd();
     }
     std::function<void()> onOptions, onEnd;
-    std::vector<std::string>& events;
+    std::vector<std::string> events, texts;
 };
 
 // The main window with every platform piece faked; the definitions list 10.0.0.200 and 1.2.3.4.
 struct MainRig {
-    std::vector<std::string> events;
+    FakeDesktop desktop;
+    std::vector<std::string>& events = desktop.events;
     FakeRegistry registry;
     FakeFileSystem files;
     FakeConnectionTable table;
@@ -74,16 +68,14 @@ struct MainRig {
     FakeWindowManager windows;
     FakePump pump;
     FakeInstance instance;
-    FakeShell shell{events};
-    FakeApplication application{events};
     FakeWindow frm;
     FakeSwitch btnOnOff;
     FakeTimer tmr, timer;
     FakeButton btnO[5];
     FakeFrame uf[2];
     FakeLabel l[2];
-    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, instance}, shell,
-                                 application},
+    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, tray, windows, pump, instance}, desktop,
+                                 desktop},
                  FrmMainControls{frm, btnOnOff, tmr, timer, {&btnO[0], &btnO[1], &btnO[2], &btnO[3], &btnO[4]},
                                  {&uf[0], &uf[1]}, {&l[0], &l[1]}, {kDark, kBright, kPadlock}},
                  kFolder};
@@ -180,7 +172,7 @@ TEST(StartUp, MissingDefinitionsAreReportedAndTheUpdatesWindowOpensBeforeTheTray
     rig.Start();
     const std::string box = "MessageBox Definitions Error ", owner = " " + std::to_string(rig.frm.handle);
     EXPECT_EQ(rig.events, (std::vector<std::string>{box + "16" + owner, "Options 1", box + "48" + owner, "Tray 0"}));
-    EXPECT_EQ(rig.shell.texts,
+    EXPECT_EQ(rig.desktop.texts,
               (std::vector<std::string>{
                   "Reading definitions, installation corrupted re-install at https://updates.example.org/",
                   kNoDefinitionsText}));
@@ -194,9 +186,9 @@ TEST(StartUp, MissingDefinitionsAreReportedAndTheUpdatesWindowOpensBeforeTheTray
     // A file the updates window installed is read without the second message.
     MainRig updated;
     updated.files.files.clear();
-    updated.application.onOptions = [&] { updated.files.files[kDefinitionsPath] = "67305985\n"; };
+    updated.desktop.onOptions = [&] { updated.files.files[kDefinitionsPath] = "67305985\n"; };
     updated.Start();
-    EXPECT_EQ(updated.shell.texts.size(), 1u);
+    EXPECT_EQ(updated.desktop.texts.size(), 1u);
     EXPECT_GE(FindDefinition(Definitions, "67305985"), 0);
 }
 
@@ -217,7 +209,7 @@ TEST(FrmMain, ExitRemovesTheIconAndStopsBothTimersBeforeTheProgramEndsOnce) {
     MainRig rig;
     rig.Put(kHkeyCurrentUser, "State", "1");
     rig.Start();
-    rig.application.onEnd = [&] {
+    rig.desktop.onEnd = [&] {
         rig.events.push_back(rig.tmr.enabled || rig.timer.enabled ? "timers on" : "timers off");
     };
     rig.events.clear();

@@ -7,7 +7,6 @@
 //   vtprobe controls HWND           the child windows of HWND, same columns, screen coordinates
 //   vtprobe post HWND MSG WPARAM LPARAM
 //                                   posts a message (numbers in decimal or 0x hex)
-//   vtprobe icon HWND               the handle of the window's small and big icon
 #include <windows.h>
 
 #include <cstdio>
@@ -60,12 +59,8 @@ int main(int argc, char** argv) {
         WPARAM wParam = static_cast<WPARAM>(std::strtoull(argv[4], nullptr, 0));
         LPARAM lParam = static_cast<LPARAM>(std::strtoll(argv[5], nullptr, 0));
         return ::PostMessageA(ToHwnd(argv[2]), message, wParam, lParam) ? 0 : 1;
-    } else if (command == "icon" && argc > 2) {
-        HWND hwnd = ToHwnd(argv[2]);
-        std::printf("%lld\t%lld\n", static_cast<long long>(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0)),
-                    static_cast<long long>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0)));
     } else {
-        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | icon HWND\n");
+        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM\n");
         return 2;
     }
     std::fflush(stdout);
