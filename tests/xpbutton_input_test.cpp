@@ -101,8 +101,11 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     PropertyBag again;  // what was read writes back the same, but for HAND (false once read)
     c.WriteProperties(again);
     EXPECT_EQ(again.Keys(), bag.Keys());
-    for (const std::string& key : bag.Keys())
-        if (key != "HAND") EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
+    for (const std::string& key : bag.Keys()) {
+        if (key != "HAND") {
+            EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
+        }
+    }
     EXPECT_FALSE(again.ReadBool("HAND", true));
     EXPECT_EQ(std::make_tuple(c.accessKey(), host2.windowEnabled, host2.windowFont, host2.pointer, host2.mouseIcon,
                               c.pictureRect().width),

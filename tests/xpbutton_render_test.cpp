@@ -117,9 +117,9 @@ TEST(XPButtonColour, PaletteBySchemes) {
 
 // Expected colours: a palette entry shifted, or a fixed colour.
 struct Want {
-    Rgb Palette::*entry;
-    int shift;
-    Rgb fixed;
+    Rgb Palette::*entry = nullptr;
+    int shift = 0;
+    Rgb fixed = 0;
 };
 constexpr Rgb Palette::*F = &Palette::FaceColor;
 constexpr Rgb Palette::*H = &Palette::HighlightColor;

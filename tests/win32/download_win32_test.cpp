@@ -66,7 +66,9 @@ protected:
     bool Get(const std::string& path, const std::string& user = "", const std::string& password = "") {
         events_.clear();
         bool done = fd_.DownloadFile(path.rfind("/", 0) == 0 ? server_ + path : path, dest_, user, password);
-        if (!done) EXPECT_EQ(ReadFile(dest_), kOld) << path;
+        if (!done) {
+            EXPECT_EQ(ReadFile(dest_), kOld) << path;
+        }
         return done;
     }
 
@@ -139,7 +141,7 @@ TEST_F(WinInetDownload, FailedConnectionsAreRequestErrors) {
     ::getsockname(probe, reinterpret_cast<sockaddr*>(&address), &length);
     ::closesocket(probe);
     ::WSACleanup();
-    for (const std::string url : {"http://127.0.0.1:" + std::to_string(ntohs(address.sin_port)) + "/body/10",
+    for (const std::string& url : {"http://127.0.0.1:" + std::to_string(ntohs(address.sin_port)) + "/body/10",
                                   std::string("ftp://127.0.0.1/sw2.def")}) {
         EXPECT_FALSE(Get(url));
         EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;

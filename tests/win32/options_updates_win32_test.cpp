@@ -167,7 +167,9 @@ TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndFailuresKeepTheInstalledVe
         EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.enabled),
                   std::make_tuple(std::string(c.L0), std::string(c.L1), true));
         ASSERT_EQ(shown.boxes.size(), *c.box ? 1u : 0u);
-        if (*c.box) EXPECT_EQ(shown.boxes[0].rfind(c.box, 0), 0u) << shown.boxes[0];
+        if (*c.box) {
+            EXPECT_EQ(shown.boxes[0].rfind(c.box, 0), 0u) << shown.boxes[0];
+        }
         EXPECT_EQ(Local("defver"), c.defverAfter);
         const bool definitions = std::string(c.L0).find("Complete") != std::string::npos;
         const bool program = std::string(c.L1).find("Complete") != std::string::npos;
