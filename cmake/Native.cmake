@@ -12,20 +12,15 @@ target_link_libraries(vantorel_native PUBLIC vantorel_core)
 add_executable(vantorel_tests
     tests/definitions_test.cpp
     tests/frm_options_test.cpp
-    tests/read_definitions_test.cpp
     tests/registry_routines_test.cpp
     tests/xpbutton_input_test.cpp
     tests/xpbutton_render_test.cpp
-    tests/draw_progress_test.cpp
     tests/file_downloader_test.cpp
     tests/http_header_test.cpp
     tests/leading_number_test.cpp
-    tests/update_check_test.cpp
     tests/contract/file_system_contract.cpp
     tests/contract/file_system_contract_fake.cpp
-    tests/guard_test.cpp
     tests/sweep_test.cpp
-    tests/tray_test.cpp
     tests/frm_main_test.cpp
     tests/contract/registry_contract.cpp
     tests/contract/registry_contract_fake.cpp

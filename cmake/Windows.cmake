@@ -150,12 +150,7 @@ set_tests_properties(nginx_start PROPERTIES FIXTURES_SETUP nginx)
 add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh stop ${VANTOREL_NGINX_DIR})
 set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
 
-vantorel_wine_test(update_check_win32_tests tests/win32/update_check_win32_test.cpp)
-set_tests_properties(update_check_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx;http_server"
-    ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1"
-    RESOURCE_LOCK nginx_www)
-
-# The real options window's updates panel against the same nginx.
+# The real options window's updates panel against nginx.
 vantorel_wine_test(options_updates_win32_tests tests/win32/options_updates_win32_test.cpp)
 set_tests_properties(options_updates_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
     ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1"
@@ -164,9 +159,6 @@ set_tests_properties(options_updates_win32_tests PROPERTIES FIXTURES_REQUIRED "w
 # The per-row yield's cost, run by hand under Wine (not a test).
 add_executable(pump_bench bench/win32/pump_bench.cpp)
 target_link_libraries(pump_bench PRIVATE vantorel_win32)
-
-vantorel_wine_test(connection_table_win32_tests tests/win32/connection_table_win32_test.cpp)
-target_link_libraries(connection_table_win32_tests PRIVATE ws2_32)
 
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
 

@@ -1,6 +1,7 @@
-// The main window's logic against fake widgets and platform: the BtnO actions by index, going to
-// the tray when minimised, the unload order, the status light's blink sequence and the tray tip,
-// and the missing-definitions flow of start-up.
+// The main window and the guard behind it, against fakes: start-up from stored settings, the
+// missing-definitions flow, the buttons, the unload order, the status light and tray tip, sweeps
+// that never nest, and the tray records. The real window, registry and program are proved under
+// Wine (tests/win32/, tests/e2e/).
 #include "ui/main/frm_main.h"
 
 #include <gtest/gtest.h>
@@ -9,100 +10,79 @@
 #include <string>
 #include <vector>
 
-#include "fakes/fake_files.h"
+#include "fakes/fake_file_system.h"
 #include "fakes/fake_guard_platform.h"
 #include "fakes/fake_registry.h"
 #include "fakes/fake_widgets.h"
 #include "guard/attempts.h"
 #include "guard/definitions.h"
 #include "settings/settings.h"
+#include "ui/main/tray.h"
 
 namespace vantorel {
 namespace {
 
 using namespace vantorel::testing;
+using platform::kHkeyCurrentUser;
+using platform::kHkeyLocalMachine;
+using Icons = std::vector<platform::IconHandle>;
 
-const std::string kFolder = "C:\\Program Files\\Vantorel";
+const std::string kFolder = "C:\\Vantorel";
 const std::string kDefinitionsPath = kFolder + "\\sw2.def";
 constexpr platform::IconHandle kDark = 0xD0, kBright = 0xB0, kPadlock = 0xA0;
 
-class FakeShell final : public platform::Shell {
+// The shell and the application, noting what the window asks of them in one event log.
+class FakeDesktop final : public platform::Shell, public platform::Application {
 public:
-    struct ExecuteCall {
-        platform::WindowHandle owner;
-        std::string operation, file, parameters, directory;
-        std::int32_t show;
-    };
-    struct Box {
-        platform::WindowHandle owner;
-        std::string text, title;
-        std::uint32_t style;
-    };
     std::intptr_t Execute(platform::WindowHandle owner, const std::string& operation, const std::string& file,
-                               const std::string& parameters, const std::string& directory,
-                               std::int32_t show) override {
-        executes.push_back({owner, operation, file, parameters, directory, show});
-        events.push_back("ShellExecute");
+                          const std::string& parameters, const std::string& directory, std::int32_t show) override {
+        events.push_back("Execute " + std::to_string(owner) + " " + operation + " " + file + " [" + parameters +
+                         "][" + directory + "] " + std::to_string(show));
         return 2;  // "file not found": the window does not look at it
     }
     void ShowMessage(platform::WindowHandle owner, const std::string& text, const std::string& title,
-                    std::uint32_t style) override {
-        boxes.push_back({owner, text, title, style});
-        events.push_back("MessageBox " + title);
+                     std::uint32_t style) override {
+        events.push_back("MessageBox " + title + " " + std::to_string(style) + " " + std::to_string(owner));
+        texts.push_back(text);
     }
-    std::vector<ExecuteCall> executes;
-    std::vector<Box> boxes;
-    std::vector<std::string>& events;
-    explicit FakeShell(std::vector<std::string>& log) : events(log) {}
-};
-
-class FakeApplication final : public platform::Application {
-public:
-    explicit FakeApplication(std::vector<std::string>& log) : events(log) {}
-    void ShowOptionsModal(platform::WindowHandle owner, int frameIndex) override {
-        options.push_back({owner, frameIndex});
+    void ShowOptionsModal(platform::WindowHandle, int frameIndex) override {
         events.push_back("Options " + std::to_string(frameIndex));
         if (onOptions) onOptions();
     }
     void EndProgram() override {
-        ++ends;
         events.push_back("End");
         if (onEnd) onEnd();
     }
-    std::function<void()> onEnd;
-    std::vector<std::pair<platform::WindowHandle, int>> options;
-    std::function<void()> onOptions;
-    int ends = 0;
-    std::vector<std::string>& events;
+    std::function<void()> onOptions, onEnd;
+    std::vector<std::string> events, texts;
 };
 
+// The main window with every platform piece faked; the definitions list 10.0.0.200 and 1.2.3.4.
 struct MainRig {
-    std::vector<std::string> events;
+    FakeDesktop desktop;
+    std::vector<std::string>& events = desktop.events;
     FakeRegistry registry;
-    FakeFiles files;
+    FakeFileSystem files;
     FakeConnectionTable table;
     FakeNotifyArea tray;
     FakeWindowManager windows;
     FakePump pump;
     FakeInstance instance;
-    FakeShell shell{events};
-    FakeApplication application{events};
     FakeWindow frm;
     FakeSwitch btnOnOff;
     FakeTimer tmr, timer;
-    FakeButton btnO[5] = {FakeButton("&Tray"), FakeButton("&Exit"), FakeButton("&Help"), FakeButton("&Updates"),
-                          FakeButton("&Options")};
-    FakeFrame uf[2] = {FakeFrame("Update"), FakeFrame("Options")};
-    FakeLabel l[2] = {FakeLabel("Selectable options such as starting when windows boots..."),
-                      FakeLabel("Check for Vantorel updates...")};
-    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, shell,
-                                 application},
+    FakeButton btnO[5];
+    FakeFrame uf[2];
+    FakeLabel l[2];
+    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, desktop,
+                                 desktop},
                  FrmMainControls{frm, btnOnOff, tmr, timer, {&btnO[0], &btnO[1], &btnO[2], &btnO[3], &btnO[4]},
                                  {&uf[0], &uf[1]}, {&l[0], &l[1]}, {kDark, kBright, kPadlock}},
                  kFolder};
 
     MainRig() {
-        files.Put(kDefinitionsPath, "-939524086\r\n67305985");  // 67305985 is 1.2.3.4
+        files.files[kDefinitionsPath] = "-939524086\r\n67305985";
+        tray.events = &events;
     }
     void Put(std::int32_t root, const std::string& name, const std::string& value) {
         RegistryRoutines reg(registry);
@@ -110,6 +90,12 @@ struct MainRig {
         reg.KeyRoot(kSettingsKey);
         reg.CreateKey();
         reg.SetRegistryValue(name, value, platform::kRegSz);
+    }
+    std::string Get(std::int32_t root, const std::string& name) {
+        RegistryRoutines reg(registry);
+        reg.hkey(root);
+        reg.KeyRoot(kSettingsKey);
+        return VariantText(reg.GetRegistryValue(name, std::string("<missing>")));
     }
     void Start() {
         ASSERT_TRUE(form.Initialize());
@@ -119,47 +105,36 @@ struct MainRig {
         btnOnOff.Value(!btnOnOff.Value());  // the button flips itself first
         form.BtnOnOffClick();
     }
-    std::size_t TrayCalls(std::uint32_t message) const {
-        std::size_t n = 0;
-        for (const auto& c : tray.calls) n += c.message == message ? 1 : 0;
-        return n;
+    std::string Switch() const {
+        return btnOnOff.caption + " " + std::to_string(btnOnOff.backColor) + " " + std::to_string(btnOnOff.backOver) +
+               (tmr.enabled ? " sweeping" : " idle");
+    }
+    Icons Ticks(int n) {
+        frm.icons.clear();
+        for (int i = 0; i < n; ++i) form.TimerTick();
+        return frm.icons;
     }
 };
 
-TEST(FrmMainButtons, EachIndexDoesItsOwnAction) {
+TEST(StartUp, FirstStartCentresAddsTheIconAndStoresTheState) {
     MainRig rig;
     rig.Start();
-    ASSERT_TRUE(rig.frm.visible);
-    const std::size_t trayCalls = rig.tray.calls.size();
-
-    rig.btnO[kBtnTray].UserClick();  // "&Tray": hidden, the icon already there, nothing else
-    EXPECT_FALSE(rig.frm.visible);
-    EXPECT_EQ(rig.tray.calls.size(), trayCalls);
-    EXPECT_TRUE(rig.timer.enabled);
-    EXPECT_EQ(rig.application.ends, 0);
-
-    rig.btnO[kBtnHelp].UserClick();  // the help page on the default server, shown normal
-    ASSERT_EQ(rig.shell.executes.size(), 1u);
-    const auto& help = rig.shell.executes[0];
-    EXPECT_EQ(help.owner, rig.frm.handle);
-    EXPECT_EQ(help.operation, "open");
-    EXPECT_EQ(help.file, "http://www.vantorel.com/vt/help.php");
-    EXPECT_EQ(help.parameters, "");
-    EXPECT_EQ(help.directory, "");
-    EXPECT_EQ(help.show, 1);
-
-    // The help page follows the configured server.
-    rig.Put(platform::kHkeyLocalMachine, "Server", "http://127.0.0.1:8080");
-    rig.btnO[kBtnHelp].UserClick();
-    ASSERT_EQ(rig.shell.executes.size(), 2u);
-    EXPECT_EQ(rig.shell.executes[1].file, "http://127.0.0.1:8080/vt/help.php");
-
-    rig.btnO[kBtnUpdates].UserClick();
-    rig.btnO[kBtnOptions].UserClick();
-    using Opened = std::pair<platform::WindowHandle, int>;
-    EXPECT_EQ(rig.application.options, (std::vector<Opened>{{rig.frm.handle, 1}, {rig.frm.handle, 0}}));
-    EXPECT_EQ(rig.application.ends, 0);
-    EXPECT_TRUE(rig.shell.boxes.empty());
+    EXPECT_EQ(rig.instance.mutexes, std::vector<std::string>{"Vantorel"});
+    EXPECT_EQ(std::make_pair(rig.frm.left, rig.frm.top), std::make_pair((1024 - 616) / 2, (768 - 320) / 2));
+    EXPECT_EQ(rig.Switch(), "OFF 192 192 idle");
+    EXPECT_EQ(std::make_tuple(rig.tmr.interval, rig.timer.interval, rig.timer.enabled),
+              std::make_tuple(55u, 1000u, true));
+    ASSERT_EQ(rig.tray.calls.size(), 1u);
+    const auto& add = rig.tray.calls[0].data;
+    EXPECT_EQ(std::make_tuple(rig.tray.calls[0].message, add.tip, add.icon, add.callbackMessage),
+              std::make_tuple(platform::kNimAdd, std::string("Vantorel -  0 attempts intercepted"), rig.frm.icon,
+                              512u));
+    EXPECT_EQ(rig.Get(kHkeyCurrentUser, "State"), "0");
+    EXPECT_EQ(rig.Get(kHkeyLocalMachine, "Tray"), "<missing>");
+    RegistryRoutines machine(rig.registry);  // both settings keys exist now, so later writes find them
+    machine.hkey(kHkeyLocalMachine);
+    machine.KeyRoot(kSettingsKey);
+    EXPECT_TRUE(machine.KeyExists());
 }
 
 TEST(FrmMainButtons, AModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
@@ -175,7 +150,7 @@ TEST(FrmMainButtons, AModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
         if (rig.pump.pumps == 2) rig.pump.OwnTick([&] { rig.form.TmrTick(); });
     };
     std::vector<std::int32_t> counts;
-    rig.application.onOptions = [&] {
+    rig.desktop.onOptions = [&] {
         for (int tick = 0; tick < 3; ++tick) {
             rig.form.TmrTick();
             counts.push_back(rig.form.guard().AttemptCount());
@@ -184,186 +159,183 @@ TEST(FrmMainButtons, AModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
     rig.form.TmrTick();
     EXPECT_EQ(counts, (std::vector<std::int32_t>{1, 2, 3})) << "each tick tears the listed row down";
     EXPECT_EQ(rig.form.guard().SweepsRun(), 4u);
-    EXPECT_EQ(rig.table.fetches, 4);
     EXPECT_EQ(rig.form.guard().AttemptCount(), 3) << "the held sweep never looks at another row";
     EXPECT_FALSE(rig.form.guard().Sweeping());
     rig.form.TmrTick();
     EXPECT_EQ(rig.form.guard().AttemptCount(), 4);
 }
 
-TEST(FrmMainUnload, ExitRemovesTheIconStopsBothTimersThenEndsOnce) {
+TEST(StartUp, StoredSettingsAndSettingsThatAreNotNumbers) {
+    struct Case {
+        const char *state, *attempts, *tray;
+        const char* switchState;
+        const char* caption;
+        bool visible;
+        const char* stateWritten;
+    } cases[] = {
+        {"7", "3", nullptr, "ON 65280 65280 sweeping", "Vantorel -  3 attempts intercepted", true, "1"},
+        {nullptr, "-4", "1", "OFF 192 192 idle", "Vantorel - -4 attempts intercepted", false, "0"},
+        {"abc", "many", "yes", "OFF 192 192 idle", "Vantorel -  0 attempts intercepted", true, "0"},
+        {nullptr, "99999999999", nullptr, "OFF 192 192 idle", "Vantorel -  0 attempts intercepted", true, "0"},
+    };
+    for (const Case& c : cases) {
+        MainRig rig;
+        if (c.state) rig.Put(kHkeyCurrentUser, "State", c.state);
+        if (c.attempts) rig.Put(kHkeyCurrentUser, "Attempts", c.attempts);
+        if (c.tray) rig.Put(kHkeyLocalMachine, "Tray", c.tray);
+        rig.Start();
+        EXPECT_EQ(rig.Switch(), c.switchState) << c.attempts;
+        EXPECT_EQ(rig.frm.caption, c.caption);
+        EXPECT_EQ(rig.frm.visible, c.visible) << c.attempts;
+        EXPECT_EQ(rig.Get(kHkeyCurrentUser, "State"), c.stateWritten) << c.attempts;
+    }
+}
+
+TEST(StartUp, MissingDefinitionsAreReportedAndTheUpdatesWindowOpensBeforeTheTrayIcon) {
     MainRig rig;
-    rig.Put(platform::kHkeyCurrentUser, "State", "1");
+    rig.files.files.clear();
+    rig.Put(kHkeyLocalMachine, "Server", "https://updates.example.org");
+    rig.Put(kHkeyCurrentUser, "State", "1");
     rig.Start();
-    ASSERT_TRUE(rig.tmr.enabled);
-    ASSERT_TRUE(rig.timer.enabled);
-    // What has happened by the time the program is asked to end.
-    bool timersStoppedAtEnd = false;
-    std::size_t deletesAtEnd = 0;
-    rig.application.onEnd = [&] {
-        timersStoppedAtEnd = !rig.tmr.enabled && !rig.timer.enabled;
-        deletesAtEnd = rig.TrayCalls(platform::kNimDelete);
+    const std::string box = "MessageBox Definitions Error ", owner = " " + std::to_string(rig.frm.handle);
+    EXPECT_EQ(rig.events, (std::vector<std::string>{box + "16" + owner, "Options 1", box + "48" + owner, "Tray 0"}));
+    EXPECT_EQ(rig.desktop.texts,
+              (std::vector<std::string>{
+                  "Reading definitions, installation corrupted re-install at https://updates.example.org/",
+                  kNoDefinitionsText}));
+    // Start-up runs to its end with an empty list, which tears nothing down.
+    EXPECT_EQ(rig.frm.caption, "Vantorel -  0 attempts intercepted");
+    EXPECT_TRUE(rig.timer.enabled && rig.tmr.enabled);
+    rig.table.rows = {Row(platform::kTcpStateEstablished, Ipv4(1, 2, 3, 4))};
+    rig.form.TmrTick();
+    EXPECT_TRUE(rig.table.entries.empty());
+
+    // A file the updates window installed is read without the second message.
+    MainRig updated;
+    updated.files.files.clear();
+    updated.desktop.onOptions = [&] { updated.files.files[kDefinitionsPath] = "67305985\n"; };
+    updated.Start();
+    EXPECT_EQ(updated.desktop.texts.size(), 1u);
+    EXPECT_GE(FindDefinition(Definitions, "67305985"), 0);
+}
+
+TEST(FrmMain, HelpOpensTheConfiguredServersPageShownNormal) {
+    MainRig rig;
+    rig.Start();
+    rig.events.clear();
+    rig.btnO[kBtnHelp].UserClick();
+    rig.Put(kHkeyLocalMachine, "Server", "http://127.0.0.1:8080");
+    rig.btnO[kBtnHelp].UserClick();
+    const std::string owner = std::to_string(rig.frm.handle);
+    const std::string open = "Execute " + owner + " open ";
+    EXPECT_EQ(rig.events, (std::vector<std::string>{open + "http://www.vantorel.com/vt/help.php [][] 1",
+                                                    open + "http://127.0.0.1:8080/vt/help.php [][] 1"}));
+}
+
+TEST(FrmMain, ExitRemovesTheIconAndStopsBothTimersBeforeTheProgramEndsOnce) {
+    MainRig rig;
+    rig.Put(kHkeyCurrentUser, "State", "1");
+    rig.Start();
+    rig.desktop.onEnd = [&] {
+        rig.events.push_back(rig.tmr.enabled || rig.timer.enabled ? "timers on" : "timers off");
     };
     rig.events.clear();
     rig.btnO[kBtnExit].UserClick();
-    EXPECT_EQ(rig.application.ends, 1);
-    EXPECT_TRUE(timersStoppedAtEnd);
-    EXPECT_EQ(deletesAtEnd, 1u);
-    EXPECT_EQ(rig.tray.calls.back().message, platform::kNimDelete);
-    EXPECT_EQ(rig.events, std::vector<std::string>{"End"});
-
-    // The window's own destruction, which the end brings, unloads nothing a second time.
-    rig.form.QueryUnload();
+    rig.form.QueryUnload();  // the window's destruction, which the end brings, unloads nothing again
     rig.form.Unload();
-    EXPECT_EQ(rig.application.ends, 1);
-    EXPECT_EQ(rig.TrayCalls(platform::kNimDelete), 1u);
-    // "State" keeps its last value for the next start.
-    RegistryRoutines reg(rig.registry);
-    reg.hkey(platform::kHkeyCurrentUser);
-    reg.KeyRoot(kSettingsKey);
-    EXPECT_EQ(VariantText(reg.GetRegistryValue("State", std::string("?"))), "1");
+    EXPECT_EQ(rig.events, (std::vector<std::string>{"Tray 2", "End", "timers off"}));
+    EXPECT_EQ(rig.Get(kHkeyCurrentUser, "State"), "1") << "the next start comes up the same";
 }
 
-TEST(FrmMainUnload, TheCloseButtonUnloadsTheSameWay) {
+TEST(FrmMain, MinimisingAddsTheIconWithTheProgramsNameAndEndsHidden) {
     MainRig rig;
     rig.Start();
-    rig.form.QueryUnload();
-    EXPECT_EQ(rig.application.ends, 1);
-    EXPECT_FALSE(rig.tmr.enabled);
-    EXPECT_FALSE(rig.timer.enabled);
-    EXPECT_EQ(rig.TrayCalls(platform::kNimDelete), 1u);
-}
-
-TEST(FrmMainResize, MinimisingGoesToTheTrayAndEveryResizeDropsTheSizeCommand) {
-    MainRig rig;
-    rig.Start();
-    const std::size_t adds = rig.TrayCalls(platform::kNimAdd);
-    const std::size_t positions = rig.windows.calls.size();
-
-    rig.form.Resize();  // the first showing: normal state
-    EXPECT_EQ(rig.TrayCalls(platform::kNimAdd), adds);
-    EXPECT_TRUE(rig.frm.visible);
-    ASSERT_EQ(rig.windows.deletedCommands.size(), 1u);
-    EXPECT_EQ(rig.windows.deletedCommands[0], std::make_pair(rig.frm.handle, std::uint32_t{0xF000}));
-
     rig.frm.state = platform::WindowState::Minimized;
     rig.form.Resize();
-    ASSERT_EQ(rig.TrayCalls(platform::kNimAdd), adds + 1);
     const auto& add = rig.tray.calls.back();
-    ASSERT_EQ(add.message, platform::kNimAdd);
-    EXPECT_EQ(add.data.tip, "Vantorel");
-    EXPECT_EQ(add.data.icon, rig.frm.icon);
-    EXPECT_EQ(add.data.callbackMessage, 512u);
-    EXPECT_FALSE(rig.frm.visible) << "minimising ends hidden";
-    // BringToFront: topmost, then not topmost, never activating.
-    ASSERT_EQ(rig.windows.calls.size(), positions + 2);
-    EXPECT_EQ(rig.windows.calls[positions].insertAfter, platform::kHwndTopmost);
-    EXPECT_EQ(rig.windows.calls[positions + 1].insertAfter, platform::kHwndNoTopmost);
-    EXPECT_EQ(rig.windows.calls[positions + 1].flags, 0x53u);
-    EXPECT_EQ(rig.windows.deletedCommands.size(), 2u);
-
-    // A click on the icon brings it back in the normal state.
-    rig.form.MouseMove(514);  // left button up
-    EXPECT_TRUE(rig.frm.visible);
-    EXPECT_EQ(rig.frm.state, platform::WindowState::Normal);
+    EXPECT_EQ(std::make_tuple(add.message, add.data.tip, add.data.icon),
+              std::make_tuple(platform::kNimAdd, std::string("Vantorel"), rig.frm.icon));
+    EXPECT_FALSE(rig.frm.visible);
 }
 
-TEST(StatusDisplay, BlinksBrightFirstHoldsThePadlockWhileOnAndResumesFromThePhase) {
+TEST(StatusDisplay, TheLightBlinksFromBrightHoldsThePadlockWhileOnAndTheTipFollowsTheCount) {
     MainRig rig;
     rig.Start();
-    ASSERT_FALSE(rig.tmr.enabled);
-    EXPECT_EQ(rig.form.LightPhase(), 0);
-    for (int i = 0; i < 5; ++i) rig.form.TimerTick();
-    EXPECT_EQ(rig.frm.icons, (std::vector<platform::IconHandle>{kBright, kDark, kBright, kDark, kBright}));
-    EXPECT_EQ(rig.form.LightPhase(), 1);
-
-    rig.ClickSwitch();  // on, after a bright phase
-    rig.frm.icons.clear();
-    for (int i = 0; i < 3; ++i) rig.form.TimerTick();
-    EXPECT_EQ(rig.frm.icons, (std::vector<platform::IconHandle>{kPadlock, kPadlock, kPadlock}));
-    EXPECT_EQ(rig.form.LightPhase(), 1);
-
+    EXPECT_EQ(rig.Ticks(5), (Icons{kBright, kDark, kBright, kDark, kBright}));
+    rig.ClickSwitch();
+    EXPECT_EQ(rig.Switch(), "ON 65280 65280 sweeping");
+    EXPECT_EQ(rig.Ticks(2), (Icons{kPadlock, kPadlock}));
     rig.ClickSwitch();  // off again: the stored bright phase is followed by dark
-    rig.frm.icons.clear();
-    for (int i = 0; i < 3; ++i) rig.form.TimerTick();
-    EXPECT_EQ(rig.frm.icons, (std::vector<platform::IconHandle>{kDark, kBright, kDark}));
+    EXPECT_EQ(rig.Switch(), "OFF 192 192 idle");
+    EXPECT_EQ(rig.Ticks(2), (Icons{kDark, kBright}));
+    const auto& modify = rig.tray.calls.back();
+    EXPECT_EQ(std::make_tuple(modify.message, modify.data.icon, modify.data.tip),
+              std::make_tuple(platform::kNimModify, kBright, std::string("Vantorel -  0 attempts intercepted")));
 
-    // Every tick refreshes the tray: modify, with the window's icon now and the count with a blank.
-    const auto& last = rig.tray.calls.back();
-    EXPECT_EQ(last.message, platform::kNimModify);
-    EXPECT_EQ(last.data.icon, kDark);
-    EXPECT_EQ(last.data.tip, "Vantorel -  0 attempts intercepted");
-    EXPECT_EQ(last.data.callbackMessage, 512u);
-}
-
-TEST(StatusDisplay, GuardOnFromStartShowsThePadlockAndTheTipGetsItsBlankBackAfterATeardown) {
-    MainRig rig;
-    rig.Put(platform::kHkeyCurrentUser, "State", "1");
-    rig.Put(platform::kHkeyCurrentUser, "Attempts", "41");
-    rig.Start();
-    rig.form.TimerTick();
-    EXPECT_EQ(rig.frm.icons, std::vector<platform::IconHandle>{kPadlock});
-    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel -  41 attempts intercepted");
-
-    rig.table.rows = {Row(5, Ipv4(1, 2, 3, 4))};  // an established connection to a listed address
+    // A teardown writes the count without the blank; the next tick puts it back; negatives have none.
+    rig.ClickSwitch();
+    rig.table.rows = {Row(platform::kTcpStateEstablished, Ipv4(1, 2, 3, 4))};
     rig.form.TmrTick();
-    ASSERT_EQ(rig.form.guard().AttemptCount(), 42);
-    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel - 42 attempts intercepted");
+    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel - 1 attempts intercepted");
     rig.form.TimerTick();
-    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel -  42 attempts intercepted");
-    EXPECT_EQ(rig.frm.icons, (std::vector<platform::IconHandle>{kPadlock, kPadlock}));
-
+    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel -  1 attempts intercepted");
     MainRig negative;  // past the wrap: no blank before a negative count
-    negative.Put(platform::kHkeyCurrentUser, "Attempts", "-5");
+    negative.Put(kHkeyCurrentUser, "Attempts", "-5");
     negative.Start();
     negative.form.TimerTick();
     EXPECT_EQ(negative.tray.calls.back().data.tip, "Vantorel - -5 attempts intercepted");
 }
 
-TEST(MissingDefinitions, MessageThenUpdatesThenASecondMessageAndTheProgramCarriesOn) {
+TEST(Guard, SweepsNeverNestAndSwitchingOffLetsTheRunUnderWayFinish) {
     MainRig rig;
-    rig.files.Remove(kDefinitionsPath);
-    rig.Put(platform::kHkeyLocalMachine, "Server", "https://updates.example.org");
+    rig.Put(kHkeyCurrentUser, "State", "1");
     rig.Start();
-
-    EXPECT_EQ(rig.events, (std::vector<std::string>{"MessageBox Definitions Error", "Options 1",
-                                                    "MessageBox Definitions Error"}));
-    ASSERT_EQ(rig.shell.boxes.size(), 2u);
-    EXPECT_EQ(rig.shell.boxes[0].text,
-              "Reading definitions, installation corrupted re-install at https://updates.example.org/");
-    EXPECT_EQ(rig.shell.boxes[0].style, 0x10u);
-    EXPECT_EQ(rig.shell.boxes[0].owner, rig.frm.handle);
-    EXPECT_EQ(rig.shell.boxes[1].text, kNoDefinitionsText);
-    // Both before the tray icon exists; start-up then runs to its end with an empty list.
-    EXPECT_EQ(rig.TrayCalls(platform::kNimAdd), 1u);
-    EXPECT_EQ(rig.application.ends, 0);
-    EXPECT_EQ(Definitions.size(), 0u);
-    EXPECT_EQ(rig.frm.caption, "Vantorel -  0 attempts intercepted");
-    EXPECT_TRUE(rig.timer.enabled);
+    Guard& guard = rig.form.guard();
+    rig.table.rows = {Row(platform::kTcpStateEstablished, Ipv4(5, 5, 5, 5)),
+                      Row(platform::kTcpStateEstablished, Ipv4(1, 2, 3, 4))};
+    bool clicked = false;
+    rig.pump.onPump = [&] {  // a tick the yield takes itself, and a click on the switch, while the sweep yields
+        rig.pump.OwnTick([&] { guard.TmrTick(); });
+        if (!clicked) rig.ClickSwitch();
+        clicked = true;
+    };
+    guard.TmrTick();
+    EXPECT_EQ(guard.SweepsRun(), 1u);
+    EXPECT_EQ(rig.table.entries.size(), 1u);
+    EXPECT_EQ(guard.AttemptCount(), 1);
+    EXPECT_FALSE(rig.tmr.enabled);
+    EXPECT_FALSE(guard.Sweeping());
 }
 
-TEST(MissingDefinitions, AFileThatCannotBeReadIsReportedLikeAMissingOne) {
+TEST(StartUp, ADefinitionsFileThatCannotBeReadIsReportedLikeAMissingOne) {
     MainRig rig;
-    rig.files.MakeUnreadable(kDefinitionsPath);
+    rig.files.unreadable.insert(kDefinitionsPath);
     rig.Start();
-    EXPECT_EQ(rig.events, (std::vector<std::string>{"MessageBox Definitions Error", "Options 1",
-                                                    "MessageBox Definitions Error"}));
-    ASSERT_EQ(rig.shell.boxes.size(), 2u);
-    EXPECT_EQ(rig.shell.boxes[0].text, std::string("Reading definitions, installation corrupted re-install at "
-                                                   "http://www.vantorel.com/\n\n") + kUnreadableDefinitionsText);
-    EXPECT_EQ(rig.shell.boxes[1].text, kStillUnreadableText);
+    ASSERT_EQ(rig.desktop.texts.size(), 2u);
+    EXPECT_EQ(rig.desktop.texts[0], std::string("Reading definitions, installation corrupted re-install at "
+                                                "http://www.vantorel.com/\n\n") + kUnreadableDefinitionsText);
+    EXPECT_EQ(rig.desktop.texts[1], kStillUnreadableText);
     EXPECT_EQ(Definitions.size(), 0u);
-    EXPECT_TRUE(rig.timer.enabled);
 }
 
-TEST(MissingDefinitions, AFileInstalledByTheUpdatesWindowIsReadWithoutASecondMessage) {
-    MainRig rig;
-    rig.files.Remove(kDefinitionsPath);
-    rig.application.onOptions = [&] { rig.files.Put(kDefinitionsPath, "67305985\n"); };
-    rig.Start();
-    EXPECT_EQ(rig.events, (std::vector<std::string>{"MessageBox Definitions Error", "Options 1"}));
-    EXPECT_EQ(rig.shell.boxes.size(), 1u);
-    EXPECT_GE(FindDefinition(Definitions, "67305985"), 0);
+TEST(TrayIcon, RecordsCarryIdFlagsMessageIconAndTip) {
+    FakeNotifyArea tray;
+    FakeWindow window;
+    AddTrayIcon(tray, window, 0x99, "Vantorel -  0 attempts intercepted", 512);
+    window.icon = 0x55;  // the status light changed the window's icon
+    ModifyTrayIcon(tray, window, "Vantorel - 1 attempts intercepted", 512);
+    RemoveTrayIcon(tray, window);
+    auto record = [&](int i) {
+        const auto& d = tray.calls[i].data;
+        return std::make_tuple(tray.calls[i].message, d.window, d.id, d.flags, d.callbackMessage, d.icon, d.tip);
+    };
+    ASSERT_EQ(tray.calls.size(), 3u);
+    EXPECT_EQ(record(0), std::make_tuple(platform::kNimAdd, window.handle, 1u, 7u, 512u, platform::IconHandle{0x99},
+                                         std::string("Vantorel -  0 attempts intercepted")));
+    EXPECT_EQ(record(1), std::make_tuple(platform::kNimModify, window.handle, 1u, 7u, 512u, platform::IconHandle{0x55},
+                                         std::string("Vantorel - 1 attempts intercepted")));
+    EXPECT_EQ(record(2), std::make_tuple(platform::kNimDelete, window.handle, 1u, 7u, 1u, platform::IconHandle{1},
+                                         std::string()));
 }
 
 }  // namespace

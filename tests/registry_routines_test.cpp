@@ -4,6 +4,8 @@
 
 #include <gtest/gtest.h>
 
+#include <tuple>
+
 #include "fakes/fake_registry.h"
 
 namespace vantorel {
@@ -19,25 +21,16 @@ RegistryRoutines Vantorel(FakeRegistry& registry) {
     return reg;
 }
 
-TEST(RegistryRoutines, FieldsStartEmptyAndOnlyStore) {
+TEST(RegistryRoutines, FieldsStartEmptyAndTrimNullCutsAtTheFirstNul) {
     FakeRegistry registry;
     RegistryRoutines reg(registry);
-    EXPECT_EQ(reg.hkey(), 0);
-    EXPECT_EQ(reg.KeyRoot(), "");
-    EXPECT_EQ(reg.Subkey(), "");
-    EXPECT_FALSE(reg.KeyExists()) << "root 0 is no key";
-    reg.Subkey("Sub");
-    EXPECT_EQ(reg.Subkey(), "Sub");
-}
-
-TEST(RegistryRoutines, TrimNullCutsAtTheFirstNul) {
-    std::string item("abc\0def", 7);
-    EXPECT_EQ(RegistryRoutines::TrimNull(item), "abc");
-    EXPECT_EQ(item, "abc");
-    std::string plain = "abc";
-    EXPECT_EQ(RegistryRoutines::TrimNull(plain), "abc");
-    std::string leading("\0x", 2);
-    EXPECT_EQ(RegistryRoutines::TrimNull(leading), "");
+    EXPECT_EQ(std::make_tuple(reg.hkey(), reg.KeyRoot(), reg.Subkey(), reg.KeyExists()),
+              std::make_tuple(0, std::string(), std::string(), false)) << "root 0 is no key";
+    for (auto [item, trimmed] : {std::pair{std::string("abc\0def", 7), "abc"}, std::pair{std::string("abc"), "abc"},
+                                 std::pair{std::string("\0x", 2), ""}}) {
+        EXPECT_EQ(RegistryRoutines::TrimNull(item), trimmed);
+        EXPECT_EQ(item, trimmed);
+    }
 }
 
 TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
@@ -75,34 +68,28 @@ TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
     EXPECT_EQ(registry.OpenHandles(), 0u);
 }
 
-TEST(RegistryRoutines, EveryOperationClosesWhatItOpened) {
+TEST(RegistryRoutines, EveryOperationDoesItsWorkAndClosesWhatItOpened) {
     FakeRegistry registry;
     RegistryRoutines reg = Vantorel(registry);
-    ASSERT_EQ(reg.CreateKey(), "0");
-    reg.KeyExists();
-    reg.SetRegistryValue("State", std::string("1"), 1);
-    reg.SetRegistryValue("State", std::string("x"), 4);
-    reg.GetRegistryValue("State");
-    reg.GetRegistryValue("Missing");
-    reg.EnumRegistryKeys(kHkeyCurrentUser, "SOFTWARE");
-    reg.EnumRegistryKeys(kHkeyCurrentUser, "");
-    reg.EnumRegistryValues(kHkeyCurrentUser, "SOFTWARE\\Vantorel");
-    reg.ReadRemoteRegistryValue("", kHkeyCurrentUser, "State");
-    reg.WriteRemoteRegistryValue("", kHkeyCurrentUser, "State", std::string("0"), 1);
-    reg.ReadRemoteRegistryValue("\\\\far", kHkeyCurrentUser, "State");
-    reg.DeleteValue("State");
-    reg.DeleteValue("State");
+    EXPECT_EQ(reg.CreateKey(), "0");
+    EXPECT_TRUE(reg.KeyExists());
+    EXPECT_TRUE(reg.SetRegistryValue("State", std::string("1"), 1));
+    EXPECT_FALSE(reg.SetRegistryValue("State", std::string("x"), 4));
+    EXPECT_EQ(reg.GetRegistryValue("State"), Variant(std::string("1")));
+    EXPECT_TRUE(IsEmpty(reg.GetRegistryValue("Missing")));
+    EXPECT_EQ(reg.EnumRegistryKeys(kHkeyCurrentUser, "SOFTWARE").size(), 1u);
+    EXPECT_EQ(reg.EnumRegistryValues(kHkeyCurrentUser, "SOFTWARE\\Vantorel").size(), 1u);
+    EXPECT_TRUE(reg.WriteRemoteRegistryValue("", kHkeyCurrentUser, "State", std::string("0"), 1));
+    EXPECT_EQ(reg.ReadRemoteRegistryValue("", kHkeyCurrentUser, "State"), Variant(std::string("0")));
+    EXPECT_EQ(reg.ReadRemoteRegistryValue("\\\\far", kHkeyCurrentUser, "State"), Variant(std::string("Error!")));
+    EXPECT_EQ(reg.DeleteValue("State"), 0);
+    EXPECT_EQ(reg.DeleteValue("State"), platform::kErrorFileNotFound);
     EXPECT_EQ(registry.OpenHandles(), 0u);
-}
-
-TEST(RegistryRoutines, EnumeratingTheRootItselfLeavesItOpen) {
-    FakeRegistry registry;
-    RegistryRoutines reg = Vantorel(registry);
-    ASSERT_EQ(reg.CreateKey(), "0");
+    // Enumerating the predefined root itself leaves it open for the next call.
     auto keys = reg.EnumRegistryKeys(kHkeyCurrentUser, "");
-    ASSERT_EQ(keys.size(), 1u);
-    EXPECT_EQ(keys[0], "SOFTWARE");
-    EXPECT_TRUE(reg.KeyExists()) << "the predefined root was not closed";
+    EXPECT_EQ(std::make_pair(keys.size(), keys[0]), std::make_pair(std::size_t{1}, std::string("SOFTWARE")));
+    EXPECT_TRUE(reg.KeyExists());
+    EXPECT_EQ(registry.OpenHandles(), 0u);
 }
 
 }  // namespace

@@ -1,5 +1,6 @@
-// The push button's properties, property store and input state machine, on the raster canvas with
-// a scripted host.
+// The push button's properties, property store and the input cases real window messages under Wine
+// (tests/win32/xpbutton_win32_test.cpp) do not reach: handlers that change their arguments, drags,
+// key sequences, hidden and batched painting, ambient changes and the end of the control.
 #include <gtest/gtest.h>
 
 #include <string>
@@ -15,80 +16,55 @@ namespace {
 using testing::FakeButtonHost;
 using testing::MemoryPicture;
 using testing::RasterCanvas;
+using Log = std::vector<std::string>;
 
 struct Fixture {
     FakeButtonHost host;
     RasterCanvas canvas;
     KirelXPButton button{host, canvas};
-    std::vector<std::string> log;
+    Log log;
 
-    // A new control, shown and sized, recording every event.
+    // A new control, shown and sized, noting its clicks and hover events.
     Fixture() {
         button.InitNewControl();
         button.OnShow();
         button.OnResize();
-        auto mouse = [this](const char* name) {
-            return [this, name](std::int16_t& b, std::int16_t& s, float& x, float& y) {
-                log.push_back(std::string(name) + " " + std::to_string(b) + " " + std::to_string(s) + " " +
-                              std::to_string(static_cast<int>(x)) + " " + std::to_string(static_cast<int>(y)));
-            };
-        };
-        button.events.MouseDown = mouse("MouseDown");
-        button.events.MouseMove = mouse("MouseMove");
-        button.events.MouseUp = mouse("MouseUp");
         button.events.Click = [this] { log.push_back("Click"); };
         button.events.MouseOver = [this] { log.push_back("MouseOver"); };
         button.events.MOUSEOUT = [this] { log.push_back("MOUSEOUT"); };
-        button.events.KeyDown = [this](std::int16_t& k, std::int16_t&) { log.push_back("KeyDown " + std::to_string(k)); };
-        button.events.KeyUp = [this](std::int16_t& k, std::int16_t&) { log.push_back("KeyUp " + std::to_string(k)); };
-        button.events.KeyPress = [this](std::int16_t& k) { log.push_back("KeyPress " + std::to_string(k)); };
-        canvas.clears = 0;
         host.notified.clear();
     }
+    // Whether the control painted since Mark().
+    void Mark() { canvas.FillBox(0, 0, canvas.width(), canvas.height(), 0x0A0B0C); }
+    bool Painted() const { return canvas.At(5, 5) != 0x0A0B0C; }
+    int Clicks() const { return static_cast<int>(std::count(log.begin(), log.end(), "Click")); }
 };
 
-TEST(XPButtonProperties, NewControlDefaults) {
+TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     FakeButtonHost host;
+    host.systemColours[platform::kColorBtnText] = 0x123456;
     RasterCanvas canvas;
-    KirelXPButton b(host, canvas);
-    b.InitNewControl();
-    EXPECT_EQ(b.ButtonType(), 3);
-    EXPECT_EQ(b.Caption(), "KirelXPButton1");
-    EXPECT_EQ(b.FontName(), "Verdana");
-    EXPECT_EQ(host.windowFont.name, "Verdana");
-    EXPECT_EQ(b.BackColor(), 0xFFFFFFu);
-    EXPECT_EQ(b.BackOver(), 0xFFFFFFu);
-    EXPECT_EQ(b.ForeColor(), host.SystemColour(platform::kColorBtnText));
-    EXPECT_EQ(b.ForeOver(), 0xFF0000u);
-    EXPECT_EQ(b.MaskColor(), 0xC0C0C0u);
-    EXPECT_EQ(b.ColorScheme(), 1);
-    EXPECT_TRUE(b.Enabled());
-    EXPECT_TRUE(b.ShowFocusRect());
-    EXPECT_TRUE(b.UseMaskColor());
-    EXPECT_FALSE(b.SoftBevel());
-    EXPECT_EQ(b.Version(), "2.0.6");
-    // No setter ran: nothing notified, nothing painted.
-    EXPECT_TRUE(host.notified.empty());
-    EXPECT_EQ(canvas.clears, 0);
+    KirelXPButton fresh(host, canvas);
+    fresh.InitNewControl();
+    EXPECT_EQ(fresh.Caption() + " " + fresh.FontName() + " " + host.windowFont.name + " " + fresh.Version(),
+              "KirelXPButton1 Verdana Verdana 2.0.6");
+    EXPECT_EQ((std::vector<Rgb>{fresh.BackColor(), fresh.BackOver(), fresh.ForeColor(), fresh.ForeOver(),
+                                fresh.MaskColor()}),
+              (std::vector<Rgb>{0xFFFFFF, 0xFFFFFF, 0x123456, 0xFF0000, 0xC0C0C0}));
+    EXPECT_EQ(std::make_tuple(fresh.ButtonType(), fresh.ColorScheme(), fresh.Enabled(), fresh.ShowFocusRect(),
+                              fresh.UseMaskColor(), fresh.SoftBevel()),
+              std::make_tuple(3, 1, true, true, true, false));
+    EXPECT_TRUE(host.notified.empty()) << "no setter ran";
 
-    // The new-control foreground follows the system's button text.
-    FakeButtonHost other;
-    other.systemColours[platform::kColorBtnText] = 0x123456;
-    KirelXPButton c(other, canvas);
-    c.InitNewControl();
-    EXPECT_EQ(c.ForeColor(), 0x123456u);
-}
-
-TEST(XPButtonProperties, StoreRoundTripKeepsEveryValue) {
     Fixture f;
     KirelXPButton& b = f.button;
     auto picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4, 0x102030));
     auto over = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1, 0x0000FF));
     auto cursor = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1, 0));
+    const FontDesc font{"Tahoma", 11.5, true, true, false, true};
     b.SetButtonType(9);
     b.SetCaption("&Go now");
     b.SetEnabled(false);
-    FontDesc font{"Tahoma", 11.5, true, true, false, true};
     b.SetFont(font);
     b.SetColorScheme(2);
     b.SetShowFocusRect(false);
@@ -109,320 +85,182 @@ TEST(XPButtonProperties, StoreRoundTripKeepsEveryValue) {
     b.SetCheckBoxBehaviour(true);
     b.SetValue(true);
     b.SetImageIndex(7);
-
     PropertyBag bag;
     b.WriteProperties(bag);
-    const std::vector<std::string> order = {"BTYPE", "TX", "ENAB", "FONT", "COLTYPE", "FOCUSR", "BCOL", "BCOLO",
-                                            "FCOL", "FCOLO", "MCOL", "MPTR", "MICON", "PICN", "PICH", "UMCOL",
-                                            "SOFT", "PICPOS", "NGREY", "FX", "HAND", "CHECK", "VALUE", "ImageIndex"};
-    EXPECT_EQ(bag.Keys(), order);
-    ASSERT_TRUE(std::holds_alternative<std::int16_t>(*bag.Find("MPTR")));
-    ASSERT_TRUE(std::holds_alternative<std::int16_t>(*bag.Find("ImageIndex")));
+    EXPECT_EQ(bag.Keys(), (std::vector<std::string>{"BTYPE", "TX", "ENAB", "FONT", "COLTYPE", "FOCUSR", "BCOL",
+                                                    "BCOLO", "FCOL", "FCOLO", "MCOL", "MPTR", "MICON", "PICN", "PICH",
+                                                    "UMCOL", "SOFT", "PICPOS", "NGREY", "FX", "HAND", "CHECK", "VALUE",
+                                                    "ImageIndex"}));
+    EXPECT_TRUE(std::holds_alternative<std::int16_t>(*bag.Find("MPTR")));
     EXPECT_TRUE(bag.ReadBool("HAND", false));
 
     FakeButtonHost host2;
     RasterCanvas canvas2;
     KirelXPButton c(host2, canvas2);
     c.ReadProperties(bag);
-    EXPECT_EQ(c.ButtonType(), 9);
-    EXPECT_EQ(c.Caption(), "&Go now");
-    EXPECT_EQ(c.accessKey(), 'g');
-    EXPECT_FALSE(c.Enabled());
-    EXPECT_FALSE(host2.windowEnabled);
-    EXPECT_EQ(c.Font(), font);
-    EXPECT_EQ(host2.windowFont, font);
-    EXPECT_EQ(c.ColorScheme(), 2);
-    EXPECT_FALSE(c.ShowFocusRect());
-    EXPECT_EQ(c.BackColor(), 0x00FF00u);
-    EXPECT_EQ(c.BackOver(), 0x0000FFu);
-    EXPECT_EQ(c.ForeColor(), 0x111111u);
-    EXPECT_EQ(c.ForeOver(), 0x222222u);
-    EXPECT_EQ(c.MaskColor(), 0xFF00FFu);
-    EXPECT_EQ(c.MousePointer(), 11);
-    EXPECT_EQ(host2.pointer, 11);
-    EXPECT_EQ(c.MouseIcon(), cursor);
-    EXPECT_EQ(host2.mouseIcon, cursor);
-    EXPECT_EQ(c.PictureNormal(), picture);
-    EXPECT_EQ(c.PictureOver(), over);
-    EXPECT_EQ(c.pictureRect().width, 2);
-    EXPECT_FALSE(c.UseMaskColor());
-    EXPECT_TRUE(c.SoftBevel());
-    EXPECT_EQ(c.PicturePosition(), 3);
-    EXPECT_TRUE(c.UseGreyscale());
-    EXPECT_EQ(c.SpecialEffect(), 2);
-    EXPECT_TRUE(c.CheckBoxBehaviour());
-    EXPECT_TRUE(c.Value());
-    EXPECT_EQ(c.ImageIndex(), 7);
-    // Reading runs no setter.
-    EXPECT_TRUE(host2.notified.empty());
-    EXPECT_EQ(canvas2.clears, 0);
-
-    // A control that was read writes HAND false; ImageIndex 0 is not written.
-    c.SetImageIndex(0);
-    PropertyBag again;
+    PropertyBag again;  // what was read writes back the same, but for HAND (false once read)
     c.WriteProperties(again);
+    EXPECT_EQ(again.Keys(), bag.Keys());
+    for (const std::string& key : bag.Keys()) {
+        if (key != "HAND") {
+            EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
+        }
+    }
     EXPECT_FALSE(again.ReadBool("HAND", true));
-    EXPECT_FALSE(again.Contains("ImageIndex"));
+    EXPECT_EQ(std::make_tuple(c.accessKey(), host2.windowEnabled, host2.windowFont, host2.pointer, host2.mouseIcon,
+                              c.pictureRect().width),
+              std::make_tuple('g', false, font, 11, platform::PicturePtr(cursor), 2))
+        << "the window follows what was read";
+    EXPECT_TRUE(host2.notified.empty()) << "reading runs no setter";
+    c.SetImageIndex(0);
+    PropertyBag zero;
+    c.WriteProperties(zero);
+    EXPECT_FALSE(zero.Contains("ImageIndex")) << "ImageIndex 0 is not written";
 }
 
-TEST(XPButtonProperties, ReadDefaultsFromAnEmptyStore) {
+TEST(XPButtonProperties, ReadDefaultsFromAStore) {
     FakeButtonHost host;
     RasterCanvas canvas;
     KirelXPButton b(host, canvas);
-    FontDesc windowFont{"Arial", 9, false, false, false, false};
-    host.windowFont = windowFont;
     b.ReadProperties(PropertyBag{});
-    EXPECT_EQ(b.ButtonType(), 2);  // a fresh control gets 3, a read one 2
-    EXPECT_EQ(b.Caption(), "");
-    EXPECT_TRUE(b.Enabled());
-    EXPECT_EQ(b.ColorScheme(), 1);
-    EXPECT_EQ(b.MaskColor(), 0xC0C0C0u);
+    EXPECT_EQ(std::make_tuple(b.ButtonType(), b.Caption(), b.Enabled(), b.ColorScheme(), b.MaskColor(), b.ImageIndex()),
+              std::make_tuple(2, std::string(), true, 1, 0xC0C0C0u, 0)) << "a fresh control gets type 3, a read one 2";
     EXPECT_EQ(b.PictureNormal(), nullptr);
-    EXPECT_EQ(b.ImageIndex(), 0);
-    // Button face and button text system colours, and the over colours follow them.
-    EXPECT_EQ(b.BackColor(), 0x80000000u | platform::kColorBtnFace);
-    EXPECT_EQ(b.BackOver(), b.BackColor());
-    EXPECT_EQ(b.ForeColor(), 0x80000000u | platform::kColorBtnText);
-    EXPECT_EQ(b.ForeOver(), b.ForeColor());
-
-    // A store with BCOL and FCOL but no over colours takes them as read.
-    PropertyBag bag;
+    EXPECT_EQ((std::vector<Rgb>{b.BackColor(), b.BackOver(), b.ForeColor(), b.ForeOver()}),
+              (std::vector<Rgb>{0x80000000u | platform::kColorBtnFace, 0x80000000u | platform::kColorBtnFace,
+                                0x80000000u | platform::kColorBtnText, 0x80000000u | platform::kColorBtnText}));
+    PropertyBag bag;  // BCOL and FCOL without over colours: the over colours follow them
     bag.Write("BCOL", std::int32_t{0x0000FF});
     bag.Write("FCOL", std::int32_t{0x00FF00});
     KirelXPButton c(host, canvas);
     c.ReadProperties(bag);
-    EXPECT_EQ(c.BackOver(), 0x0000FFu);
-    EXPECT_EQ(c.ForeOver(), 0x00FF00u);
+    EXPECT_EQ(std::make_pair(c.BackOver(), c.ForeOver()), std::make_pair(0x0000FFu, 0x00FF00u));
 }
 
 TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
     Fixture f;
     KirelXPButton& b = f.button;
-    // Design mode: BackColor drags BackOver along; at run time it does not.
-    f.host.designMode = true;
+    f.host.designMode = true;  // in design mode BackColor drags BackOver along; at run time not
     b.SetBackColor(0x0000FF);
-    EXPECT_EQ(b.BackOver(), 0x0000FFu);
     f.host.designMode = false;
     b.SetBackColor(0x00FF00);
     EXPECT_EQ(b.BackOver(), 0x0000FFu);
-    EXPECT_EQ(f.host.notified, (std::vector<std::string>{"BCOL", "BCOL"}));
-
-    // Value without CheckBoxBehaviour: stored and notified, not painted.
-    f.canvas.clears = 0;
-    f.host.notified.clear();
-    b.SetValue(true);
-    EXPECT_EQ(f.canvas.clears, 0);
-    EXPECT_EQ(f.host.notified, std::vector<std::string>{"VALUE"});
-
-    // PictureOver away from the pointer: no paint, notified as PICO.
+    b.SetValue(true);  // without CheckBoxBehaviour: stored and notified, not painted
     auto pic = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 1, 1, std::vector<Rgb>{0});
-    f.host.notified.clear();
-    b.SetPictureOver(pic);
-    EXPECT_EQ(f.canvas.clears, 0);
-    EXPECT_EQ(f.host.notified, std::vector<std::string>{"PICO"});
-
-    // A refused pointer picture keeps the old one and raises nothing.
+    f.Mark();
+    b.SetPictureOver(pic);  // away from the pointer: no paint
+    EXPECT_FALSE(f.Painted());
+    EXPECT_EQ(f.host.notified, (Log{"BCOL", "BCOL", "VALUE", "PICO"}));
     f.host.refuseMouseIcon = true;
     b.SetMouseIcon(pic);
-    EXPECT_EQ(b.MouseIcon(), nullptr);
+    EXPECT_EQ(b.MouseIcon(), nullptr) << "a refused pointer picture keeps the old one";
 
-    // Font pieces change the window font and repaint, without notification.
+    // Font pieces change the window font and repaint, without notification; sizes round halves to even.
     f.host.notified.clear();
     b.SetFontBold(true);
     b.SetFontSize(12);
-    EXPECT_TRUE(f.host.windowFont.bold);
-    EXPECT_EQ(f.host.windowFont.size, 12.0);
-    EXPECT_TRUE(f.host.notified.empty());
-    EXPECT_GE(f.canvas.clears, 2);
-    FontDesc half = b.Font();
-    half.size = 10.5;
-    b.SetFont(half);
-    EXPECT_EQ(b.FontSize(), 10);  // halves to even
-    half.size = 11.5;
-    b.SetFont(half);
-    EXPECT_EQ(b.FontSize(), 12);
-
-    // ButtonType 5 in design mode makes the font bold; the type change reshapes and repaints.
-    b.SetFontBold(false);
+    EXPECT_EQ(std::make_tuple(f.host.windowFont.bold, f.host.windowFont.size, f.host.notified.empty()),
+              std::make_tuple(true, 12.0, true));
+    EXPECT_TRUE(f.Painted());
+    for (auto [size, rounded] : {std::pair{10.5, 10}, std::pair{11.5, 12}}) {
+        FontDesc font = b.Font();
+        font.size = size;
+        b.SetFont(font);
+        EXPECT_EQ(b.FontSize(), rounded);
+    }
+    b.SetFontBold(false);  // ButtonType 5 in design mode makes the font bold
     f.host.designMode = true;
-    int shapes = f.host.shapesSet;
     b.SetButtonType(5);
     EXPECT_TRUE(b.FontBold());
-    EXPECT_EQ(f.host.shapesSet, shapes + 1);
     EXPECT_EQ(f.host.notified.back(), "BTYPE");
-
-    // Enabled follows through to the window.
-    b.SetEnabled(false);
-    EXPECT_FALSE(f.host.windowEnabled);
 }
 
-TEST(XPButtonInput, MouseSequences) {
+TEST(XPButtonInput, HandlersThatChangeTheirArgumentsAndKeySequences) {
     Fixture f;
-    // Right button: events only, no paint, no click.
-    f.button.OnMouseDown(2, 0, 5, 6);
-    f.button.OnMouseUp(2, 0, 5, 6);
-    f.button.OnClick();
-    EXPECT_EQ(f.log, (std::vector<std::string>{"MouseDown 2 0 5 6", "MouseUp 2 0 5 6"}));
-    EXPECT_EQ(f.canvas.clears, 0);
-
-    // Middle button: pressed then up, no click.
-    f.log.clear();
-    f.button.OnMouseDown(4, 0, 1, 1);
+    f.button.events.MouseDown = [](std::int16_t& b, std::int16_t&, float&, float&) { b = 2; };
+    f.button.OnMouseDown(1, 0, 0, 0);
+    EXPECT_EQ(f.button.lastState(), 0) << "a MouseDown handler that makes the button 2 stops the pressed paint";
+    f.button.events.MouseDown = nullptr;
+    f.button.OnMouseDown(4, 0, 1, 1);  // middle button: pressed, then up, no click
     EXPECT_EQ(f.button.lastState(), 2);
     f.button.OnMouseUp(4, 0, 1, 1);
-    EXPECT_EQ(f.button.lastState(), 0);
     f.button.OnClick();
-    EXPECT_EQ(f.canvas.clears, 2);
-    EXPECT_EQ(f.log.size(), 2u);
-
-    // Left click, then a double click: MouseDown, MouseUp, Click, MouseDown 1 0 0 0, MouseUp.
-    f.log.clear();
-    f.button.OnMouseDown(1, 0, 3, 4);
-    f.button.OnMouseUp(1, 0, 3, 4);
-    f.button.OnClick();
-    f.button.OnDoubleClick();
-    f.button.OnMouseUp(1, 0, 3, 4);
-    EXPECT_EQ(f.log, (std::vector<std::string>{"MouseDown 1 0 3 4", "MouseUp 1 0 3 4", "Click",
-                                               "MouseDown 1 0 0 0", "MouseUp 1 0 3 4"}));
-    EXPECT_EQ(f.host.captures, 1);
-    EXPECT_GE(f.host.presents, 1);
-
-    // A MouseDown handler that turns the button into 2 stops the pressed paint.
-    f.button.events.MouseDown = [](std::int16_t& b, std::int16_t&, float&, float&) { b = 2; };
-    f.canvas.clears = 0;
-    f.button.OnMouseDown(1, 0, 0, 0);
-    EXPECT_EQ(f.canvas.clears, 0);
     EXPECT_EQ(f.button.lastState(), 0);
+    EXPECT_EQ(f.Clicks(), 0);
+
+    f.button.OnKeyDown(32, 0);  // space, another key, space up: no click
+    f.button.OnKeyDown(65, 0);
+    f.button.OnKeyUp(32, 0);
+    EXPECT_EQ(f.Clicks(), 0);
+    f.button.events.KeyDown = [](std::int16_t& k, std::int16_t&) { k = 0; };  // stops the control's handling
+    f.button.OnKeyDown(39, 0);
+    f.button.OnKeyDown(32, 0);
+    f.button.OnKeyUp(32, 0);
+    EXPECT_TRUE(f.host.sentKeys.empty());
+    EXPECT_EQ(f.Clicks(), 0);
+
+    f.button.SetCheckBoxBehaviour(true);  // the click handler sees the new Value; a toggle is no store change
+    std::vector<bool> seen;
+    f.button.events.Click = [&] { seen.push_back(f.button.Value()); };
+    f.host.notified.clear();
+    f.button.OnAccessKey();
+    EXPECT_EQ(seen, std::vector<bool>{true});
+    EXPECT_TRUE(f.host.notified.empty());
+    f.button.Paint(0, true);
+    EXPECT_EQ(f.button.lastState(), 2) << "with Value true every paint shows pressed";
+    f.button.SetEnabled(false);  // a disabled control never clicks, whatever the platform reports
+    f.button.OnMouseDown(1, 0, 1, 1);
+    f.button.OnClick();
+    f.button.OnAccessKey();
+    EXPECT_EQ(seen.size(), 1u);
 }
 
-TEST(XPButtonInput, HoverAndDragging) {
+TEST(XPButtonInput, DraggingOutAndBackIn) {
     Fixture f;
     f.host.pointerOver = true;
     f.button.OnMouseMove(0, 0, 1, 1);
-    EXPECT_TRUE(f.button.hovering());
-    EXPECT_TRUE(f.host.timerRunning);
-    EXPECT_EQ(f.host.timerPeriod, 3);
     f.button.OnMouseMove(0, 0, 2, 2);  // already hovering: nothing more
-    EXPECT_EQ(std::count(f.log.begin(), f.log.end(), "MouseOver"), 1);
-    // Timer tick with the pointer still over: nothing.
-    f.button.OnOverTimer();
-    EXPECT_TRUE(f.button.hovering());
-    f.host.pointerOver = false;
-    f.button.OnOverTimer();
-    EXPECT_FALSE(f.button.hovering());
-    EXPECT_FALSE(f.host.timerRunning);
-    EXPECT_EQ(f.log.back(), "MOUSEOUT");
-
-    // Leaving with the left button held paints up; coming back still holding paints pressed and
-    // leaves the hover flag clear.
-    f.host.pointerOver = true;
+    EXPECT_EQ(f.log, Log{"MouseOver"});
+    EXPECT_EQ(f.host.timerPeriod, 3);
     f.button.OnMouseDown(1, 0, 1, 1);
-    EXPECT_EQ(f.button.lastState(), 2);
     f.host.pointerOver = false;
-    f.button.OnMouseMove(1, 0, 100, 1);
+    f.button.OnMouseMove(1, 0, 100, 1);  // leaving with the left button held paints up
     EXPECT_EQ(f.button.lastState(), 0);
     f.host.pointerOver = true;
-    f.button.OnMouseMove(1, 0, 1, 1);
+    f.button.OnMouseMove(1, 0, 1, 1);  // back in, still holding: pressed, the hover flag clear
     EXPECT_EQ(f.button.lastState(), 2);
     EXPECT_FALSE(f.button.hovering());
-    // Moves with the right button (2 or more) stop after the event.
-    int clears = static_cast<int>(f.canvas.clears);
-    f.button.OnMouseMove(2, 0, 1, 1);
-    EXPECT_EQ(f.canvas.clears, clears);
+    f.Mark();
+    f.button.OnMouseMove(2, 0, 1, 1);  // moves with the right button stop after the event
+    EXPECT_FALSE(f.Painted());
 }
 
-TEST(XPButtonInput, Keys) {
-    Fixture f;
-    // Space down, space up: one click.
-    f.button.OnKeyDown(32, 0);
-    EXPECT_EQ(f.button.lastState(), 2);
-    f.button.OnKeyUp(32, 0);
-    EXPECT_EQ(std::count(f.log.begin(), f.log.end(), "Click"), 1);
-    // Space down, another key, space up: no click.
-    f.log.clear();
-    f.button.OnKeyDown(32, 0);
-    f.button.OnKeyDown(65, 0);
-    f.button.OnKeyUp(32, 0);
-    EXPECT_EQ(std::count(f.log.begin(), f.log.end(), "Click"), 0);
-    // Arrows raise KeyDown first, then move the focus.
-    f.log.clear();
-    f.button.OnKeyDown(37, 0);
-    f.button.OnKeyDown(40, 0);
-    f.button.OnKeyPress(13);
-    EXPECT_EQ(f.log, (std::vector<std::string>{"KeyDown 37", "KeyDown 40", "KeyPress 13"}));
-    EXPECT_EQ(f.host.sentKeys, (std::vector<std::string>{"+{Tab}", "{Tab}"}));
-    // A KeyDown handler that zeroes KeyCode stops the control's handling.
-    f.button.events.KeyDown = [](std::int16_t& k, std::int16_t&) { k = 0; };
-    f.button.OnKeyDown(39, 0);
-    EXPECT_EQ(f.host.sentKeys.size(), 2u);
-    f.button.OnKeyDown(32, 0);
-    f.log.clear();
-    f.button.OnKeyUp(32, 0);
-    EXPECT_EQ(std::count(f.log.begin(), f.log.end(), "Click"), 0);
-}
-
-TEST(XPButtonInput, CheckBoxDisabledAndAccessKey) {
-    Fixture f;
-    f.button.SetCheckBoxBehaviour(true);
-    std::vector<bool> seen;
-    f.button.events.Click = [&] { seen.push_back(f.button.Value()); };
-    f.button.OnMouseDown(1, 0, 1, 1);
-    f.button.OnMouseUp(1, 0, 1, 1);
-    f.button.OnClick();
-    f.button.OnKeyDown(32, 0);
-    f.button.OnKeyUp(32, 0);
-    EXPECT_EQ(seen, (std::vector<bool>{true, false}));  // the handler sees the new Value
-    f.host.notified.clear();
-    f.button.OnAccessKey();
-    EXPECT_EQ(seen.back(), true);
-    EXPECT_TRUE(f.host.notified.empty());  // a click's toggle is not a store change
-    EXPECT_EQ(f.button.lastButton(), 1);
-    // With Value true, every paint shows pressed.
-    f.button.Paint(0, true);
-    EXPECT_EQ(f.button.lastState(), 2);
-
-    // A disabled control never clicks, whatever the platform reports.
-    f.button.SetEnabled(false);
-    seen.clear();
-    f.button.OnMouseDown(1, 0, 1, 1);
-    f.button.OnClick();
-    f.button.OnAccessKey();
-    EXPECT_TRUE(seen.empty());
-}
-
-TEST(XPButtonInput, FocusAndLifecycle) {
+TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
     Fixture f;
     f.button.SetButtonType(1);
     f.button.OnGotFocus();
-    EXPECT_EQ(f.canvas.focusRects.size(), 1u);
-    EXPECT_EQ(f.canvas.focusRects[0], (Box{4, 4, 71, 19}));
+    EXPECT_EQ(f.canvas.focusRects, std::vector<Box>{(Box{4, 4, 71, 19})});
     f.button.OnLostFocus();
     EXPECT_TRUE(f.canvas.focusRects.empty());
 
-    // Hidden: painting requests are dropped and leave the caches, so the next show paints fully.
-    f.button.OnHide();
-    f.canvas.clears = 0;
+    f.button.OnHide();  // hidden: painting is dropped and the next show paints in full
+    f.Mark();
     f.button.SetCaption("Off");
-    EXPECT_EQ(f.canvas.clears, 0);
+    EXPECT_FALSE(f.Painted());
     f.button.OnShow();
-    EXPECT_EQ(f.canvas.clears, 1);
-    // DisableRefresh batches changes until Refresh.
-    f.button.DisableRefresh();
+    EXPECT_TRUE(f.Painted());
+    f.button.DisableRefresh();  // batched until Refresh
+    f.Mark();
     f.button.SetBackColor(0x123456);
     f.button.SetCaption("On");
-    EXPECT_EQ(f.canvas.clears, 1);
+    EXPECT_FALSE(f.Painted());
     f.button.Refresh();
-    EXPECT_EQ(f.canvas.clears, 2);
-
-    // Height 0 never paints, and its resize paints nothing.
-    f.host.height = 0;
-    f.canvas.clears = 0;
+    EXPECT_TRUE(f.Painted());
+    f.host.height = 0;  // height 0 paints nothing (and does not fail)
     f.button.OnResize();
     f.button.Paint(0, true);
-    EXPECT_EQ(f.canvas.clears, 0);
 
-    // Ambient change recomputes unless the scheme is custom.
-    f.host.height = 23;
+    f.host.height = 23;  // an ambient change recomputes unless the scheme is custom
     f.button.OnResize();
     f.host.systemColours[platform::kColorBtnFace] = 0x0000AA;
     f.button.OnAmbientChanged();
@@ -432,25 +270,19 @@ TEST(XPButtonInput, FocusAndLifecycle) {
     f.button.OnAmbientChanged();
     EXPECT_EQ(f.button.palette().FaceColor, 0x123456u);
 
-    // Terminating releases the shape, stops the hover timer and stops painting.
-    f.host.pointerOver = true;
+    f.host.pointerOver = true;  // terminating releases the shape, stops the hover timer and painting
     f.button.OnMouseMove(0, 0, 1, 1);
-    ASSERT_TRUE(f.host.timerRunning);
     f.button.OnTerminate();
-    EXPECT_EQ(f.host.shapesReleased, f.host.shapesSet);
+    EXPECT_FALSE(f.host.shapeHeld);
     EXPECT_FALSE(f.host.timerRunning);
     EXPECT_FALSE(f.button.paintingEnabled());
 }
 
 TEST(XPButtonInput, AccessKeyParsing) {
-    EXPECT_EQ(AccessKeyOf("&Save"), 's');
-    EXPECT_EQ(AccessKeyOf("Save && Exit"), 0);
-    EXPECT_EQ(AccessKeyOf("A&&B &Run"), 'r');
-    EXPECT_EQ(AccessKeyOf("Go&"), 0);
-    EXPECT_EQ(AccessKeyOf("&"), 0);
-    EXPECT_EQ(AccessKeyOf("x"), 0);
-    EXPECT_EQ(AccessKeyOf("A&&B &&C &D"), 0);  // only the first doubled pair is skipped
-    EXPECT_EQ(AccessKeyOf("E&xit"), 'x');
+    // Only the first doubled "&&" is skipped.
+    const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"A&&B &Run", 'r'}, {"Go&", 0},
+                                                  {"&", 0}, {"x", 0}, {"A&&B &&C &D", 0}, {"E&xit", 'x'}};
+    for (auto [caption, key] : cases) EXPECT_EQ(AccessKeyOf(caption), key) << caption;
 }
 
 }  // namespace

@@ -1,5 +1,6 @@
-// The push button's palette, colour arithmetic, geometry and looks, checked pixel by pixel on the
-// raster canvas (text and ovals are recorded there, so only the solid parts are compared).
+// The push button's colour arithmetic, palette, looks, geometry and pictures on the raster canvas
+// (text and ovals are recorded there, so only the solid parts are compared pixel by pixel). That
+// GDI draws the same pixels is proved under Wine (tests/win32/xpbutton_win32_test.cpp).
 #include <gtest/gtest.h>
 
 #include <memory>
@@ -41,34 +42,46 @@ struct Look {
         button.OnMouseMove(0, 0, 1, 1);
     }
     void Press() { button.Paint(2, true); }
-    void Disable() { button.SetEnabled(false); }
+    // Plays the steps in order: f focus, h hover, p press, d disable, D paint as the default button.
+    void Play(const std::string& steps) {
+        for (char step : steps) {
+            if (step == 'f') button.OnGotFocus();
+            if (step == 'h') Hover();
+            if (step == 'p') Press();
+            if (step == 'd') button.SetEnabled(false);
+            if (step == 'D') {
+                host.isDefault = true;
+                button.Paint(0, true);
+            }
+        }
+    }
 };
 
 TEST(XPButtonColour, ShiftBlendAndRounding) {
-    // Blue scaling: 0xC0C0C0 + 48 gives 240 in every channel; a full blue clamps at 255.
-    EXPECT_EQ(ShiftColor(0xC0C0C0, 48, true, false), 0xF0F0F0u);
-    EXPECT_EQ(ShiftColor(0xFFC0C0, 48, true, false), 0xFFF0F0u);
-    // Without blue scaling blue moves like the others; clamping at 0 for negative amounts.
-    EXPECT_EQ(ShiftColor(0x804020, -64, false, false), 0x400000u);
-    EXPECT_EQ(ShiftColor(MakeRgb(250, 10, 100), 10, false, false), MakeRgb(255, 20, 110));
-    // Blue scaling truncates toward zero: 240 × −2 / 192 = −2.5 → −2.
-    EXPECT_EQ(Blue(ShiftColor(0xF0F0F0, -2, true, false)), 238);
-    // SoftBevel halves toward zero: −1 → 0, −3 → −1, 47 → 23.
-    EXPECT_EQ(ShiftColor(0x808080, -1, false, true), 0x808080u);
-    EXPECT_EQ(ShiftColor(0x808080, -3, false, true), 0x7F7F7Fu);
-    EXPECT_EQ(ShiftColor(0x808080, 47, false, true), 0x979797u);
-    // BlendToWhite: c × (255 − a) / 255 + a, truncating.
-    EXPECT_EQ(BlendToWhite(0x000000, 176), MakeRgb(176, 176, 176));
-    EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176), MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
+    struct Shift {
+        Rgb from;
+        int amount;
+        bool blue, soft;
+        Rgb to;
+    };
+    const Shift shifts[] = {
+        {0xC0C0C0, 48, true, false, 0xF0F0F0},   // blue scaling: 192 + 48 in every channel
+        {0xFFC0C0, 48, true, false, 0xFFF0F0},   // a full blue clamps at 255
+        {0x804020, -64, false, false, 0x400000},  // clamps at 0
+        {MakeRgb(250, 10, 100), 10, false, false, MakeRgb(255, 20, 110)},
+        {0xF0F0F0, -2, true, false, MakeRgb(238, 238, 238)},  // blue: 240 × −2 / 192 = −2.5 → −2
+        {0x808080, -1, false, true, 0x808080},    // SoftBevel halves toward zero: −1 → 0
+        {0x808080, -3, false, true, 0x7F7F7F},    // −3 → −1
+        {0x808080, 47, false, true, 0x979797},    // 47 → 23
+    };
+    for (const Shift& s : shifts) EXPECT_EQ(ShiftColor(s.from, s.amount, s.blue, s.soft), s.to) << std::hex << s.from;
+    EXPECT_EQ(BlendToWhite(0x000000, 176), MakeRgb(176, 176, 176));  // c × (255 − a) / 255 + a, truncating
+    EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176),
+              MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
     EXPECT_EQ(BlendToWhite(0xFFFFFF, 128), 0xFFFFFFu);
-    // Halves to even.
-    EXPECT_EQ(RoundHalfEven(0.5), 0);
-    EXPECT_EQ(RoundHalfEven(1.5), 2);
-    EXPECT_EQ(RoundHalfEven(-0.5), 0);
-    EXPECT_EQ(RoundHalfEven(-1.5), -2);
-    EXPECT_EQ(RoundHalfEven(-2.5), -2);
-    EXPECT_EQ(RoundHalfEven(76.5), 76);
-    EXPECT_EQ(RoundHalfEven(2.6), 3);
+    const std::pair<double, int> halves[] = {{0.5, 0},   {1.5, 2},   {-0.5, 0}, {-1.5, -2},
+                                             {-2.5, -2}, {76.5, 76}, {2.6, 3}};
+    for (auto [value, rounded] : halves) EXPECT_EQ(RoundHalfEven(value), rounded) << value;
 }
 
 TEST(XPButtonColour, PaletteBySchemes) {
@@ -76,488 +89,363 @@ TEST(XPButtonColour, PaletteBySchemes) {
     custom.button.SetBackColor(0x406080);
     custom.button.SetForeColor(0x80000000u | platform::kColorHighlight);  // a system colour reference
     const Palette& p = custom.p();
-    EXPECT_EQ(p.FaceColor, 0x406080u);
-    EXPECT_EQ(p.TextColor, 0x6A240Au);
-    EXPECT_EQ(p.ShadowColor, S(0x406080, -64));
-    EXPECT_EQ(p.DarkShadowColor, 0u);
-    EXPECT_EQ(p.LightColor, S(0x406080, 31));
-    EXPECT_EQ(p.HighlightColor, S(0x406080, 47));
-    EXPECT_EQ(p.AccentColor, S(0x406080, -128));
-    EXPECT_EQ(p.AccentLightColor, 0x406080u);
-    EXPECT_EQ(p.BaseColor, S(0x406080, 48));
+    EXPECT_EQ((std::vector<Rgb>{p.FaceColor, p.TextColor, p.ShadowColor, p.DarkShadowColor, p.LightColor,
+                                p.HighlightColor, p.AccentColor, p.AccentLightColor, p.BaseColor}),
+              (std::vector<Rgb>{0x406080, 0x6A240A, S(0x406080, -64), 0, S(0x406080, 31), S(0x406080, 47),
+                                S(0x406080, -128), 0x406080, S(0x406080, 48)}));
 
-    // Scheme 3 ignores BackColor and ForeColor; BaseColor is blue-scaled for ButtonType 3.
-    Look fixed(3, 40, 20, 3);
+    Look fixed(3, 40, 20, 3);  // scheme 3 ignores BackColor; BaseColor is blue-scaled for ButtonType 3
     fixed.button.SetBackColor(0x123456);
-    EXPECT_EQ(fixed.p().FaceColor, 0xC0C0C0u);
-    EXPECT_EQ(fixed.p().AccentLightColor, 0xD1ADADu);
-    EXPECT_EQ(fixed.p().BaseColor, 0xF0F0F0u);
+    EXPECT_EQ(std::make_tuple(fixed.p().FaceColor, fixed.p().AccentLightColor, fixed.p().BaseColor),
+              std::make_tuple(0xC0C0C0u, 0xD1ADADu, 0xF0F0F0u));
 
-    // Scheme 4 follows the parent's drawing colours and is recomputed on ambient change.
-    Look parent(2, 40, 20, 4);
-    EXPECT_EQ(parent.p().FaceColor, parent.host.parentBack);
-    EXPECT_EQ(parent.p().TextOverColor, parent.host.parentText);
+    Look parent(2, 40, 20, 4);  // scheme 4 follows the parent's colours, recomputed on ambient change
+    EXPECT_EQ(std::make_pair(parent.p().FaceColor, parent.p().TextOverColor),
+              std::make_pair(parent.host.parentBack, parent.host.parentText));
     parent.host.parentBack = 0x010203;
     parent.button.OnAmbientChanged();
-    EXPECT_EQ(parent.p().FaceColor, 0x010203u);
-    EXPECT_EQ(parent.p().AccentLightColor, BlendToWhite(0x6A240A, 176));
+    EXPECT_EQ(std::make_pair(parent.p().FaceColor, parent.p().AccentLightColor),
+              std::make_pair(Rgb{0x010203}, BlendToWhite(0x6A240A, 176)));
 
-    // Hovering with the custom scheme draws the whole look from BackOver, then restores.
-    Look over(2, 40, 20, 2);
+    Look over(2, 40, 20, 2);  // hovering with the custom scheme draws the look from BackOver, then restores
     over.button.SetBackColor(0x00C000);
     over.button.SetBackOver(0x0000C0);
     over.Hover();
-    EXPECT_EQ(over.At(20, 10), 0x0000C0u);
-    EXPECT_EQ(over.At(0, 0), S(0x0000C0, 47));
-    EXPECT_EQ(over.button.BackColor(), 0x00C000u);
-    EXPECT_EQ(over.p().FaceColor, 0x00C000u);
+    EXPECT_EQ(std::make_pair(over.At(20, 10), over.At(0, 0)), std::make_pair(Rgb{0x0000C0}, S(0x0000C0, 47)));
+    EXPECT_EQ(std::make_pair(over.button.BackColor(), over.p().FaceColor), std::make_pair(0x00C000u, 0x00C000u));
+}
+
+// Expected colours: a palette entry shifted, or a fixed colour.
+struct Want {
+    Rgb Palette::*entry = nullptr;
+    int shift = 0;
+    Rgb fixed = 0;
+};
+constexpr Rgb Palette::*F = &Palette::FaceColor;
+constexpr Rgb Palette::*H = &Palette::HighlightColor;
+constexpr Rgb Palette::*L = &Palette::LightColor;
+constexpr Rgb Palette::*Sh = &Palette::ShadowColor;
+constexpr Rgb Palette::*D = &Palette::DarkShadowColor;
+constexpr Rgb Palette::*A = &Palette::AccentColor;
+constexpr Rgb Palette::*AL = &Palette::AccentLightColor;
+Want Fixed(Rgb c) { return {nullptr, 0, c}; }
+struct Pixel {
+    int x, y;
+    Want want;
+};
+struct LookCase {
+    int type, scheme;
+    const char* steps;
+    std::vector<Pixel> pixels;
+};
+
+TEST(XPButtonLooks, EveryLookInEveryState) {
+    const Rgb b = 0xF0F0F0;  // BaseColor of scheme 3 (above), shifted with blue scaling by the gradient look
+    const std::vector<LookCase> cases = {
+        {1, 1, "", {{0, 0, {D}}, {39, 19, {D}}, {1, 1, {H}}, {38, 1, {Sh}}, {1, 18, {Sh}}, {2, 2, {H}}}},
+        {1, 1, "", {{37, 17, {Sh}}, {20, 10, {F}}}},
+        {1, 1, "p", {{1, 1, {Sh}}, {38, 18, {H}}, {0, 0, {D}}}},
+        {2, 1, "", {{0, 0, {H}}, {39, 0, {D}}, {0, 19, {D}}, {1, 1, {L}}, {38, 18, {Sh}}}},
+        {2, 1, "p", {{0, 0, {D}}, {39, 19, {H}}, {1, 1, {Sh}}, {38, 18, {L}}}},
+        {2, 1, "D", {{0, 0, {D}}, {1, 1, {H}}, {38, 18, {D}}}},  // the default: dark frame round an inset bevel
+        {2, 1, "Dp", {{1, 1, {Sh}}, {38, 18, {Sh}}, {2, 2, {F}}}},
+        {2, 1, "Dpd", {{0, 0, {H}}}},
+        {3, 3, "", {{0, 5, Fixed(0x733C00)}, {1, 1, Fixed(0x7B4D10)}, {38, 18, Fixed(0x7B4D10)}}},
+        {3, 3, "", {{1, 5, Fixed(SB(b, -5))}, {2, 5, Fixed(SB(b, -10))}, {38, 5, Fixed(SB(b, -36))}}},
+        {3, 3, "", {{5, 18, Fixed(SB(b, -48))}, {5, 1, Fixed(SB(b, 16))}}},
+        {3, 3, "f", {{1, 5, Fixed(0xE7AE8C)}, {5, 18, Fixed(0xEF826B)}}},  // the blue trim
+        {3, 3, "fh", {{1, 5, Fixed(0x31B2FF)}, {5, 2, Fixed(0x8CDBFF)}, {2, 5, Fixed(0x6BCBFF)}}},  // orange wins
+        {3, 3, "fhp", {{37, 5, Fixed(b)}, {1, 5, Fixed(SB(SB(b, -32), -32))}, {5, 1, Fixed(SB(SB(b, -32), -32))}}},
+        {3, 3, "fhp", {{0, 5, Fixed(0x733C00)}}},
+        {3, 3, "fhpd", {{5, 5, Fixed(SB(b, -24))}, {0, 5, Fixed(SB(b, -84))}, {1, 1, Fixed(SB(b, -72))}}},
+        {4, 1, "", {{20, 10, {L}}, {0, 10, {D}}, {38, 10, {Sh}}, {37, 10, {F}}, {2, 10, {H}}, {3, 3, {H}}}},
+        {4, 1, "", {{37, 17, {Sh}}}},
+        {4, 1, "p", {{20, 10, {Sh, -16}}, {1, 10, {Sh, -64}}, {2, 10, {Sh, -32}}, {37, 10, {Sh}}, {38, 10, {Sh, -16}}}},
+        {5, 1, "", {{20, 10, {F, 12}}, {1, 10, {H}}, {0, 10, {Sh, -26}}, {39, 10, {H}}, {38, 10, {Sh, -26}}}},
+        {5, 1, "", {{1, 18, {Sh, 26}}}},
+        {5, 1, "p", {{20, 10, {Sh, 16}}, {39, 10, {H}}}},
+        {5, 1, "pd", {{0, 10, {Sh}}, {39, 10, {Sh}}}},
+        {6, 1, "", {{0, 0, {L, 8}}, {39, 19, {Sh}}, {1, 1, {L, 8}}}},
+        {6, 1, "p", {{0, 0, {Sh}}, {38, 18, {L, 8}}}},
+        {7, 1, "", {{0, 0, {H}}}},
+        {8, 1, "", {{0, 0, {F}}}},
+        {12, 1, "", {{0, 0, {F}}}},
+        {7, 1, "h", {{0, 0, {H}}, {39, 19, {Sh}}, {1, 1, {F}}}},
+        {8, 1, "h", {{0, 0, {H}}, {39, 19, {Sh}}, {1, 1, {F}}}},
+        {12, 1, "h", {{0, 0, {H}}, {39, 19, {D}}, {1, 1, {L}}}},
+        {7, 1, "hp", {{0, 0, {Sh}}, {39, 19, {H}}}},
+        {8, 1, "hp", {{0, 0, {Sh}}, {39, 19, {H}}}},
+        {12, 1, "hp", {{0, 0, {D}}, {39, 19, {H}}}},
+        {7, 1, "hpd", {{0, 0, {H}}}},
+        {8, 1, "hpd", {{0, 0, {F}}}},
+        {12, 1, "hpd", {{0, 0, {F}}}},
+        {9, 1, "", {{0, 0, {F}}}},
+        {9, 1, "h", {{0, 0, {A}}, {20, 10, {AL}}}},
+        {9, 1, "hp", {{0, 0, {A}}}},
+        {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}}},
+        {14, 1, "", {{20, 10, {H, -29}}}},  // 58/20 × 10
+        {14, 1, "Dh", {{20, 10, {L}}}},
+        {14, 1, "Dhp", {{20, 10, {F, -9}}, {0, 10, {Sh, -48}}, {38, 10, {H}}}},
+        {0, 1, "", {{0, 0, {F}}}},  // outside 1 to 14: the face only
+    };
+    for (const LookCase& c : cases) {
+        Look look(c.type, 40, 20, c.scheme);
+        look.Play(c.steps);
+        for (const Pixel& px : c.pixels) {
+            const Rgb want = px.want.entry ? S(look.p().*px.want.entry, px.want.shift) : px.want.fixed;
+            EXPECT_EQ(look.At(px.x, px.y), want)
+                << "type " << c.type << " \"" << c.steps << "\" (" << px.x << ", " << px.y << ")";
+        }
+    }
+}
+
+TEST(XPButtonLooks, CaptionsOfTheLooks) {
+    auto text = [](int type, const char* steps, int scheme = 1) {
+        auto look = std::make_unique<Look>(type, 40, 20, scheme);
+        look->Play(steps);
+        return look;
+    };
+    auto l = text(2, "");
+    EXPECT_EQ(l->canvas.texts.at(0).box, l->button.captionRect());
+    l = text(2, "p");
+    EXPECT_EQ(l->canvas.texts.at(0).box, l->button.captionRectDown());
+    l = text(2, "Dpd");  // engraved
+    ASSERT_EQ(l->canvas.texts.size(), 2u);
+    EXPECT_EQ(std::make_pair(l->canvas.texts[0].colour, l->canvas.texts[1].colour),
+              std::make_pair(l->p().HighlightColor, l->p().ShadowColor));
+    l = text(3, "fhpd", 3);
+    EXPECT_EQ(l->canvas.texts.at(0).colour, SB(0xF0F0F0, -104));
+    EXPECT_TRUE(l->canvas.focusRects.empty()) << "the gradient look shows focus by its trim";
+    l = text(4, "p");
+    EXPECT_EQ(l->canvas.texts.at(0).colour, l->p().LightColor);
+    l->button.SetSpecialEffect(3);  // the pressed caption's effect copies use the pressed fill as their base
+    l->Press();
+    EXPECT_EQ(l->canvas.texts.at(0).colour, S(S(l->p().ShadowColor, -16), -40));
+    l = text(5, "fp");  // the focus frame stays, the caption does not move when pressed
+    const Box c = l->button.captionRect();
+    EXPECT_EQ(l->At(c.left - 2, c.top - 1), 0xCC9999u);
+    EXPECT_EQ(l->canvas.texts.at(0).box, c);
+    l->button.SetEnabled(false);
+    EXPECT_EQ(l->canvas.texts.at(0).colour, l->p().ShadowColor);
+    l = text(9, "hp");
+    EXPECT_EQ(l->At(20, 10), BlendToWhite(l->p().AccentColor, 128));
+    l = text(14, "D");  // the default button's caption is bold without changing the font
+    EXPECT_TRUE(l->canvas.texts.at(0).font.bold);
+    EXPECT_FALSE(l->button.FontBold());
+    l->Play("hp");
+    EXPECT_EQ(l->canvas.texts.at(0).colour, S(l->p().ShadowColor, -50));
+    EXPECT_TRUE(text(0, "")->canvas.texts.empty());
 }
 
 TEST(XPButtonLooks, GradientRowsRoundHalvesToEven) {
     // H = 50: step 0.5; rows 3, 4, 5, 6, 7 use −2 (−1.5), −2, −2 (−2.5), −3, −4 (−3.5).
     Look g(3, 20, 50, 3);
-    const Rgb base = 0xF0F0F0;
-    EXPECT_EQ(g.At(10, 3), SB(base, -2));
-    EXPECT_EQ(g.At(10, 4), SB(base, -2));
-    EXPECT_EQ(g.At(10, 5), SB(base, -2));
-    EXPECT_EQ(g.At(10, 6), SB(base, -3));
-    EXPECT_EQ(g.At(10, 7), MakeRgb(236, 236, 235));  // blue: 240 − 960/192
+    EXPECT_EQ((std::vector<Rgb>{g.At(10, 3), g.At(10, 4), g.At(10, 5), g.At(10, 6), g.At(10, 7)}),
+              (std::vector<Rgb>{SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -3),
+                                MakeRgb(236, 236, 235)}));
     // SoftBevel halves every amount, the gradient steps included: H = 25, row 3 uses −3 → −1.
     Look soft(3, 20, 25, 3);
     soft.button.SetSoftBevel(true);
     const Rgb softBase = ShiftColor(0xC0C0C0, 48, true, true);
     EXPECT_EQ(softBase, 0xD8D8D8u);
-    EXPECT_EQ(soft.At(10, 3), ShiftColor(softBase, -1, true, false));
-    EXPECT_EQ(soft.At(10, 5), ShiftColor(softBase, -2, true, false));
-}
-
-TEST(XPButtonLooks, BevelledLooks) {
-    {
-        Look l(1);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(0, 0), p.DarkShadowColor);
-        EXPECT_EQ(l.At(39, 19), p.DarkShadowColor);
-        EXPECT_EQ(l.At(1, 1), p.HighlightColor);
-        EXPECT_EQ(l.At(38, 1), p.ShadowColor);
-        EXPECT_EQ(l.At(1, 18), p.ShadowColor);
-        EXPECT_EQ(l.At(2, 2), p.HighlightColor);
-        EXPECT_EQ(l.At(37, 17), p.ShadowColor);
-        EXPECT_EQ(l.At(20, 10), p.FaceColor);
-        l.Press();
-        EXPECT_EQ(l.At(1, 1), p.ShadowColor);
-        EXPECT_EQ(l.At(38, 18), p.HighlightColor);
-        EXPECT_EQ(l.At(0, 0), p.DarkShadowColor);
-    }
-    {
-        Look l(2);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(0, 0), p.HighlightColor);
-        EXPECT_EQ(l.At(39, 0), p.DarkShadowColor);
-        EXPECT_EQ(l.At(0, 19), p.DarkShadowColor);
-        EXPECT_EQ(l.At(1, 1), p.LightColor);
-        EXPECT_EQ(l.At(38, 18), p.ShadowColor);
-        EXPECT_EQ(l.canvas.texts.at(0).box, l.button.captionRect());
-        l.Press();
-        EXPECT_EQ(l.At(0, 0), p.DarkShadowColor);
-        EXPECT_EQ(l.At(39, 19), p.HighlightColor);
-        EXPECT_EQ(l.At(1, 1), p.ShadowColor);
-        EXPECT_EQ(l.At(38, 18), p.LightColor);
-        EXPECT_EQ(l.canvas.texts.at(0).box, l.button.captionRectDown());
-        // The default button: dark frame round an inset bevel, then a doubled frame when pressed.
-        l.host.isDefault = true;
-        l.button.Paint(0, true);
-        EXPECT_EQ(l.At(0, 0), p.DarkShadowColor);
-        EXPECT_EQ(l.At(1, 1), p.HighlightColor);
-        EXPECT_EQ(l.At(38, 18), p.DarkShadowColor);
-        l.Press();
-        EXPECT_EQ(l.At(1, 1), p.ShadowColor);
-        EXPECT_EQ(l.At(38, 18), p.ShadowColor);
-        EXPECT_EQ(l.At(2, 2), p.FaceColor);
-        l.Disable();
-        EXPECT_EQ(l.At(0, 0), p.HighlightColor);
-        ASSERT_EQ(l.canvas.texts.size(), 2u);  // engraved caption
-        EXPECT_EQ(l.canvas.texts[0].colour, p.HighlightColor);
-        EXPECT_EQ(l.canvas.texts[1].colour, p.ShadowColor);
-    }
-    {
-        Look l(6);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(0, 0), S(p.LightColor, 8));
-        EXPECT_EQ(l.At(39, 19), p.ShadowColor);
-        EXPECT_EQ(l.At(1, 1), S(p.LightColor, 8));
-        l.Press();
-        EXPECT_EQ(l.At(0, 0), p.ShadowColor);
-        EXPECT_EQ(l.At(38, 18), S(p.LightColor, 8));
-    }
-    for (int type : {7, 8, 12}) {
-        Look l(type);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(0, 0), type == 7 ? p.HighlightColor : p.FaceColor) << type;
-        l.Hover();
-        EXPECT_EQ(l.At(0, 0), p.HighlightColor) << type;
-        EXPECT_EQ(l.At(39, 19), type == 12 ? p.DarkShadowColor : p.ShadowColor) << type;
-        EXPECT_EQ(l.At(1, 1), type == 12 ? p.LightColor : p.FaceColor) << type;
-        l.Press();
-        EXPECT_EQ(l.At(0, 0), type == 12 ? p.DarkShadowColor : p.ShadowColor) << type;
-        EXPECT_EQ(l.At(39, 19), p.HighlightColor) << type;
-        l.Disable();
-        EXPECT_EQ(l.At(0, 0), type == 7 ? p.HighlightColor : p.FaceColor) << type;
-    }
-}
-
-TEST(XPButtonLooks, GradientLookTrims) {
-    Look l(3, 40, 20, 3);
-    const Rgb b = l.p().BaseColor;
-    EXPECT_EQ(l.At(0, 5), 0x733C00u);
-    EXPECT_EQ(l.At(1, 1), 0x7B4D10u);
-    EXPECT_EQ(l.At(38, 18), 0x7B4D10u);
-    EXPECT_EQ(l.At(1, 5), SB(b, -5));
-    EXPECT_EQ(l.At(2, 5), SB(b, -10));
-    EXPECT_EQ(l.At(38, 5), SB(b, -36));
-    EXPECT_EQ(l.At(5, 18), SB(b, -48));
-    EXPECT_EQ(l.At(5, 1), SB(b, 16));
-    l.button.OnGotFocus();  // the blue trim
-    EXPECT_EQ(l.At(1, 5), 0xE7AE8Cu);
-    EXPECT_EQ(l.At(5, 18), 0xEF826Bu);
-    EXPECT_TRUE(l.canvas.focusRects.empty());
-    l.Hover();  // the orange trim wins
-    EXPECT_EQ(l.At(1, 5), 0x31B2FFu);
-    EXPECT_EQ(l.At(5, 2), 0x8CDBFFu);
-    EXPECT_EQ(l.At(2, 5), 0x6BCBFFu);
-    l.Press();
-    const Rgb q = SB(b, -32);
-    EXPECT_EQ(l.At(37, 5), b);
-    EXPECT_EQ(l.At(1, 5), SB(q, -32));
-    EXPECT_EQ(l.At(5, 1), SB(q, -32));
-    EXPECT_EQ(l.At(0, 5), 0x733C00u);
-    l.Disable();
-    EXPECT_EQ(l.At(5, 5), SB(b, -24));
-    EXPECT_EQ(l.At(0, 5), SB(b, -84));
-    EXPECT_EQ(l.At(1, 1), SB(b, -72));
-    EXPECT_EQ(l.canvas.texts.at(0).colour, SB(b, -104));
-}
-
-TEST(XPButtonLooks, FlatAndFramedLooks) {
-    {
-        Look l(4);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(20, 10), p.LightColor);
-        EXPECT_EQ(l.At(0, 10), p.DarkShadowColor);
-        EXPECT_EQ(l.At(38, 10), p.ShadowColor);
-        EXPECT_EQ(l.At(37, 10), p.FaceColor);
-        EXPECT_EQ(l.At(2, 10), p.HighlightColor);
-        EXPECT_EQ(l.At(3, 3), p.HighlightColor);
-        EXPECT_EQ(l.At(37, 17), p.ShadowColor);
-        l.Press();
-        const Rgb f = S(p.ShadowColor, -16);
-        EXPECT_EQ(l.At(20, 10), f);
-        EXPECT_EQ(l.At(1, 10), S(p.ShadowColor, -64));
-        EXPECT_EQ(l.At(2, 10), S(p.ShadowColor, -32));
-        EXPECT_EQ(l.At(37, 10), p.ShadowColor);
-        EXPECT_EQ(l.At(38, 10), f);
-        EXPECT_EQ(l.canvas.texts.at(0).colour, p.LightColor);
-        // The pressed caption effect copies use the pressed fill as their base.
-        l.button.SetSpecialEffect(3);
-        l.Press();
-        EXPECT_EQ(l.canvas.texts.at(0).colour, S(f, -40));
-        EXPECT_EQ(l.p().BaseColor, S(p.FaceColor, 48));
-    }
-    {
-        Look l(5);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(20, 10), S(p.FaceColor, 12));
-        EXPECT_EQ(l.At(1, 10), p.HighlightColor);
-        EXPECT_EQ(l.At(0, 10), S(p.ShadowColor, -26));
-        EXPECT_EQ(l.At(39, 10), p.HighlightColor);
-        EXPECT_EQ(l.At(38, 10), S(p.ShadowColor, -26));
-        EXPECT_EQ(l.At(1, 18), S(p.ShadowColor, 26));
-        l.button.OnGotFocus();
-        const Box c = l.button.captionRect();
-        EXPECT_EQ(l.At(c.left - 2, c.top - 1), 0xCC9999u);
-        l.Press();
-        EXPECT_EQ(l.At(20, 10), S(p.ShadowColor, 16));
-        EXPECT_EQ(l.At(39, 10), p.HighlightColor);
-        EXPECT_EQ(l.At(c.left - 2, c.top - 1), 0xCC9999u);
-        EXPECT_EQ(l.canvas.texts.at(0).box, c);  // unmoved when pressed
-        l.Disable();
-        EXPECT_EQ(l.At(0, 10), p.ShadowColor);
-        EXPECT_EQ(l.At(39, 10), p.ShadowColor);
-        EXPECT_EQ(l.canvas.texts.at(0).colour, p.ShadowColor);
-    }
-    {
-        Look l(9);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(0, 0), p.FaceColor);
-        l.Hover();
-        EXPECT_EQ(l.At(0, 0), p.AccentColor);
-        EXPECT_EQ(l.At(20, 10), p.AccentLightColor);
-        l.Press();
-        EXPECT_EQ(l.At(20, 10), BlendToWhite(p.AccentColor, 128));
-        EXPECT_EQ(l.At(0, 0), p.AccentColor);
-    }
-    {
-        Look l(14);
-        const Palette p = l.p();
-        EXPECT_EQ(l.At(0, 10), S(p.ShadowColor, -50));
-        EXPECT_EQ(l.At(1, 10), S(p.FaceColor, -9));
-        EXPECT_EQ(l.At(2, 2), p.HighlightColor);
-        EXPECT_EQ(l.At(3, 10), p.HighlightColor);
-        EXPECT_EQ(l.At(20, 10), S(p.HighlightColor, -29));  // 58/20 × 10 = 29
-        l.host.isDefault = true;
-        l.button.Paint(0, true);
-        EXPECT_TRUE(l.canvas.texts.at(0).font.bold);
-        EXPECT_FALSE(l.button.FontBold());
-        l.Hover();
-        EXPECT_EQ(l.At(20, 10), p.LightColor);
-        l.Press();
-        EXPECT_EQ(l.At(20, 10), S(p.FaceColor, -9));
-        EXPECT_EQ(l.At(0, 10), S(p.ShadowColor, -48));
-        EXPECT_EQ(l.At(38, 10), p.HighlightColor);
-        EXPECT_EQ(l.canvas.texts.at(0).colour, S(p.ShadowColor, -50));
-    }
+    EXPECT_EQ(std::make_pair(soft.At(10, 3), soft.At(10, 5)), std::make_pair(SB(softBase, -1), SB(softBase, -2)));
 }
 
 TEST(XPButtonLooks, SpecialLooksAndStates) {
-    {
-        Look l(10);
-        for (int y = 0; y < 20; ++y)
-            for (int x = 0; x < 40; ++x) ASSERT_EQ(l.At(x, y), l.p().FaceColor);
-        EXPECT_TRUE(l.canvas.texts.empty());
-    }
-    {
-        Look l(0);  // outside 1 to 14: face only
-        EXPECT_TRUE(l.canvas.texts.empty());
-        EXPECT_EQ(l.At(0, 0), l.p().FaceColor);
-    }
-    {
-        Look l(11);  // the parent's pixels in place of the face
-        EXPECT_EQ(l.At(0, 0), l.host.parentPixel);
-        EXPECT_EQ(l.At(39, 19), l.host.parentPixel);
-        EXPECT_GE(l.host.backgroundCaptures, 1);
-    }
-    {
-        // A resize arriving while the background is captured is ignored; Refresh captures again.
-        Look l(11);
-        const int captures = l.host.backgroundCaptures;
-        l.host.duringCapture = [&] {
-            l.host.height = 0;
-            l.button.OnResize();
-        };
-        l.button.Refresh();
-        EXPECT_EQ(l.host.backgroundCaptures, captures + 1);
-        EXPECT_EQ(l.button.height(), 20);
-        EXPECT_EQ(l.At(5, 5), l.host.parentPixel);
-        l.host.duringCapture = nullptr;
-        l.host.height = 20;
-        // A show captures again; a hidden control does not capture when its type is set.
-        l.button.OnHide();
-        l.button.SetButtonType(11);
-        EXPECT_EQ(l.host.backgroundCaptures, captures + 1);
-        l.button.OnShow();
-        EXPECT_EQ(l.host.backgroundCaptures, captures + 2);
-    }
-    {
-        Look l(13);
-        ASSERT_EQ(l.canvas.ovals.size(), 1u);
-        EXPECT_EQ(l.canvas.ovals[0].pen, l.p().FaceColor);
-        l.Hover();
-        EXPECT_EQ(l.canvas.ovals.at(0).pen, l.p().ShadowColor);
-        l.Press();
-        EXPECT_EQ(l.canvas.ovals.at(0).brush, S(l.p().FaceColor, -32));
-    }
-    {
-        // Paint(1) draws the face only; a checked two-state button is always drawn pressed,
-        // but a disabled one still shows the disabled recipe.
-        Look l(1);
-        l.button.Paint(1, true);
-        EXPECT_EQ(l.At(0, 0), l.p().FaceColor);
-        EXPECT_TRUE(l.canvas.texts.empty());
-        l.button.SetCheckBoxBehaviour(true);
-        l.button.SetValue(true);
-        l.Hover();
-        EXPECT_EQ(l.At(1, 1), l.p().ShadowColor);
-        l.Disable();
-        EXPECT_EQ(l.At(1, 1), l.p().HighlightColor);
-    }
-    {
-        // An unforced repaint with nothing changed does not touch the surface.
-        Look l(3);
-        const auto calls = l.canvas.drawCalls;
-        l.button.Paint(0, false);
-        l.button.OnMouseUp(1, 0, 0, 0);
-        EXPECT_EQ(l.canvas.drawCalls, calls);
-        l.button.Paint(2, false);
-        EXPECT_GT(l.canvas.drawCalls, calls);
-    }
+    Look face(10);  // the face alone, no caption
+    EXPECT_EQ(face.canvas.pixels(), std::vector<Rgb>(40 * 20, face.p().FaceColor));
+    EXPECT_TRUE(face.canvas.texts.empty());
+
+    Look parent(11);  // the parent's pixels in place of the face
+    EXPECT_EQ(std::make_pair(parent.At(0, 0), parent.At(39, 19)),
+              std::make_pair(parent.host.parentPixel, parent.host.parentPixel));
+    // A resize arriving while the background is captured is ignored; Refresh captures again.
+    parent.host.duringCapture = [&] {
+        parent.host.height = 0;
+        parent.button.OnResize();
+    };
+    parent.button.Refresh();
+    EXPECT_EQ(parent.button.height(), 20);
+    EXPECT_EQ(parent.At(5, 5), parent.host.parentPixel);
+    parent.host.duringCapture = nullptr;
+    parent.host.height = 20;
+    parent.button.OnHide();  // shown again, the control copies the parent as it is now
+    parent.host.parentPixel = 0x445566;
+    parent.button.OnShow();
+    EXPECT_EQ(parent.At(5, 5), 0x445566u);
+
+    Look oval(13);
+    EXPECT_EQ(oval.canvas.ovals.at(0).pen, oval.p().FaceColor);
+    oval.Hover();
+    EXPECT_EQ(oval.canvas.ovals.at(0).pen, oval.p().ShadowColor);
+    oval.Press();
+    EXPECT_EQ(oval.canvas.ovals.at(0).brush, S(oval.p().FaceColor, -32));
+
+    // Paint(1) draws the face only; a checked two-state button is drawn pressed, unless disabled.
+    Look l(1);
+    l.button.Paint(1, true);
+    EXPECT_EQ(l.At(0, 0), l.p().FaceColor);
+    EXPECT_TRUE(l.canvas.texts.empty());
+    l.button.SetCheckBoxBehaviour(true);
+    l.button.SetValue(true);
+    l.Hover();
+    EXPECT_EQ(l.At(1, 1), l.p().ShadowColor);
+    l.button.SetEnabled(false);
+    EXPECT_EQ(l.At(1, 1), l.p().HighlightColor);
+
+    // An unforced repaint with nothing changed leaves the surface alone.
+    Look same(3);
+    same.canvas.FillBox(0, 0, 40, 20, 0x123456);
+    same.button.Paint(0, false);
+    same.button.OnMouseUp(1, 0, 0, 0);
+    EXPECT_EQ(same.At(20, 10), 0x123456u);
+    same.button.Paint(2, false);
+    EXPECT_NE(same.At(20, 10), 0x123456u);
 }
 
 TEST(XPButtonGeometry, RegionsFocusAndCaption) {
     Look l(1, 75, 23);
-    auto removed = [&](int type) {
+    auto shape = [&](int type) {
         l.button.SetButtonType(type);
         return l.host.shape;
     };
     using P = std::pair<std::int32_t, std::int32_t>;
-    platform::WindowShape s = removed(1);
-    EXPECT_FALSE(s.ellipse);
-    EXPECT_EQ(s.removed, (std::vector<P>{{0, 0}, {74, 0}, {0, 22}, {74, 22}}));
-    EXPECT_EQ(removed(14).removed.size(), 4u);
-    EXPECT_EQ(removed(5).removed, (std::vector<P>{{0, 22}, {74, 0}}));
-    s = removed(3);
-    EXPECT_EQ(s.removed.size(), 12u);
-    EXPECT_NE(std::find(s.removed.begin(), s.removed.end(), P{73, 22}), s.removed.end());
-    EXPECT_NE(std::find(s.removed.begin(), s.removed.end(), P{0, 21}), s.removed.end());
-    EXPECT_EQ(removed(4).removed, s.removed);
-    EXPECT_TRUE(removed(13).ellipse);
-    EXPECT_TRUE(removed(2).removed.empty());
-    EXPECT_GT(l.host.shapesReleased, 0);
+    EXPECT_EQ(shape(1).removed, (std::vector<P>{{0, 0}, {74, 0}, {0, 22}, {74, 22}}));
+    EXPECT_EQ(shape(14).removed.size(), 4u);
+    EXPECT_EQ(shape(5).removed, (std::vector<P>{{0, 22}, {74, 0}}));
+    const std::vector<P> rounded = shape(3).removed;
+    EXPECT_EQ(rounded.size(), 12u);
+    EXPECT_NE(std::find(rounded.begin(), rounded.end(), P{73, 22}), rounded.end());
+    EXPECT_NE(std::find(rounded.begin(), rounded.end(), P{0, 21}), rounded.end());
+    EXPECT_EQ(shape(4).removed, rounded);
+    EXPECT_TRUE(shape(13).ellipse);
+    EXPECT_TRUE(shape(2).removed.empty());
 
-    EXPECT_EQ(l.button.focusRect(), (Box{4, 4, 71, 19}));
-    l.button.SetButtonType(9);
-    EXPECT_EQ(l.button.focusRect(), (Box{3, 3, 72, 20}));
-    l.button.SetButtonType(14);
-    EXPECT_EQ(l.button.focusRect(), (Box{6, 6, 71, 19}));
+    const std::pair<int, Box> focus[] = {{1, {4, 4, 71, 19}}, {9, {3, 3, 72, 20}}, {14, {6, 6, 71, 19}}};
+    for (const auto& [type, box] : focus) {
+        l.button.SetButtonType(type);
+        EXPECT_EQ(l.button.focusRect(), box) << type;
+    }
 
     // "Save": 28 × 13 at (1, 1) in the box, moved by ((75 − 29) / 2, (23 − 14) / 2).
     l.button.SetCaption("Save");
     EXPECT_EQ(l.button.captionRect(), (Box{24, 5, 52, 18}));
     EXPECT_EQ(l.button.captionRectDown(), (Box{25, 6, 53, 19}));
-
     // A 16 × 16 picture to the left: box (17, 1, 73, 21), caption moved by (15, 4).
-    auto picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 16, 16,
-                                                   std::vector<Rgb>(256, 0x00FF00));
-    l.button.SetPictureNormal(picture);
-    EXPECT_EQ(l.button.pictureRect().width, 16);
-    EXPECT_EQ(l.button.captionRect(), (Box{32, 5, 60, 18}));
-    EXPECT_EQ(l.button.pictureRect().x, 32 - 16 - 4);
-    EXPECT_EQ(l.button.pictureRect().y, 3);
+    l.button.SetPictureNormal(
+        std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 16, 16, std::vector<Rgb>(256)));
+    auto placed = [&] {
+        const auto r = l.button.pictureRect();
+        return std::make_tuple(l.button.captionRect(), r.x, r.y);
+    };
+    EXPECT_EQ(placed(), std::make_tuple(Box{32, 5, 60, 18}, 32 - 16 - 4, 3));
     l.button.SetPicturePosition(1);  // right: box (1, 1, 57, 21), dx = (75 − 16 − 29 − 4) / 2
-    EXPECT_EQ(l.button.captionRect(), (Box{14, 5, 42, 18}));
-    EXPECT_EQ(l.button.pictureRect().x, 46);
+    EXPECT_EQ(placed(), std::make_tuple(Box{14, 5, 42, 18}, 46, 3));
     l.button.SetPicturePosition(3);  // below: dy = (23 − 16 − 14 − 4) / 2 = −5
     EXPECT_EQ(l.button.captionRect().top, -4);
     EXPECT_EQ(l.button.pictureRect().y, l.button.captionRect().bottom + 2);
     l.button.SetCaption("  ");  // an empty caption centres the picture
-    EXPECT_EQ(l.button.pictureRect().x, (75 - 16) / 2);
-    EXPECT_EQ(l.button.pictureRect().y, (23 - 16) / 2);
+    EXPECT_EQ(std::make_pair(l.button.pictureRect().x, l.button.pictureRect().y),
+              std::make_pair((75 - 16) / 2, (23 - 16) / 2));
+
+    // At 127 dpi one pixel is 20 HIMETRIC: 50 → 2.5 → 2, 70 → 3.5 → 4, 61 → 3.05 → 3.
+    l.host.dpi = 127;
+    auto picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 1, 1, std::vector<Rgb>{0});
+    picture->SetHimetric(50, 70);
+    l.button.SetPictureNormal(picture);
+    EXPECT_EQ(std::make_pair(l.button.pictureRect().width, l.button.pictureRect().height), std::make_pair(2, 4));
+    picture->SetHimetric(61, 0);
+    l.button.SetPictureNormal(picture);
+    EXPECT_EQ(std::make_pair(l.button.pictureRect().width, l.button.pictureRect().height), std::make_pair(3, 0));
 }
 
+// The pictures are drawn on a face (0x406080) that differs from the mask colour (0xC0C0C0), so a
+// key-coloured pixel that is drawn shows.
+constexpr Rgb kFace = 0x406080, kKey = 0xC0C0C0;
+
 TEST(XPButtonPictures, BlitPictureRules) {
-    Look l(10, 8, 8, 3);
-    const Rgb key = 0xC0C0C0;
-    // Row 0: key colour, mid-grey sum 385, grey sum 384, pure red.
-    std::vector<Rgb> pixels = {key, MakeRgb(129, 128, 128), MakeRgb(128, 128, 128), MakeRgb(255, 0, 0)};
-    MemoryPicture picture(platform::PictureKind::kBitmap, 4, 1, pixels);
-    const Rgb face = l.p().FaceColor;
-    l.button.BlitPicture(0, 0, 4, 1, picture, key, -1, false, false, false);
-    EXPECT_EQ(l.At(0, 0), face);  // the key colour is never drawn
-    EXPECT_EQ(l.At(1, 0), pixels[1]);
-    EXPECT_EQ(l.At(3, 0), pixels[3]);
-    // Dark-only silhouette: drawn only where red + green + blue < 385 (black is a colour).
-    l.button.BlitPicture(0, 1, 4, 1, picture, key, 0x000000, true, false, false);
-    EXPECT_EQ(l.At(0, 1), face);
-    EXPECT_EQ(l.At(1, 1), face);
-    EXPECT_EQ(l.At(2, 1), 0u);
-    EXPECT_EQ(l.At(3, 1), 0u);
-    // Greyscale: pure red gives 76.
-    l.button.BlitPicture(0, 2, 4, 1, picture, key, -1, false, true, false);
-    EXPECT_EQ(l.At(3, 2), MakeRgb(76, 76, 76));
-    EXPECT_EQ(l.At(0, 2), face);
-    // Blend: two thirds picture, one third background, truncating.
-    l.button.BlitPicture(0, 3, 4, 1, picture, key, -1, false, false, true);
-    EXPECT_EQ(l.At(3, 3), MakeRgb((2 * 255 + 192) / 3, (0 + 192) / 3, (0 + 192) / 3));
+    Look l(10, 8, 8, 2);
+    l.button.SetBackColor(kFace);
+    ASSERT_EQ(l.p().FaceColor, kFace);
+    // Key colour, mid-grey sum 385, grey sum 384, pure red.
+    const std::vector<Rgb> px = {kKey, MakeRgb(129, 128, 128), MakeRgb(128, 128, 128), MakeRgb(255, 0, 0)};
+    MemoryPicture picture(platform::PictureKind::kBitmap, 4, 1, px);
+    auto row = [&](int y, int n = 4) {
+        std::vector<Rgb> out;
+        for (int x = 0; x < n; ++x) out.push_back(l.At(x, y));
+        return out;
+    };
+    l.button.BlitPicture(0, 0, 4, 1, picture, kKey, -1, false, false, false);
+    EXPECT_EQ(row(0), (std::vector<Rgb>{kFace, px[1], px[2], px[3]})) << "the key colour is never drawn";
+    l.button.BlitPicture(0, 1, 4, 1, picture, kKey, 0x000000, true, false, false);
+    EXPECT_EQ(row(1), (std::vector<Rgb>{kFace, kFace, 0, 0})) << "dark-only silhouette: red + green + blue < 385";
+    l.button.BlitPicture(0, 2, 4, 1, picture, kKey, -1, false, true, false);
+    EXPECT_EQ(row(2)[0], kFace);
+    EXPECT_EQ(row(2)[3], MakeRgb(76, 76, 76)) << "greyscale of pure red";
+    l.button.BlitPicture(0, 3, 4, 1, picture, kKey, -1, false, false, true);
+    EXPECT_EQ(row(3)[0], kFace);
+    EXPECT_EQ(row(3)[3], MakeRgb((2 * 255 + 0x80) / 3, 0x60 / 3, 0x40 / 3)) << "two thirds picture, one third face";
     // Without UseMaskColor the key colour is drawn too; negative sizes mean the picture's own.
     l.button.SetUseMaskColor(false);
-    l.button.BlitPicture(0, 4, -1, -1, picture, key, 0x0000FF, false, false, false);
-    EXPECT_EQ(l.At(0, 4), 0x0000FFu);
-    EXPECT_EQ(l.At(3, 4), 0x0000FFu);
-    EXPECT_EQ(l.At(4, 4), face);
+    l.button.BlitPicture(0, 4, -1, -1, picture, kKey, 0x0000FF, false, false, false);
+    EXPECT_EQ(row(4, 5), (std::vector<Rgb>{0x0000FF, 0x0000FF, 0x0000FF, 0x0000FF, kFace}));
     // Pixels beyond the surface are dropped, not wrapped.
-    l.button.BlitPicture(6, 7, 4, 1, picture, key, 0x00FF00, false, false, false);
+    l.button.BlitPicture(6, 7, 4, 1, picture, kKey, 0x00FF00, false, false, false);
+    EXPECT_EQ(row(7, 1)[0], kFace);
     EXPECT_EQ(l.At(6, 7), 0x00FF00u);
-    EXPECT_EQ(l.At(0, 7), face);
     // An icon's transparent parts take the mask colour and so stay transparent.
     l.button.SetUseMaskColor(true);
     MemoryPicture icon(platform::PictureKind::kIcon, 2, 1, {0x0000FF, 0x00FF00}, {true, false});
-    l.button.BlitPicture(0, 5, 2, 1, icon, key, -1, false, false, false);
-    EXPECT_EQ(l.At(0, 5), face);
-    EXPECT_EQ(l.At(1, 5), 0x00FF00u);
-}
-
-TEST(XPButtonPictures, HimetricSizeRoundsHalvesToEven) {
-    // At 127 dpi one pixel is 20 HIMETRIC: 50 → 2.5 → 2, 70 → 3.5 → 4, 61 → 3.05 → 3.
-    Look l(2);
-    l.host.dpi = 127;
-    auto sized = [&](std::int32_t hw, std::int32_t hh) {
-        auto picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 1, 1, std::vector<Rgb>{0});
-        picture->SetHimetric(hw, hh);
-        l.button.SetPictureNormal(picture);
-        return std::pair{l.button.pictureRect().width, l.button.pictureRect().height};
-    };
-    EXPECT_EQ(sized(50, 70), (std::pair{2, 4}));
-    EXPECT_EQ(sized(61, 0), (std::pair{3, 0}));
-    l.button.SetPictureNormal(nullptr);
-    EXPECT_EQ(l.button.pictureRect().width, 0);
-    EXPECT_EQ(l.button.pictureRect().height, 0);
+    l.button.BlitPicture(0, 5, 2, 1, icon, kKey, -1, false, false, false);
+    EXPECT_EQ(row(5, 2), (std::vector<Rgb>{kFace, 0x00FF00}));
 }
 
 TEST(XPButtonPictures, PictureByStateAndEffects) {
-    // A 2 × 2 black square with a key-coloured corner on a 40 × 20 classic button.
-    Look l(2, 40, 20, 3);
-    std::vector<Rgb> px = {0xC0C0C0, 0x000000, 0x000000, 0x000000};
-    auto normal = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, px);
+    // A 2 × 2 black square with a key-coloured corner, centred on a 40 × 20 button.
+    Look l(2, 40, 20, 2);
+    l.button.SetBackColor(kFace);
+    l.button.SetBackOver(kFace);
     l.button.SetCaption("");
-    l.button.SetPictureNormal(normal);
+    l.button.SetPictureNormal(std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2,
+                                                              std::vector<Rgb>{kKey, 0, 0, 0}));
     const auto r = l.button.pictureRect();
-    EXPECT_EQ(r.x, 19);
-    EXPECT_EQ(r.y, 9);
     const Palette p = l.p();
-    EXPECT_EQ(l.At(r.x, r.y), p.FaceColor);
-    EXPECT_EQ(l.At(r.x + 1, r.y), 0u);
-    // Pressed: moved by (1, 1).
-    l.Press();
-    EXPECT_EQ(l.At(r.x + 1, r.y + 1), p.FaceColor);
-    EXPECT_EQ(l.At(r.x + 2, r.y + 1), 0u);
-    // Disabled: engraved, highlight at (+1, +1) under the shadow silhouette.
-    l.Disable();
-    EXPECT_EQ(l.At(r.x + 1, r.y), p.ShadowColor);
-    EXPECT_EQ(l.At(r.x + 2, r.y + 2), p.HighlightColor);
-    // Hover with PictureOver shows it instead.
+    auto at = [&](int dx, int dy) { return l.At(r.x + dx, r.y + dy); };
+    EXPECT_EQ(std::make_pair(r.x, r.y), std::make_pair(19, 9));
+    EXPECT_EQ(std::make_pair(at(0, 0), at(1, 0)), std::make_pair(kFace, Rgb{0}));
+    l.Press();  // moved by (1, 1)
+    EXPECT_EQ(std::make_pair(at(1, 1), at(2, 1)), std::make_pair(kFace, Rgb{0}));
+    l.button.SetEnabled(false);  // engraved: highlight at (+1, +1) under the shadow silhouette
+    EXPECT_EQ(std::make_pair(at(1, 0), at(2, 2)), std::make_pair(p.ShadowColor, p.HighlightColor));
     l.button.SetEnabled(true);
-    auto over = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4, 0x0000FF));
-    l.button.SetPictureOver(over);
+    l.button.SetPictureOver(
+        std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4, 0x0000FF)));
     l.Hover();
-    EXPECT_EQ(l.At(r.x, r.y), 0x0000FFu);
-    // Raised effect: a darker copy below-right and a lighter one above-left, behind the picture.
+    EXPECT_EQ(at(0, 0), 0x0000FFu) << "hovering shows PictureOver";
     l.host.pointerOver = false;
     l.button.OnOverTimer();
-    l.button.SetSpecialEffect(1);
-    EXPECT_EQ(l.At(r.x + 2, r.y + 2), S(p.FaceColor, -40));
-    EXPECT_EQ(l.At(r.x, r.y - 1), S(p.FaceColor, 40));
-    EXPECT_EQ(l.At(r.x + 1, r.y), 0u);
-    // Sunken: the lighter copy below-right; drop shadow: only the darker copy below-right.
-    l.button.SetSpecialEffect(2);
-    EXPECT_EQ(l.At(r.x + 2, r.y + 2), S(p.FaceColor, 40));
-    EXPECT_EQ(l.At(r.x, r.y - 1), S(p.FaceColor, -40));
-    l.button.SetSpecialEffect(3);
-    EXPECT_EQ(l.At(r.x + 2, r.y + 2), S(p.FaceColor, -40));
-    EXPECT_EQ(l.At(r.x, r.y - 1), p.FaceColor);
-    // Caption effect copies: sunken puts the lighter copy below-right, then the text.
+    // Raised: a darker copy below-right and a lighter one above-left; sunken the other way round;
+    // drop shadow: only the darker copy below-right. The key-coloured corner casts no copy.
+    const std::tuple<int, Rgb, Rgb> effects[] = {
+        {1, S(kFace, -40), S(kFace, 40)}, {2, S(kFace, 40), S(kFace, -40)}, {3, S(kFace, -40), kFace}};
+    for (const auto& [effect, belowRight, aboveLeft] : effects) {
+        l.button.SetSpecialEffect(effect);
+        EXPECT_EQ(std::make_tuple(at(2, 2), at(0, -1), at(1, 0), at(-1, -1)),
+                  std::make_tuple(belowRight, aboveLeft, Rgb{0}, kFace))
+            << effect;
+    }
+    // Caption copies: sunken puts the lighter copy below-right, then the darker, then the text.
     l.button.SetCaption("Go");
     l.button.SetSpecialEffect(2);
     ASSERT_EQ(l.canvas.texts.size(), 3u);
-    EXPECT_EQ(l.canvas.texts[0].colour, S(p.FaceColor, 40));
+    EXPECT_EQ(std::make_tuple(l.canvas.texts[0].colour, l.canvas.texts[1].colour, l.canvas.texts[2].colour),
+              std::make_tuple(S(kFace, 40), S(kFace, -40), p.TextColor));
     EXPECT_EQ(l.canvas.texts[0].box, Offset(l.button.captionRect(), 1, 1));
-    EXPECT_EQ(l.canvas.texts[1].colour, S(p.FaceColor, -40));
-    EXPECT_EQ(l.canvas.texts[2].colour, p.TextColor);
-    // Position 4 draws the caption again over the picture.
     l.button.SetSpecialEffect(0);
     l.button.SetPicturePosition(4);
-    EXPECT_EQ(l.canvas.texts.size(), 2u);
-    // ButtonType 9 is see-through until hovered.
-    l.button.SetButtonType(9);
-    const auto r9 = l.button.pictureRect();
-    EXPECT_EQ(l.At(r9.x + 1, r9.y), MakeRgb(192 / 3, 192 / 3, 192 / 3));
+    EXPECT_EQ(l.canvas.texts.size(), 2u) << "position 4 draws the caption again over the picture";
+    l.button.SetButtonType(9);  // see-through until hovered: two thirds picture, one third face
+    EXPECT_EQ(l.At(l.button.pictureRect().x + 1, l.button.pictureRect().y), MakeRgb(0x80 / 3, 0x60 / 3, 0x40 / 3));
 }
 
 }  // namespace

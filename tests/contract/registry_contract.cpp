@@ -93,36 +93,32 @@ TEST_P(RegistryContract, MissingValuesAndKeysGiveTheDefault) {
 TEST_P(RegistryContract, WritesReadBackByType) {
     RegistryRoutines reg = Routines(*registry_, scratch_ + "\\");
     ASSERT_EQ(reg.CreateKey(), "0");
-
-    EXPECT_TRUE(reg.SetRegistryValue("Text", std::string("C:\\Program Files\\Vantorel\\vantorel.exe"), 1));
-    EXPECT_EQ(reg.GetRegistryValue("Text"), Variant(std::string("C:\\Program Files\\Vantorel\\vantorel.exe")));
-    EXPECT_TRUE(reg.SetRegistryValue("Number", std::int32_t{42}, 1));
-    EXPECT_EQ(reg.GetRegistryValue("Number"), Variant(std::string("42"))) << "a number is stored as its text";
-    EXPECT_TRUE(reg.SetRegistryValue("Negative", std::int32_t{-2147483647 - 1}, 1));
-    EXPECT_EQ(reg.GetRegistryValue("Negative"), Variant(std::string("-2147483648")));
-
-    EXPECT_TRUE(reg.SetRegistryValue("Dword", std::int32_t{-5}, 4));
-    EXPECT_EQ(reg.GetRegistryValue("Dword"), Variant(std::int32_t{-5}));
-    EXPECT_TRUE(reg.SetRegistryValue("DwordText", std::string(" 1234 "), 4));
-    EXPECT_EQ(reg.GetRegistryValue("DwordText"), Variant(std::int32_t{1234}));
-    EXPECT_FALSE(reg.SetRegistryValue("DwordBad", std::string("abc"), 4)) << "not a number: nothing written";
-    EXPECT_TRUE(IsEmpty(reg.GetRegistryValue("DwordBad")));
-
-    EXPECT_TRUE(reg.SetRegistryValue("Binary", Bytes{0x00, 0xA5, 0xFF}, 3));
-    EXPECT_EQ(reg.GetRegistryValue("Binary"), Variant(Bytes{0x00, 0xA5, 0xFF}));
-    EXPECT_TRUE(reg.SetRegistryValue("EmptyBinary", Bytes{}, 3));
-    EXPECT_EQ(reg.GetRegistryValue("EmptyBinary", std::string("default")), Variant(Bytes{}));
-    EXPECT_FALSE(reg.SetRegistryValue("BinaryText", std::string("ab"), 3)) << "binary needs bytes";
-
-    // A multi-string text holds its separators and the list's own terminator.
-    EXPECT_TRUE(reg.SetRegistryValue("Multi", std::string("a\0b\0\0", 5), 7));
-    EXPECT_EQ(reg.GetRegistryValue("Multi"), Variant(std::string("a\0b", 3)));
-    EXPECT_TRUE(reg.SetRegistryValue("MultiFirstEmpty", std::string("\0b\0\0", 4), 7));
-    EXPECT_EQ(reg.GetRegistryValue("MultiFirstEmpty", std::string("d")), Variant(std::string("d")));
-
-    EXPECT_TRUE(reg.SetRegistryValue("Ignored", std::string("1"), 5)) << "a type not converted writes nothing";
-    EXPECT_TRUE(IsEmpty(reg.GetRegistryValue("Ignored")));
-
+    const std::string path = "C:\\Program Files\\Vantorel\\vantorel.exe";
+    struct Case {
+        const char* name;
+        Variant written;
+        std::int32_t type;
+        bool ok;
+        Variant read;  // empty: nothing stored
+    };
+    const Case cases[] = {
+        {"Text", path, 1, true, path},
+        {"Number", std::int32_t{42}, 1, true, std::string("42")},  // a number is stored as its text
+        {"Negative", std::int32_t{-2147483647 - 1}, 1, true, std::string("-2147483648")},
+        {"Dword", std::int32_t{-5}, 4, true, std::int32_t{-5}},
+        {"DwordText", std::string(" 1234 "), 4, true, std::int32_t{1234}},
+        {"DwordBad", std::string("abc"), 4, false, Variant()},  // not a number: nothing written
+        {"Binary", Bytes{0x00, 0xA5, 0xFF}, 3, true, Bytes{0x00, 0xA5, 0xFF}},
+        {"EmptyBinary", Bytes{}, 3, true, Bytes{}},
+        {"BinaryText", std::string("ab"), 3, false, Variant()},  // binary needs bytes
+        {"Multi", std::string("a\0b\0\0", 5), 7, true, std::string("a\0b", 3)},  // separators and terminator
+        {"MultiFirstEmpty", std::string("\0b\0\0", 4), 7, true, Variant()},
+        {"Ignored", std::string("1"), 5, true, Variant()},  // a type not converted writes nothing
+    };
+    for (const Case& c : cases) {
+        EXPECT_EQ(reg.SetRegistryValue(c.name, c.written, c.type), c.ok) << c.name;
+        EXPECT_EQ(reg.GetRegistryValue(c.name), c.read) << c.name;
+    }
     EXPECT_EQ(reg.DeleteValue("Text"), 0);
     EXPECT_TRUE(IsEmpty(reg.GetRegistryValue("Text")));
     EXPECT_EQ(reg.DeleteValue("Text"), platform::kErrorFileNotFound);

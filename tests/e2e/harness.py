@@ -1,10 +1,10 @@
 """Drives vantorel.exe under Wine for the end-to-end tests.
 
-Each Session has its own virtual display (Xvfb), its own Wine prefix and a Wine desktop in which
-the program runs, so windows have title bars and a notification area as on Windows. Windows are
-read with vtprobe.exe from inside the same desktop; clicks are real pointer clicks sent with
-xdotool at screen coordinates; settings are read and written with `wine reg`. Everything a session
-starts is ended by its PID (and the prefix's own wineserver) when it closes.
+A Session has its own virtual display (started by tests/win32/xvfb-fixture, the launcher the
+Windows tests use), its own Wine prefix and a Wine desktop in which the program runs, so windows
+have title bars and a notification area as on Windows. Windows are read with vtprobe.exe from
+inside the desktop; clicks are real pointer clicks sent with xdotool; settings go through
+`wine reg`. Everything a session starts is ended by its PID (and the prefix's own wineserver).
 """
 import os
 import signal
@@ -12,28 +12,27 @@ import subprocess
 import tempfile
 import time
 
+FIXTURE = os.path.join(os.path.dirname(os.path.abspath(__file__)), "..", "win32", "xvfb-fixture")
+QUIET = dict(stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+
 
 class Window:
     def __init__(self, line):
-        hwnd, cls, caption, visible, iconic, rect = line.split("\t")
-        self.hwnd = int(hwnd)
-        self.cls = cls
-        self.caption = caption
-        self.visible = visible == "1"
-        self.iconic = iconic == "1"
+        hwnd, self.cls, self.caption, visible, iconic, rect = line.split("\t")
+        self.hwnd, self.visible, self.iconic = int(hwnd), visible == "1", iconic == "1"
         self.rect = tuple(int(v) for v in rect.split())
 
     def centre(self):
         left, top, right, bottom = self.rect
         return (left + right) // 2, (top + bottom) // 2
 
-    def __repr__(self):
-        return f"Window({self.caption!r}, visible={self.visible}, iconic={self.iconic}, rect={self.rect})"
+    def size(self):
+        return self.rect[2] - self.rect[0], self.rect[3] - self.rect[1]
 
 
-def _run(args, env, timeout=60):
-    """Runs a Wine command with its output in a file: Wine's services inherit pipes and hold them
-    open, so reading a pipe to its end would wait for them."""
+def run(args, env, timeout=60):
+    """Runs a Wine command with its output in a file (Wine's services inherit pipes and hold them
+    open, so reading a pipe to its end would wait for them): (exit code, output)."""
     with tempfile.TemporaryFile() as out:
         code = subprocess.run(args, env=env, stdin=subprocess.DEVNULL, stdout=out, stderr=subprocess.DEVNULL,
                               timeout=timeout).returncode
@@ -41,97 +40,76 @@ def _run(args, env, timeout=60):
         return code, out.read().decode("latin-1").replace("\r\n", "\n")
 
 
+def wait_for(condition, timeout=15):
+    deadline = time.time() + timeout
+    while time.time() < deadline:
+        value = condition()
+        if value:
+            return value
+        time.sleep(0.3)
+    return condition()
+
+
 class Session:
-    def __init__(self, build_dir, prefix=None, display_base=400):
+    def __init__(self, build_dir, prefix=None):
         self.build = os.path.abspath(build_dir)
+        self.dir = tempfile.mkdtemp(prefix="e2e-display-", dir=self.build)
+        subprocess.run(["sh", FIXTURE, "start", self.dir], check=True, **QUIET)
+        with open(os.path.join(self.dir, "xvfb.env")) as f:
+            fixture = dict(line.strip().split("=", 1) for line in f if "=" in line)
         self.prefix = prefix or os.path.join(self.build, "e2e-wineprefix")
         os.makedirs(self.prefix, exist_ok=True)
-        self.env = dict(os.environ, WINEPREFIX=self.prefix, WINEDEBUG="-all", WINEDLLOVERRIDES="mscoree,mshtml=;winemenubuilder.exe=d")
-        n = display_base
-        while os.path.exists(f"/tmp/.X11-unix/X{n}") or os.path.exists(f"/tmp/.X{n}-lock"):
-            n += 1
-        self.display = f":{n}"
-        self.env["DISPLAY"] = self.display
-        self.xvfb = subprocess.Popen(["Xvfb", self.display, "-screen", "0", "1024x768x24", "-nolisten", "tcp"],
-                                     stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
-        for _ in range(100):
-            if os.path.exists(f"/tmp/.X11-unix/X{n}"):
-                break
-            time.sleep(0.05)
-        subprocess.run(["wineserver", "-p"], env=self.env, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL,
-                       stderr=subprocess.DEVNULL)
-        subprocess.run(["wine", "wineboot"], env=self.env, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL,
-                       stderr=subprocess.DEVNULL)
+        self.env = dict(os.environ, WINEPREFIX=self.prefix, WINEDEBUG="-all",
+                        WINEDLLOVERRIDES="mscoree,mshtml=;winemenubuilder.exe=d", DISPLAY=fixture["DISPLAY"])
+        subprocess.run(["wineserver", "-p"], env=self.env, **QUIET)
+        subprocess.run(["wine", "wineboot"], env=self.env, **QUIET)
         self.program = None
-        self.desktop = None
 
-    # --- the program ---------------------------------------------------------------------------
-    def start(self, exe, desktop="vt"):
-        """Starts `exe` inside a Wine desktop of 1024 x 768; returns the Popen."""
+    def start(self, exe):
+        """Starts `exe` inside a Wine desktop of 1024 x 768, its standard output kept."""
         self.output = tempfile.TemporaryFile()
-        self.program = subprocess.Popen(["wine", "explorer", f"/desktop={desktop},1024x768", exe], env=self.env,
+        self.program = subprocess.Popen(["wine", "explorer", "/desktop=vt,1024x768", exe], env=self.env,
                                         stdin=subprocess.DEVNULL, stdout=self.output, stderr=subprocess.DEVNULL)
-        return self.program
 
-    def program_output(self):
-        """What the program has written to its standard output so far."""
+    def said(self):
         self.output.seek(0)
         return self.output.read().decode("latin-1").replace("\r\n", "\n")
 
     def run(self, exe, timeout=60):
         """Runs a second program in the same prefix and waits for it: (exit code, output)."""
-        return _run(["wine", exe], self.env, timeout)
+        return run(["wine", exe], self.env, timeout)
 
     def run_in_desktop(self, command_line, timeout=120):
         """Runs a Windows command line inside the program's Wine desktop and waits for it: its exit code."""
-        return _run(["wine", os.path.join(self.build, "vtprobe.exe"), "run", command_line], self.env, timeout)[0]
+        return run(["wine", os.path.join(self.build, "vtprobe.exe"), "run", command_line], self.env, timeout)[0]
 
     def probe(self, *args):
-        return _run(["wine", os.path.join(self.build, "vtprobe.exe"), *[str(a) for a in args]], self.env)[1]
+        return run(["wine", os.path.join(self.build, "vtprobe.exe"), *[str(a) for a in args]], self.env)[1]
 
-    def windows(self):
-        return [Window(line) for line in self.probe("windows").splitlines() if line.count("\t") == 5]
-
-    def controls(self, window):
-        return [Window(line) for line in self.probe("controls", window.hwnd).splitlines() if line.count("\t") == 5]
+    def windows(self, parent=None):
+        out = self.probe("windows") if parent is None else self.probe("controls", parent.hwnd)
+        return [Window(line) for line in out.splitlines() if line.count("\t") == 5]
 
     def find(self, predicate, timeout=30):
         """The first top-level window for which predicate(window) holds, waiting up to `timeout`."""
-        deadline = time.time() + timeout
-        while True:
-            for w in self.windows():
-                if predicate(w):
-                    return w
-            if time.time() > deadline:
-                return None
-            time.sleep(0.3)
+        return wait_for(lambda: next((w for w in self.windows() if predicate(w)), None), timeout)
 
     def post(self, window, message, wparam=0, lparam=0):
         self.probe("post", window.hwnd, message, wparam, lparam)
 
-    # --- the user ------------------------------------------------------------------------------
+    def xdotool(self, *args):
+        subprocess.run(["xdotool", *[str(a) for a in args]], env=self.env, check=False)
+
     def click(self, x, y):
-        """A real left click at screen coordinates of the Wine desktop."""
-        subprocess.run(["xdotool", "mousemove", str(x), str(y), "click", "1"], env=self.env, check=False)
-
-    def move(self, x, y):
-        """Moves the real pointer to screen coordinates of the Wine desktop."""
-        subprocess.run(["xdotool", "mousemove", str(x), str(y)], env=self.env, check=False)
-
-    def key(self, *keys):
-        subprocess.run(["xdotool", "key", *keys], env=self.env, check=False)
+        self.xdotool("mousemove", x, y, "click", 1)
 
     def screenshot(self, path):
-        subprocess.run(["import", "-window", "root", path], env=self.env, check=False,
-                       stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+        subprocess.run(["import", "-window", "root", path], env=self.env, check=False, **QUIET)
 
-    # --- settings ------------------------------------------------------------------------------
     def reg_query(self, key, value):
         """The data of a REG_SZ value, or None when it is missing."""
-        code, out = _run(["wine", "reg", "query", key, "/v", value], self.env)
-        if code != 0:
-            return None
-        for line in out.splitlines():
+        code, out = run(["wine", "reg", "query", key, "/v", value], self.env)
+        for line in out.splitlines() if code == 0 else []:
             parts = line.strip().split(None, 2)
             if len(parts) >= 2 and parts[0].lower() == value.lower() and parts[1].startswith("REG_"):
                 return parts[2] if len(parts) == 3 else ""
@@ -140,7 +118,7 @@ class Session:
     def reg_values(self, key):
         """Every value (names without blanks) of a key as {name: data}, REG_DWORD data as an int; None
         when the key is missing."""
-        code, out = _run(["wine", "reg", "query", key], self.env)
+        code, out = run(["wine", "reg", "query", key], self.env)
         if code != 0:
             return None
         values = {}
@@ -151,48 +129,27 @@ class Session:
                 values[parts[0]] = int(data, 16) if parts[1] == "REG_DWORD" else data
         return values
 
+    def reg(self, *args):
+        run(["wine", "reg", *args, "/f"], self.env)
+
     def reg_add(self, key, value, data):
-        _run(["wine", "reg", "add", key, "/v", value, "/t", "REG_SZ", "/d", data, "/f"], self.env)
-
-    def reg_delete_key(self, key):
-        _run(["wine", "reg", "delete", key, "/f"], self.env)
-
-    # --- the end -------------------------------------------------------------------------------
-    def wait_exit(self, timeout=30):
-        if self.program is None:
-            return True
-        try:
-            self.program.wait(timeout=timeout)
-            return True
-        except subprocess.TimeoutExpired:
-            return False
+        self.reg("add", key, "/v", value, "/t", "REG_SZ", "/d", data)
 
     def close_program(self):
         """Ends the program under test (by its PID) and every Windows process of the prefix."""
         if self.program is not None and self.program.poll() is None:
             self.program.send_signal(signal.SIGTERM)
-        _run(["wineserver", "-k"], self.env)
+        run(["wineserver", "-k"], self.env)
         if self.program is not None:
             try:
                 self.program.wait(timeout=10)
             except subprocess.TimeoutExpired:
                 self.program.kill()
         self.program = None
-        subprocess.run(["wineserver", "-p"], env=self.env, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL,
-                       stderr=subprocess.DEVNULL)
+        subprocess.run(["wineserver", "-p"], env=self.env, **QUIET)
 
     def close(self):
-        if self.program is not None and self.program.poll() is None:
-            self.program.send_signal(signal.SIGTERM)
-        subprocess.run(["wineserver", "-k"], env=self.env, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL,
-                       stderr=subprocess.DEVNULL)
-        if self.program is not None:
-            try:
-                self.program.wait(timeout=10)
-            except subprocess.TimeoutExpired:
-                self.program.kill()
-        self.xvfb.terminate()
-        try:
-            self.xvfb.wait(timeout=10)
-        except subprocess.TimeoutExpired:
-            self.xvfb.kill()
+        self.close_program()
+        run(["wineserver", "-k"], self.env)
+        subprocess.run(["sh", FIXTURE, "stop", self.dir], **QUIET)
+        os.rmdir(self.dir)

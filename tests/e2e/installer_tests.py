@@ -73,7 +73,7 @@ def setUpModule():
     global SESSION
     prefix = os.path.join(BUILD, "installer-wineprefix")
     shutil.rmtree(prefix, ignore_errors=True)
-    SESSION = harness.Session(BUILD, prefix=prefix, display_base=450)
+    SESSION = harness.Session(BUILD, prefix=prefix)
 
 
 def tearDownModule():
@@ -139,7 +139,7 @@ class Setup(unittest.TestCase):
         self.assertIsNotNone(SESSION.find(is_main, timeout=30), "the program runs")
         task = os.path.join(BUILD, "installer-task.xml")
         write(task, TASK.encode())
-        harness._run(["wine", "schtasks", "/create", "/xml", "Z:" + task.replace("/", "\\"), "/tn", "Vantorel", "/f"],
+        harness.run(["wine", "schtasks", "/create", "/xml", "Z:" + task.replace("/", "\\"), "/tn", "Vantorel", "/f"],
                      SESSION.env)
         self.assertTrue(os.path.exists(unix(r"C:\windows\system32\tasks\Vantorel")))
         for root in ("HKLM", "HKCU"):

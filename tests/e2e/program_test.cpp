@@ -1,6 +1,7 @@
-// Black-box tests of vantorel.exe under Wine on a virtual display: a copy of the program runs in a
-// folder of its own with its own definitions file, and the tests watch its windows, its standard
-// output and the registry.
+// Black-box tests of vantorel.exe under Wine against an update server that stalls, trickles or
+// serves a new list: a copy of the program runs in a folder of its own with its own definitions
+// file, and the tests watch its windows, its standard output and its files. The user's journeys
+// (first start, clicks, tray, a second instance) are tests/e2e/e2e_tests.py.
 #include <winsock2.h>
 #include <windows.h>
 
@@ -20,7 +21,6 @@ namespace vantorel {
 namespace {
 
 using testing::DeleteSettings;
-using testing::ReadSetting;
 using testing::WriteSetting;
 
 // A copy of vantorel.exe in a folder of its own, with its own definitions file.
@@ -99,76 +99,6 @@ private:
     PROCESS_INFORMATION process_{};
     std::string says_;
 };
-
-int CountMainWindows() {
-    int count = 0;
-    HWND found = nullptr;
-    while ((found = ::FindWindowExA(nullptr, found, "VantorelFrmMain", nullptr)) != nullptr) ++count;
-    return count;
-}
-
-TEST(SingleInstanceWin32, SecondStartOfTheProgramEndsSilently) {
-    ProgramCopy copy("vantorel-instance-test", "-939524086\r\n67305985");
-    DeleteSettings();
-    Started first(copy.exe);
-    ASSERT_TRUE(first.Ok());
-    ASSERT_TRUE(first.WaitToSay(std::regex("Started"))) << "start-up is over when the program reports it";
-    ASSERT_EQ(CountMainWindows(), 1) << "the first start shows its window";
-    WriteSetting(HKEY_CURRENT_USER, "State", "1");  // a second start that read it would write it back
-
-    Started second(copy.exe);
-    ASSERT_TRUE(second.Ok());
-    EXPECT_EQ(second.Wait(), 0);
-    EXPECT_EQ(second.Says(), "") << "nothing shown or said";
-    EXPECT_EQ(CountMainWindows(), 1);
-    EXPECT_EQ(ReadSetting(HKEY_CURRENT_USER, "State"), "1");
-
-    ::PostMessageA(::FindWindowA("VantorelFrmMain", nullptr), WM_CLOSE, 0, 0);
-    EXPECT_EQ(first.Wait(), 0) << "closing the window ends the program";
-    DeleteSettings();
-}
-
-TEST(ProgramWin32, SweepsAListedConnectionAndShowsTheCount) {
-    ProgramCopy copy("vantorel-program-test", "-939524086\r\n33554559");  // 127.0.0.2 is listed
-    DeleteSettings();
-    WriteSetting(HKEY_CURRENT_USER, "State", "1");
-
-    WSADATA wsa;
-    ::WSAStartup(MAKEWORD(2, 2), &wsa);
-    SOCKET listener = ::socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_addr.s_addr = htonl(0x7F000002);
-    ASSERT_EQ(::bind(listener, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
-    ::listen(listener, 4);
-    int length = sizeof address;
-    ::getsockname(listener, reinterpret_cast<sockaddr*>(&address), &length);
-    SOCKET client = ::socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
-    ASSERT_EQ(::connect(client, reinterpret_cast<sockaddr*>(&address), sizeof address), 0);
-    SOCKET server = ::accept(listener, nullptr, nullptr);
-
-    // Under Wine SetTcpEntry answers success without closing anything, so the connection is
-    // counted again on every sweep: the count climbs while the program runs.
-    Started program(copy.exe);
-    ASSERT_TRUE(program.Ok());
-    EXPECT_TRUE(program.WaitToSay(std::regex("Caption: Vantorel - [1-9][0-9]* attempts intercepted")))
-        << "the sweep writes the count without a blank\n" << program.Says();
-    EXPECT_NE(program.Says().find("guard on"), std::string::npos) << program.Says();
-    HWND window = ::FindWindowA("VantorelFrmMain", nullptr);
-    ASSERT_NE(window, nullptr);
-    char caption[128] = {};
-    ::GetWindowTextA(window, caption, sizeof caption);
-    EXPECT_EQ(std::string(caption).rfind("Vantorel - ", 0), 0u) << caption;
-    EXPECT_GE(std::atoi(ReadSetting(HKEY_CURRENT_USER, "Attempts").c_str()), 1) << "the count is stored";
-
-    ::PostMessageA(window, WM_CLOSE, 0, 0);
-    EXPECT_EQ(program.Wait(), 0);
-    ::closesocket(server);
-    ::closesocket(client);
-    ::closesocket(listener);
-    ::WSACleanup();
-    DeleteSettings();
-}
 
 // The update server: the scriptable server on 127.0.0.1 (tests/servers/http_test_server.py), whose
 // files under /vt/ can be made to misbehave.

@@ -7,7 +7,6 @@
 //   vtprobe controls HWND           the child windows of HWND, same columns, screen coordinates
 //   vtprobe post HWND MSG WPARAM LPARAM
 //                                   posts a message (numbers in decimal or 0x hex)
-//   vtprobe icon HWND               the handle of the window's small and big icon
 //   vtprobe run "COMMAND LINE"      runs a program in the desktop, waits for it and exits with its code
 //   vtprobe hold NAME MS            holds the named mutex NAME for MS milliseconds ("held" once it does)
 #include <windows.h>
@@ -62,10 +61,6 @@ int main(int argc, char** argv) {
         WPARAM wParam = static_cast<WPARAM>(std::strtoull(argv[4], nullptr, 0));
         LPARAM lParam = static_cast<LPARAM>(std::strtoll(argv[5], nullptr, 0));
         return ::PostMessageA(ToHwnd(argv[2]), message, wParam, lParam) ? 0 : 1;
-    } else if (command == "icon" && argc > 2) {
-        HWND hwnd = ToHwnd(argv[2]);
-        std::printf("%lld\t%lld\n", static_cast<long long>(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0)),
-                    static_cast<long long>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0)));
     } else if (command == "run" && argc > 2) {
         std::string line = argv[2];
         STARTUPINFOA startup{};
@@ -90,7 +85,7 @@ int main(int argc, char** argv) {
         ::Sleep(static_cast<DWORD>(std::strtoul(argv[3], nullptr, 10)));
         ::CloseHandle(mutex);
     } else {
-        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | icon HWND | run \"COMMAND LINE\" | hold NAME MS\n");
+        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | run \"COMMAND LINE\" | hold NAME MS\n");
         return 2;
     }
     std::fflush(stdout);

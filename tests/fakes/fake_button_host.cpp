@@ -16,7 +16,6 @@ platform::Rgb FakeButtonHost::SystemColour(int index) const {
 }
 
 bool FakeButtonHost::CaptureParentPixels(std::int32_t w, std::int32_t h, std::vector<std::uint8_t>& pixels) {
-    ++backgroundCaptures;
     if (duringCapture) duringCapture();
     const std::int32_t stride = platform::DibStride(w);
     pixels.assign(static_cast<std::size_t>(stride) * h, 0);
@@ -36,7 +35,6 @@ MemoryPicture::MemoryPicture(platform::PictureKind kind, std::int32_t w, std::in
       pixels_(std::move(pixels)), transparent_(std::move(transparent)) {}
 
 bool MemoryPicture::Render(std::int32_t w, std::int32_t h, platform::Rgb fill, std::vector<std::uint8_t>& out) const {
-    ++renders;
     const std::int32_t stride = platform::DibStride(w);
     out.assign(static_cast<std::size_t>(stride) * h, 0);
     for (std::int32_t y = 0; y < h; ++y)

@@ -27,9 +27,9 @@ public:
     }
     void SetShape(const platform::WindowShape& value) override {
         shape = value;
-        ++shapesSet;
+        shapeHeld = true;
     }
-    void ReleaseShape() override { ++shapesReleased; }
+    void ReleaseShape() override { shapeHeld = false; }
     bool PointerOverSelf() const override { return pointerOver; }
     void StartOverTimer(std::int32_t ms) override {
         timerRunning = true;
@@ -37,9 +37,9 @@ public:
     }
     void StopOverTimer() override { timerRunning = false; }
     void SendKeys(const std::string& keys) override { sentKeys.push_back(keys); }
-    void CaptureMouse() override { ++captures; }
-    void Present() override { ++presents; }
-    void SetAccessKey(char key) override { accessKey = key; }
+    void CaptureMouse() override {}
+    void Present() override {}
+    void SetAccessKey(char) override {}
     std::int32_t ScreenDpi() const override { return dpi; }
     bool DesignMode() const override { return designMode; }
     bool IsDefault() const override { return isDefault; }
@@ -58,15 +58,11 @@ public:
     bool refuseMouseIcon = false;
     platform::PicturePtr mouseIcon;
     platform::WindowShape shape;
-    int shapesSet = 0;
-    int shapesReleased = 0;
+    bool shapeHeld = false;
     bool pointerOver = false;
     bool timerRunning = false;
     std::int32_t timerPeriod = 0;
     std::vector<std::string> sentKeys;
-    int captures = 0;
-    int presents = 0;
-    char accessKey = 0;
     std::int32_t dpi = 96;
     bool designMode = false;
     bool isDefault = false;
@@ -75,7 +71,6 @@ public:
     platform::Rgb parentBack = 0x00FFEEDD;
     platform::Rgb parentText = 0x00112233;
     platform::Rgb parentPixel = 0x00336699;
-    int backgroundCaptures = 0;
     // Runs inside CaptureParentPixels, as pending window messages would.
     std::function<void()> duringCapture;
     std::map<int, platform::Rgb> systemColours;
@@ -95,7 +90,6 @@ public:
         himetricW_ = w;
         himetricH_ = h;
     }
-    mutable int renders = 0;
 
 private:
     platform::PictureKind kind_;

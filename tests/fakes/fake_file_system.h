@@ -32,7 +32,6 @@ public:
     std::string lastFreeSpaceRoot;
     std::optional<platform::FileError> createFolderFails, createFails, writeFails, closeFails, replaceFails;
     std::size_t writeFailsAt = 0;  // a write fails once the file would grow beyond this size
-    int writes = 0;
 
     bool FileExists(const std::string& path) override { return files.count(path) != 0; }
     bool FolderExists(const std::string& path) override { return folders.count(Trim(path)) != 0; }
@@ -97,7 +96,6 @@ private:
     public:
         Writer(FakeFileSystem& owner, std::string path) : owner_(owner), path_(std::move(path)) {}
         bool Write(const std::string& data, platform::FileError& error) override {
-            ++owner_.writes;
             std::string& content = owner_.files.at(path_);
             if (owner_.writeFails && content.size() + data.size() > owner_.writeFailsAt) {
                 error = *owner_.writeFails;

@@ -1,6 +1,6 @@
-// Hand-written fakes of the platform pieces the guard, the sweep and the tray routines use: a
-// scripted connection table, a notification area and window manager that record their calls, a
-// window, the switch, timers, a message pump with a hook, and the instance test.
+// Fakes of the platform pieces the guard, the sweep and the tray routines use: a scripted
+// connection table, a notification area and window manager that record their calls, a window, the
+// switch, timers and the instance test.
 #pragma once
 
 #include <cstring>
@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "fakes/fake_message_pump.h"
 #include "guard/guard_view.h"
 #include "platform/connection_table.h"
 #include "platform/notify_area.h"
@@ -37,7 +38,6 @@ public:
 class FakeConnectionTable final : public platform::ConnectionTable {
 public:
     std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool order) override {
-        ++fetches;
         lastOrder = order;
         if (beforeFetch) beforeFetch();
         if (failWith != platform::kNoError) return failWith;
@@ -49,34 +49,20 @@ public:
         auto count = static_cast<std::uint32_t>(rows.size()) + overstateCount;
         std::memcpy(table, &count, 4);
         if (!rows.empty()) std::memcpy(static_cast<char*>(table) + 4, rows.data(), rows.size() * sizeof(rows[0]));
-        fetchedBytes.push_back(size);
         return platform::kNoError;
     }
 
     std::uint32_t SetTcpEntry(const platform::TcpRow& row) override {
         entries.push_back(row);
-        if (teardownResult == platform::kNoError && removeOnTeardown) {
-            for (auto it = rows.begin(); it != rows.end(); ++it) {
-                if (it->remoteAddr == row.remoteAddr && it->remotePort == row.remotePort &&
-                    it->localAddr == row.localAddr && it->localPort == row.localPort) {
-                    rows.erase(it);
-                    break;
-                }
-            }
-        }
-        return teardownResult;
+        return platform::kNoError;
     }
 
     std::vector<platform::TcpRow> rows;
     std::uint32_t failWith = platform::kNoError;
-    std::uint32_t teardownResult = platform::kNoError;
-    bool removeOnTeardown = false;
     std::uint32_t overstateCount = 0;  // a count larger than the rows written
     std::function<void()> beforeFetch;
 
-    int fetches = 0;
     bool lastOrder = true;
-    std::vector<std::uint32_t> fetchedBytes;  // buffer size of each successful fetch
     std::vector<platform::TcpRow> entries;    // every SetTcpEntry call
 };
 
@@ -88,9 +74,11 @@ public:
     };
     bool ShellNotifyIcon(std::uint32_t message, const platform::NotifyIconData& data) override {
         calls.push_back({message, data});
+        if (events != nullptr) events->push_back("Tray " + std::to_string(message));
         return true;
     }
     std::vector<Call> calls;
+    std::vector<std::string>* events = nullptr;  // when set, each call is noted there too
 };
 
 class FakeWindow final : public platform::Window {
@@ -153,51 +141,15 @@ public:
     bool enabled = false;
 };
 
-class FakePump final : public platform::MessagePump {
-public:
-    bool PumpMessages() override {
-        ++pumps;
-        if (onPump) onPump();
-        return !quitting;
-    }
-    // A tick the pump takes from the queue itself (a modal window's loop runs `tick` directly).
-    void OwnTick(const std::function<void()>& tick) {
-        bool was = ownTick;
-        ownTick = true;
-        tick();
-        ownTick = was;
-    }
-    bool InOwnTimerTick() const override { return ownTick; }
-    std::function<void()> onPump;
-    bool quitting = false;
-    bool ownTick = false;
-    int pumps = 0;
-};
-
 class FakeWindowManager final : public platform::WindowManager {
 public:
-    struct Call {
-        platform::WindowHandle window, insertAfter;
-        std::int32_t x, y, cx, cy;
-        std::uint32_t flags;
-    };
-    bool SetWindowPos(platform::WindowHandle window, platform::WindowHandle insertAfter, std::int32_t x, std::int32_t y,
-                      std::int32_t cx, std::int32_t cy, std::uint32_t flags) override {
-        calls.push_back({window, insertAfter, x, y, cx, cy, flags});
-        if (onSetWindowPos) onSetWindowPos(flags);
+    bool SetWindowPos(platform::WindowHandle, platform::WindowHandle, std::int32_t, std::int32_t, std::int32_t,
+                      std::int32_t, std::uint32_t) override {
         return true;
     }
-    std::int32_t ScreenWidth() const override { return screenWidth; }
-    std::int32_t ScreenHeight() const override { return screenHeight; }
-    bool DeleteSystemMenuCommand(platform::WindowHandle window, std::uint32_t command) override {
-        deletedCommands.push_back({window, command});
-        return true;
-    }
-
-    std::vector<std::pair<platform::WindowHandle, std::uint32_t>> deletedCommands;
-    std::vector<Call> calls;
-    std::function<void(std::uint32_t)> onSetWindowPos;
-    std::int32_t screenWidth = 1024, screenHeight = 768;
+    std::int32_t ScreenWidth() const override { return 1024; }
+    std::int32_t ScreenHeight() const override { return 768; }
+    bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t) override { return true; }
 };
 
 class FakeInstance final : public platform::Instance {

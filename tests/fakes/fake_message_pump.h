@@ -1,5 +1,6 @@
-// A message pump that counts its calls and runs a scripted "user action" on each, as a click
-// handled in the middle of long work would.
+// The message pump of every native test: it runs a scripted "user action" each time the code under
+// test lets messages run (a click or a tick handled in the middle of long work), and can be told
+// that the program is quitting.
 #pragma once
 
 #include <functional>
@@ -8,16 +9,25 @@
 
 namespace vantorel::testing {
 
-class FakeMessagePump final : public platform::MessagePump {
+class FakePump final : public platform::MessagePump {
 public:
-    int pumps = 0;
-    std::function<void(int pump)> onPump;
-
     bool PumpMessages() override {
         ++pumps;
-        if (onPump) onPump(pumps);
-        return true;
+        if (onPump) onPump();
+        return !quitting;
     }
+    // A tick the pump takes from the queue itself (a modal window's loop runs `tick` directly).
+    void OwnTick(const std::function<void()>& tick) {
+        bool was = ownTick;
+        ownTick = true;
+        tick();
+        ownTick = was;
+    }
+    bool InOwnTimerTick() const override { return ownTick; }
+    std::function<void()> onPump;
+    bool quitting = false;
+    bool ownTick = false;
+    int pumps = 0;
 };
 
 }  // namespace vantorel::testing

@@ -51,15 +51,9 @@ public:
     explicit FakeCheckBox(std::string caption = {}) : caption_(std::move(caption)) {}
     void SetCaption(const std::string& caption) override { caption_ = caption; }
     std::string Caption() const override { return caption_; }
-    void SetValue(bool checked) override {
-        bool changed = checked_ != checked;
-        checked_ = checked;
-        if (changed && clickOnSet_ && Click) Click();
-    }
+    void SetValue(bool checked) override { checked_ = checked; }
     bool Value() const override { return checked_; }
-    // Some check boxes raise their click when code changes the state; this one can be told to.
-    void RaiseClickWhenSet(bool raise) { clickOnSet_ = raise; }
-    // The user toggles the box: the state changes, then the click.
+    // The user's click: the box toggles, then raises its click.
     void UserToggle() {
         checked_ = !checked_;
         if (Click) Click();
@@ -68,7 +62,6 @@ public:
 private:
     std::string caption_;
     bool checked_ = false;
-    bool clickOnSet_ = false;
 };
 
 }  // namespace vantorel::testing

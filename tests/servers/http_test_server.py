@@ -12,7 +12,6 @@ so a test can check every byte it received:
   /nolength/N        N bytes without a Content-Length, ended by closing the connection
   /length/TEXT/N     Content-Length: TEXT (any text), then N bytes and a close
   /slow/N/MS[/PIECE] N bytes in pieces of PIECE (1024) bytes with a pause of MS milliseconds before each
-  /files/NAME        the file NAME from the --root folder, 404 when missing
   /stall/MS          answers 200 with 10 bytes only after MS milliseconds
   /noanswer          accepts the request and never answers
   /trickle/N/MS      announces N bytes and sends one byte every MS milliseconds
@@ -48,7 +47,6 @@ def body(size):
 
 class Handler(BaseHTTPRequestHandler):
     protocol_version = "HTTP/1.1"
-    root = "."
 
     def log_message(self, fmt, *args):
         sys.stderr.write("%s %s\n" % (self.requestline, fmt % args))
@@ -148,13 +146,6 @@ class Handler(BaseHTTPRequestHandler):
             elif kind == "stall":
                 time.sleep(int(args[0]) / 1000.0)
                 self.answer(200, body(10))
-            elif kind == "files":
-                path = os.path.join(self.root, os.path.basename("/".join(args)))
-                if os.path.isfile(path):
-                    with open(path, "rb") as f:
-                        self.answer(200, f.read())
-                else:
-                    self.answer(404, b"not found")
             else:
                 self.answer(404, b"not found")
         except (BrokenPipeError, ConnectionResetError):
@@ -164,10 +155,8 @@ class Handler(BaseHTTPRequestHandler):
 def main():
     parser = argparse.ArgumentParser()
     parser.add_argument("--port-file", required=True)
-    parser.add_argument("--root", default=".")
     parser.add_argument("--tls", nargs=2, metavar=("CERT", "KEY"), help="serve https with this certificate")
     options = parser.parse_args()
-    Handler.root = options.root
     server = ThreadingHTTPServer(("127.0.0.1", 0), Handler)
     if options.tls:
         import ssl

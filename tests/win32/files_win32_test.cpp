@@ -1,5 +1,5 @@
-// The definitions file read through the Windows file calls under Wine: a real file in a scratch
-// folder, the existence test, the missing-file seam.
+// A definitions file that is there but cannot be used, through the Windows file calls under Wine:
+// a folder of that name, a file locked without read sharing, a file over the size limit.
 #include <windows.h>
 
 #include <gtest/gtest.h>
@@ -39,32 +39,6 @@ void WriteFile(const std::string& path, const std::string& content) {
     ASSERT_EQ(written, content.size());
 }
 
-TEST(Win32Files, LoadsDefinitionsFromARealFile) {
-    ScratchFolder folder;
-    win32::Win32Files files;
-    const std::string path = DefinitionsPath(folder.path());
-    int missing = 0;
-    DefinitionList list;
-    EXPECT_FALSE(LoadDefinitions(path, files, [&] { ++missing; }, list));
-    EXPECT_EQ(missing, 1) << "a missing file asks for help once";
-
-    // 1.2.3.4 and 10.0.0.200, sorted as text, with a final line break.
-    std::string content = "-939524086\r\n67305985\r\n";
-    content += std::string(1, '\0');  // stray bytes after the last break hold no number: no key
-    WriteFile(path, content);
-    ASSERT_TRUE(files.Exists(path));
-    ASSERT_TRUE(LoadDefinitions(path, files, [&] { ++missing; }, list));
-    EXPECT_EQ(missing, 1);
-    EXPECT_EQ(list.size(), 2u);
-    EXPECT_EQ(FindDefinition(list, std::int32_t{0x04030201}), 1);
-    EXPECT_EQ(FindDefinition(list, static_cast<std::int32_t>(0xC800000Au)), 0);
-    EXPECT_EQ(FindDefinition(list, std::int32_t{0}), kNoDefinition);
-
-    std::string unchanged = "kept";
-    EXPECT_FALSE(files.ReadAll(folder.path() + "\\absent.def", unchanged));
-    EXPECT_EQ(unchanged, "kept") << "a failed read leaves the text as it was";
-}
-
 TEST(Win32Files, ADefinitionsFileThatCannotBeUsedIsAskedForLikeAMissingOne) {
     ScratchFolder folder;
     win32::Win32Files files;
@@ -95,14 +69,6 @@ TEST(Win32Files, ADefinitionsFileThatCannotBeUsedIsAskedForLikeAMissingOne) {
     attempt("a file over 256 MB");
     EXPECT_EQ(files.ReadableSize(path), kMaxDefinitionsBytes + 1);
     EXPECT_FALSE(DefinitionsUsable(path, files));
-}
-
-TEST(Win32Files, ProgramFolderIsTheExecutablesFolder) {
-    std::string folder = win32::ProgramFolder();
-    char module[MAX_PATH];
-    ::GetModuleFileNameA(nullptr, module, MAX_PATH);
-    EXPECT_EQ(std::string(module).rfind(folder + "\\", 0), 0u);
-    EXPECT_NE(folder.back(), '\\');
 }
 
 }  // namespace

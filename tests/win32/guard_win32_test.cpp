@@ -1,46 +1,34 @@
 // The guard's window side under Wine on a virtual display: the tray routines against Wine's shell,
-// BringToFront and the icon's mouse notifications on a real window, the sweep's yield, and start-up
-// on the real registry with real clicks on the switch.
+// BringToFront and the icon's mouse notifications on a real window, and the sweep's yield. Start-up
+// and clicks on the switch of the real program are proved end to end (tests/e2e/).
 #include <windows.h>
 
 #include <gtest/gtest.h>
 
 
-#include <fstream>
 #include <string>
 #include <vector>
 
-#include "fakes/fake_guard_platform.h"
 #include "guard/attempts.h"
-#include "guard/guard.h"
-#include "platform/win32/connection_table_win32.h"
-#include "platform/win32/files_win32.h"
-#include "win32/vantorel_settings.h"
 #include "app/main_window.h"
-#include "platform/win32/registry_win32.h"
 #include "platform/win32/shell_win32.h"
 #include "ui/main/tray.h"
 
 namespace vantorel {
 namespace {
 
-using testing::DeleteSettings;
-using testing::ReadSetting;
-using testing::WriteSetting;
-
-using namespace vantorel::testing;
-
-// The shell, noting each call's answer.
+// The shell, noting each call's answer and the tip it was given.
 class NotingNotifyArea final : public platform::NotifyArea {
 public:
     bool ShellNotifyIcon(std::uint32_t message, const platform::NotifyIconData& data) override {
         bool ok = real.ShellNotifyIcon(message, data);
-        calls.push_back({message, ok});
+        calls.push_back({message, ok, data.tip});
         return ok;
     }
     struct Call {
         std::uint32_t message;
         bool ok;
+        std::string tip;
     };
     win32::Win32NotifyArea real;
     std::vector<Call> calls;
@@ -62,6 +50,7 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     RemoveTrayIcon(tray, window);
     ASSERT_EQ(tray.calls.size(), 4u);
     for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
+    EXPECT_EQ(tray.calls[2].tip, std::string(63, 'x')) << "the tip handed to the shell fits its 64-byte field";
 
     // A restarted taskbar announces itself with the registered message: the icon is added again.
     ASSERT_NE(window.TaskbarCreatedMessage(), 0u);
@@ -129,114 +118,6 @@ TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     MSG quit;
     ASSERT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE));
     EXPECT_EQ(quit.wParam, 7u);
-}
-
-class StartUpWin32 : public ::testing::Test {
-protected:
-    void SetUp() override {
-        DeleteSettings();
-        char temp[MAX_PATH];
-        ::GetTempPathA(MAX_PATH, temp);
-        folder_ = std::string(temp) + "vantorel-startup-test";
-        ::CreateDirectoryA(folder_.c_str(), nullptr);
-        std::ofstream(folder_ + "\\sw2.def", std::ios::binary) << "-939524086\r\n33554559";
-    }
-    void TearDown() override {
-        ::DeleteFileA((folder_ + "\\sw2.def").c_str());
-        ::RemoveDirectoryA(folder_.c_str());
-        DeleteSettings();
-    }
-
-    struct Program {
-        win32::Win32Registry registry;
-        win32::Win32Files files;
-        win32::Win32ConnectionTable table;
-        NotingNotifyArea tray;
-        win32::Win32WindowManager windows;
-        win32::Win32MessagePump pump;
-        win32::Win32Instance instance{"Vantorel.StartUpTest"};
-        win32::MainWindow frmMain;
-        win32::Win32Shell shell;
-        struct : platform::Application {
-            void ShowOptionsModal(platform::WindowHandle, int) override {}
-            void EndProgram() override {}
-        } application;
-        FrmMain form;
-        explicit Program(const std::string& folder)
-            : form(FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, shell,
-                                   application},
-                   frmMain.Controls(), folder) {}
-        void Start() {
-            // Windows of earlier tests on this thread posted their quit message when destroyed.
-            MSG stale;
-            while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {
-            }
-            ASSERT_TRUE(form.Initialize());
-            win32::MainWindowHandlers handlers;
-            handlers.switchClick = [this] { form.BtnOnOffClick(); };
-            handlers.tmrTick = [this] { form.TmrTick(); };
-            handlers.unload = [this] { form.Unload(); };
-            ASSERT_TRUE(frmMain.Create(::GetModuleHandleA(nullptr), handlers));
-            form.Load();
-        }
-    };
-
-    std::string folder_;
-};
-
-TEST_F(StartUpWin32, FirstStartOnAnEmptyRegistryThenTwoClicks) {
-    Program program(folder_);
-    program.Start();
-    EXPECT_EQ(Definitions.size(), 2u);
-    EXPECT_TRUE(program.frmMain.Visible());
-    EXPECT_EQ(program.frmMain.Caption(), "Vantorel -  0 attempts intercepted");
-    EXPECT_EQ(program.frmMain.BtnOnOff().Caption(), "OFF");
-    EXPECT_EQ(ReadSetting(HKEY_CURRENT_USER, "State"), "0");
-    EXPECT_FALSE(program.frmMain.Tmr().Enabled());
-    EXPECT_TRUE(program.frmMain.Timer().Enabled());
-    ASSERT_EQ(program.tray.calls.size(), 1u);
-    EXPECT_TRUE(program.tray.calls[0].ok) << "the icon was added";
-
-    // The window is centred on the screen.
-    RECT r;
-    ::GetWindowRect(program.frmMain.hwnd(), &r);
-    EXPECT_EQ(r.left, (::GetSystemMetrics(SM_CXSCREEN) - (r.right - r.left)) / 2);
-    EXPECT_EQ(r.top, (::GetSystemMetrics(SM_CYSCREEN) - (r.bottom - r.top)) / 2);
-
-    // Clicks on the real button: on, then off again.
-    HWND button = program.frmMain.BtnOnOff().Handle();
-    ::SendMessageA(button, BM_CLICK, 0, 0);
-    EXPECT_EQ(program.frmMain.BtnOnOff().Caption(), "ON");
-    EXPECT_EQ(program.frmMain.BtnOnOff().BackColor(), 65280u);
-    EXPECT_EQ(ReadSetting(HKEY_CURRENT_USER, "State"), "1");
-    EXPECT_TRUE(program.frmMain.Tmr().Enabled());
-
-    // While on, the sweep timer really ticks and sweeps.
-    DWORD until = ::GetTickCount() + 2000;
-    while (program.form.guard().SweepsRun() < 3 && ::GetTickCount() < until) {
-        ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
-        program.pump.PumpMessages();
-    }
-    EXPECT_GE(program.form.guard().SweepsRun(), 3u);
-
-    ::SendMessageA(button, BM_CLICK, 0, 0);
-    EXPECT_EQ(program.frmMain.BtnOnOff().Caption(), "OFF");
-    EXPECT_EQ(program.frmMain.BtnOnOff().BackColor(), 192u);
-    EXPECT_EQ(ReadSetting(HKEY_CURRENT_USER, "State"), "0");
-    EXPECT_FALSE(program.frmMain.Tmr().Enabled());
-}
-
-TEST_F(StartUpWin32, StoredStateSevenComesUpOnAndIsRewritten) {
-    WriteSetting(HKEY_CURRENT_USER, "State", "7");
-    WriteSetting(HKEY_CURRENT_USER, "Attempts", "abc");
-    WriteSetting(HKEY_LOCAL_MACHINE, "Tray", "1");
-    Program program(folder_);
-    program.Start();
-    EXPECT_EQ(program.frmMain.BtnOnOff().Caption(), "ON");
-    EXPECT_TRUE(program.frmMain.Tmr().Enabled());
-    EXPECT_EQ(ReadSetting(HKEY_CURRENT_USER, "State"), "1");
-    EXPECT_EQ(program.frmMain.Caption(), "Vantorel -  0 attempts intercepted") << "a count that is no number is 0";
-    EXPECT_FALSE(program.frmMain.Visible()) << "started hidden in the tray";
 }
 
 }  // namespace
