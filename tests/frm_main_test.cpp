@@ -102,7 +102,7 @@ struct MainRig {
         form.Load();
     }
     void ClickSwitch() {
-        btnOnOff.Value(!btnOnOff.Value());  // the button flips itself first
+        btnOnOff.SetValue(!btnOnOff.Value());  // the button flips itself first
         form.BtnOnOffClick();
     }
     std::string Switch() const {

@@ -65,12 +65,12 @@ void Win32Timer::Apply() {
     else ::KillTimer(hwnd_, id_);
 }
 
-void Win32Timer::Interval(std::uint32_t milliseconds) {
+void Win32Timer::SetInterval(std::uint32_t milliseconds) {
     interval_ = milliseconds;
     Apply();
 }
 
-void Win32Timer::Enabled(bool enabled) {
+void Win32Timer::SetEnabled(bool enabled) {
     enabled_ = enabled;
     Apply();
 }

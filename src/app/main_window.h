@@ -30,13 +30,13 @@ class XPSwitch final : public platform::Switch {
 public:
     explicit XPSwitch(XPButtonWindow& window) : window_(window) {}
     bool Value() const override { return window_.button().Value(); }
-    void Value(bool value) override { window_.button().SetValue(value); }
+    void SetValue(bool value) override { window_.button().SetValue(value); }
     std::string Caption() const override { return window_.button().Caption(); }
-    void Caption(const std::string& caption) override { window_.button().SetCaption(caption); }
+    void SetCaption(const std::string& caption) override { window_.button().SetCaption(caption); }
     std::uint32_t BackColor() const override { return window_.button().BackColor(); }
-    void BackColor(std::uint32_t colour) override { window_.button().SetBackColor(colour); }
+    void SetBackColor(std::uint32_t colour) override { window_.button().SetBackColor(colour); }
     std::uint32_t BackOver() const override { return window_.button().BackOver(); }
-    void BackOver(std::uint32_t colour) override { window_.button().SetBackOver(colour); }
+    void SetBackOver(std::uint32_t colour) override { window_.button().SetBackOver(colour); }
     HWND Handle() const { return window_.hwnd(); }
 
 private:
@@ -47,9 +47,9 @@ class Win32Timer final : public platform::Timer {
 public:
     explicit Win32Timer(UINT_PTR id) : id_(id) {}
     std::uint32_t Interval() const override { return interval_; }
-    void Interval(std::uint32_t milliseconds) override;
+    void SetInterval(std::uint32_t milliseconds) override;
     bool Enabled() const override { return enabled_; }
-    void Enabled(bool enabled) override;
+    void SetEnabled(bool enabled) override;
 
 private:
     friend class MainWindow;

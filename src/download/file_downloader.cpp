@@ -51,20 +51,20 @@ void FileDownloader::FileError(const platform::FileError& error) {
     cancel_ = true;
 }
 
-bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_t& announced) {
+bool FileDownloader::RequestPhase(const std::string& destination, std::int32_t& announced) {
     platform::TransferError error;
     // The range always starts at 0: nothing has been received when a download starts.
-    if (!Inet_.ExecuteGet("Range: bytes=" + std::to_string(0) + "-\r\n", error)) {
+    if (!transfer_.ExecuteGet("Range: bytes=" + std::to_string(0) + "-\r\n", error)) {
         RequestError(error.description);
         return false;
     }
-    while (Inet_.StillExecuting()) {
+    while (transfer_.StillExecuting()) {
         if (!pump_.YieldToMessages()) cancel_ = true;  // the program is quitting
         if (cancel_) return false;
     }
 
     std::string header;
-    if (!Inet_.GetHeader(header, error)) {
+    if (!transfer_.GetHeader(header, error)) {
         RequestError(error.description);
         return false;
     }
@@ -75,7 +75,7 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
         } else if (status == "401") {
             Raise(DownloadErrors, "Authorization failed!");
         } else if (status == "404") {
-            Raise(DownloadErrors, "The file, \"" + Inet_.URL() + "\" was not found!");
+            Raise(DownloadErrors, "The file, \"" + transfer_.URL() + "\" was not found!");
         } else if (status == "\r\n") {
             Raise(DownloadErrors, "Cannot establish connection.");
         } else {
@@ -89,7 +89,7 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
     }
 
     std::string length;
-    if (!Inet_.GetHeader("Content-Length", length, error)) {
+    if (!transfer_.GetHeader("Content-Length", length, error)) {
         RequestError(error.description);
         return false;
     }
@@ -119,8 +119,8 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
     }
     announced = size;
 
-    if (strDestination.size() >= 3 && strDestination.compare(1, 2, ":\\") == 0) {
-        std::string root = strDestination.substr(0, strDestination.find('\\') + 1);
+    if (destination.size() >= 3 && destination.compare(1, 2, ":\\") == 0) {
+        std::string root = destination.substr(0, destination.find('\\') + 1);
         if (announced > DiskFreeBytes(root)) {
             Raise(DownloadErrors, "There is not enough free space on disk for this file.");
             cancel_ = true;
@@ -131,20 +131,20 @@ bool FileDownloader::RequestPhase(const std::string& strDestination, std::int32_
     return true;
 }
 
-void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t announced, std::int32_t& received) {
+void FileDownloader::FilePhase(const std::string& destination, std::int32_t announced, std::int32_t& received) {
     platform::FileError fileError;
     received = 0;
 
     // A destination given without a folder has no folder to create.
-    if (strDestination.find('\\') != std::string::npos) {
-        std::string folder = SplitPath(strDestination, false, false);
+    if (destination.find('\\') != std::string::npos) {
+        std::string folder = SplitPath(destination, false, false);
         if (!files_.FolderExists(folder) && !files_.CreateFolder(folder, fileError)) {
             FileError(fileError);
             return;
         }
     }
 
-    const std::string partial = PartialPath(strDestination);
+    const std::string partial = PartialPath(destination);
     std::unique_ptr<platform::FileWriter> file = files_.CreateNew(partial, fileError);
     if (!file) {
         FileError(fileError);
@@ -156,7 +156,7 @@ void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t a
     // An announced size of 0 is an empty file: nothing to read.
     for (bool more = announced > 0; more;) {
         platform::TransferError readError;
-        if (!Inet_.GetChunk(kChunkSize, buffer, readError)) {
+        if (!transfer_.GetChunk(kChunkSize, buffer, readError)) {
             if (!cancel_) FileError({readError.number, readError.description});
             failed = true;
             break;
@@ -193,28 +193,28 @@ void FileDownloader::FilePhase(const std::string& strDestination, std::int32_t a
     if (!refusal.empty()) {
         Raise(DownloadErrors, refusal);
         cancel_ = true;
-    } else if (!files_.Replace(partial, strDestination, fileError)) {
+    } else if (!files_.Replace(partial, destination, fileError)) {
         FileError(fileError);
     }
 }
 
-bool FileDownloader::DownloadFile(const std::string& strURL, const std::string& strDestination,
-                                  const std::string& UserName, const std::string& Password) {
+bool FileDownloader::DownloadFile(const std::string& url, const std::string& destination,
+                                  const std::string& userName, const std::string& password) {
     cancel_ = false;
     std::int32_t received = 0;
     std::int32_t announced = 0;
 
     // What a killed program left behind is no part of this download.
-    const std::string partial = PartialPath(strDestination);
+    const std::string partial = PartialPath(destination);
     if (files_.FileExists(partial)) files_.Delete(partial);
 
     Raise(DownloadEvents, "Getting file information");
     pump_.YieldToMessages();
-    Inet_.SetURL(strURL);
-    Inet_.SetUserName(UserName);
-    Inet_.SetPassword(Password);
+    transfer_.SetURL(url);
+    transfer_.SetUserName(userName);
+    transfer_.SetPassword(password);
 
-    if (RequestPhase(strDestination, announced)) FilePhase(strDestination, announced, received);
+    if (RequestPhase(destination, announced)) FilePhase(destination, announced, received);
 
     // Finish: the destination was replaced only if the download completed; whatever is left of the
     // partial file goes.
@@ -232,7 +232,7 @@ bool FileDownloader::DownloadFile(const std::string& strURL, const std::string& 
         }
     }
     if (files_.FileExists(partial)) files_.Delete(partial);
-    Inet_.Cancel();
+    transfer_.Cancel();
     return result;
 }
 

@@ -27,30 +27,30 @@ namespace vantorel {
 
 class FileDownloader {
 public:
-    // Every wait of `Inet` ends as soon as the download is cancelled.
-    FileDownloader(platform::HttpTransfer& Inet, platform::FileSystem& files, platform::MessagePump& pump)
-        : Inet_(Inet), files_(files), pump_(pump) {
-        Inet_.StopWaitingWhen([this] { return cancel_; });
+    // Every wait of `transfer` ends as soon as the download is cancelled.
+    FileDownloader(platform::HttpTransfer& transfer, platform::FileSystem& files, platform::MessagePump& pump)
+        : transfer_(transfer), files_(files), pump_(pump) {
+        transfer_.StopWaitingWhen([this] { return cancel_; });
     }
-    ~FileDownloader() { Inet_.StopWaitingWhen(nullptr); }
+    ~FileDownloader() { transfer_.StopWaitingWhen(nullptr); }
     FileDownloader(const FileDownloader&) = delete;
     FileDownloader& operator=(const FileDownloader&) = delete;
 
     // Events, set by the host. Any may be left empty.
-    std::function<void(const std::string& strError)> DownloadErrors;
+    std::function<void(const std::string& message)> DownloadErrors;
     std::function<void(const std::string& strEvent)> DownloadEvents;
     std::function<void()> DowloadComplete;
-    std::function<void(const std::string& intPercent)> DownloadProgress;
+    std::function<void(const std::string& percent)> DownloadProgress;
 
     // Asked with the partial file's path once the whole body is in it, before it replaces the
     // destination: an empty answer lets it in; any other answer is raised through `DownloadErrors`
     // and the download ends as refused, the destination untouched. Empty: every file is let in.
     std::function<std::string(const std::string& partialPath)> CheckFile;
 
-    // Fetches `strURL` into `strDestination` (a full local path). True when the file arrived
+    // Fetches `url` into `destination` (a full local path). True when the file arrived
     // complete and the call was not cancelled.
-    bool DownloadFile(const std::string& strURL, const std::string& strDestination, const std::string& UserName = "",
-                      const std::string& Password = "");
+    bool DownloadFile(const std::string& url, const std::string& destination, const std::string& userName = "",
+                      const std::string& password = "");
 
     // Asks the running download to stop at its next check.
     void Cancel() { cancel_ = true; }
@@ -63,13 +63,13 @@ private:
         if (event) event(text);
     }
     // Steps from the request to the file phase; false when the download stops before the file phase.
-    bool RequestPhase(const std::string& strDestination, std::int32_t& announced);
-    void FilePhase(const std::string& strDestination, std::int32_t announced, std::int32_t& received);
+    bool RequestPhase(const std::string& destination, std::int32_t& announced);
+    void FilePhase(const std::string& destination, std::int32_t announced, std::int32_t& received);
     void RequestError(const std::string& description);
     void FileError(const platform::FileError& error);
     double DiskFreeBytes(const std::string& root);
 
-    platform::HttpTransfer& Inet_;
+    platform::HttpTransfer& transfer_;
     platform::FileSystem& files_;
     platform::MessagePump& pump_;
     bool cancel_ = false;

@@ -27,29 +27,29 @@ void Guard::Load() {
 
     if (ReadIntSetting(platform_.registry, platform::kHkeyLocalMachine, kTrayValue, 0) == 0) frm.SetVisible(true);
 
-    window_.btnOnOff.Value(ReadIntSetting(platform_.registry, platform::kHkeyCurrentUser, kStateValue, 0) != 0);
+    window_.btnOnOff.SetValue(ReadIntSetting(platform_.registry, platform::kHkeyCurrentUser, kStateValue, 0) != 0);
 
     LoadDefinitions(DefinitionsPath(programFolder_), platform_.files, onDefinitionsMissing_, Definitions);
 
     attemptCount_ = ReadIntSetting(platform_.registry, platform::kHkeyCurrentUser, kAttemptsValue, 0);
     view_.CountLoaded(attemptCount_);
 
-    window_.tmr.Interval(kTmrInterval);
+    window_.tmr.SetInterval(kTmrInterval);
     Toggle();
 
-    window_.timer.Interval(kTimerInterval);
-    window_.timer.Enabled(true);
+    window_.timer.SetInterval(kTimerInterval);
+    window_.timer.SetEnabled(true);
 }
 
 void Guard::Toggle() {
     bool on = window_.btnOnOff.Value();
     std::uint32_t colour = on ? kOnColour : kOffColour;
-    window_.btnOnOff.BackColor(colour);
-    window_.btnOnOff.BackOver(colour);
-    window_.btnOnOff.Caption(on ? "ON" : "OFF");
+    window_.btnOnOff.SetBackColor(colour);
+    window_.btnOnOff.SetBackOver(colour);
+    window_.btnOnOff.SetCaption(on ? "ON" : "OFF");
     OpenSettings(platform_.registry, platform::kHkeyCurrentUser)
         .SetRegistryValue(kStateValue, std::string(on ? "1" : "0"), platform::kRegSz);
-    window_.tmr.Enabled(on);
+    window_.tmr.SetEnabled(on);
 }
 
 void Guard::TmrTick() {
@@ -59,8 +59,8 @@ void Guard::TmrTick() {
 }
 
 void Guard::Unload() {
-    window_.tmr.Enabled(false);
-    window_.timer.Enabled(false);
+    window_.tmr.SetEnabled(false);
+    window_.timer.SetEnabled(false);
 }
 
 }  // namespace vantorel

@@ -52,13 +52,13 @@ public:
     virtual ~Switch() = default;
 
     virtual bool Value() const = 0;
-    virtual void Value(bool value) = 0;
+    virtual void SetValue(bool value) = 0;
     virtual std::string Caption() const = 0;
-    virtual void Caption(const std::string& caption) = 0;
+    virtual void SetCaption(const std::string& caption) = 0;
     virtual std::uint32_t BackColor() const = 0;
-    virtual void BackColor(std::uint32_t colour) = 0;
+    virtual void SetBackColor(std::uint32_t colour) = 0;
     virtual std::uint32_t BackOver() const = 0;
-    virtual void BackOver(std::uint32_t colour) = 0;
+    virtual void SetBackOver(std::uint32_t colour) = 0;
 };
 
 // A window timer: while enabled, calls its tick handler every `Interval` milliseconds on the
@@ -71,9 +71,9 @@ public:
     virtual ~Timer() = default;
 
     virtual std::uint32_t Interval() const = 0;
-    virtual void Interval(std::uint32_t milliseconds) = 0;
+    virtual void SetInterval(std::uint32_t milliseconds) = 0;
     virtual bool Enabled() const = 0;
-    virtual void Enabled(bool enabled) = 0;
+    virtual void SetEnabled(bool enabled) = 0;
 };
 
 // Placement of top-level windows and the screen they are on.

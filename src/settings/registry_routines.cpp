@@ -89,29 +89,29 @@ bool RegistryRoutines::KeyExists() {
     return key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key.out()));
 }
 
-std::string RegistryRoutines::CreateKey(const std::optional<std::string>& KeyName) {
+std::string RegistryRoutines::CreateKey(const std::optional<std::string>& keyName) {
     ScopedKey key(registry_);
-    std::string path = keyRoot_ + "\\" + KeyName.value_or(subkey_);
+    std::string path = keyRoot_ + "\\" + keyName.value_or(subkey_);
     return key.Took(registry_.CreateKey(RootKey(hkey_), path, platform::kKeyAllAccess, key.out())) ? "0" : "";
 }
 
-std::int32_t RegistryRoutines::DeleteKey(const std::string& KeyName) {
-    return registry_.DeleteKey(RootKey(hkey_), keyRoot_ + "\\" + KeyName);
+std::int32_t RegistryRoutines::DeleteKey(const std::string& keyName) {
+    return registry_.DeleteKey(RootKey(hkey_), keyRoot_ + "\\" + keyName);
 }
 
-std::int32_t RegistryRoutines::DeleteValue(const std::string& ValueName) {
+std::int32_t RegistryRoutines::DeleteValue(const std::string& valueName) {
     ScopedKey key(registry_);
     std::int32_t status = registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyAllAccess, key.out());
     if (!key.Took(status)) return status;
-    return registry_.DeleteValue(key.get(), ValueName);
+    return registry_.DeleteValue(key.get(), valueName);
 }
 
-Collection<std::string> RegistryRoutines::EnumRegistryKeys(std::int32_t hkey, const std::string& KeyName) {
+Collection<std::string> RegistryRoutines::EnumRegistryKeys(std::int32_t hkey, const std::string& keyName) {
     Collection<std::string> keys;
     RegKey key = RootKey(hkey);
     ScopedKey opened(registry_);
-    if (!KeyName.empty()) {
-        if (!opened.Took(registry_.OpenKey(RootKey(hkey), KeyName, platform::kKeyRead, opened.out()))) return keys;
+    if (!keyName.empty()) {
+        if (!opened.Took(registry_.OpenKey(RootKey(hkey), keyName, platform::kKeyRead, opened.out()))) return keys;
         key = opened.get();
     }
     for (std::uint32_t index = 0;; ++index) {
@@ -122,12 +122,12 @@ Collection<std::string> RegistryRoutines::EnumRegistryKeys(std::int32_t hkey, co
     return keys;
 }
 
-Collection<RegistryItem> RegistryRoutines::EnumRegistryValues(std::int32_t hkey, const std::string& KeyName) {
+Collection<RegistryItem> RegistryRoutines::EnumRegistryValues(std::int32_t hkey, const std::string& keyName) {
     Collection<RegistryItem> values;
     RegKey key = RootKey(hkey);
     ScopedKey opened(registry_);
-    if (!KeyName.empty()) {
-        if (!opened.Took(registry_.OpenKey(RootKey(hkey), KeyName, platform::kKeyRead, opened.out()))) return values;
+    if (!keyName.empty()) {
+        if (!opened.Took(registry_.OpenKey(RootKey(hkey), keyName, platform::kKeyRead, opened.out()))) return values;
         key = opened.get();
     }
     for (std::uint32_t index = 0;; ++index) {
@@ -215,10 +215,10 @@ Variant RegistryRoutines::ReadValue(RegKey key, const std::string& name, Variant
     return result;
 }
 
-Variant RegistryRoutines::GetRegistryValue(const std::string& ValueName, const Variant& DefaultValue) {
+Variant RegistryRoutines::GetRegistryValue(const std::string& valueName, const Variant& defaultValue) {
     ScopedKey key(registry_);
-    if (!key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key.out()))) return DefaultValue;
-    return ReadValue(key.get(), ValueName, DefaultValue);
+    if (!key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyRead, key.out()))) return defaultValue;
+    return ReadValue(key.get(), valueName, defaultValue);
 }
 
 bool RegistryRoutines::WriteValue(RegKey key, const std::string& name, const Variant& value, std::int32_t type) {
@@ -249,33 +249,33 @@ bool RegistryRoutines::WriteValue(RegKey key, const std::string& name, const Var
     }
 }
 
-bool RegistryRoutines::SetRegistryValue(const std::string& ValueName, const Variant& Value, std::int32_t DType) {
+bool RegistryRoutines::SetRegistryValue(const std::string& valueName, const Variant& value, std::int32_t valueType) {
     ScopedKey key(registry_);
     if (!key.Took(registry_.OpenKey(RootKey(hkey_), ObjectPath(), platform::kKeyWrite, key.out()))) return false;
-    return WriteValue(key.get(), ValueName, Value, DType);
+    return WriteValue(key.get(), valueName, value, valueType);
 }
 
-Variant RegistryRoutines::ReadRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey,
-                                                  const std::string& ValueName,
-                                                  const std::optional<std::string>& KeyPath) {
+Variant RegistryRoutines::ReadRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey,
+                                                  const std::string& valueName,
+                                                  const std::optional<std::string>& keyPath) {
     ScopedKey remote(registry_);
-    if (!remote.Took(registry_.ConnectRegistry(sRemoteComputer, RootKey(hkey), remote.out())))
+    if (!remote.Took(registry_.ConnectRegistry(remoteComputer, RootKey(hkey), remote.out())))
         return std::string("Error!");
     ScopedKey key(registry_);
-    if (!key.Took(registry_.OpenKey(remote.get(), KeyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key.out())))
+    if (!key.Took(registry_.OpenKey(remote.get(), keyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key.out())))
         return Variant();
-    return ReadValue(key.get(), ValueName, Variant());
+    return ReadValue(key.get(), valueName, Variant());
 }
 
-bool RegistryRoutines::WriteRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey,
-                                                const std::string& ValueName, const Variant& Value,
-                                                std::int32_t DType, const std::optional<std::string>& KeyPath) {
+bool RegistryRoutines::WriteRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey,
+                                                const std::string& valueName, const Variant& value,
+                                                std::int32_t valueType, const std::optional<std::string>& keyPath) {
     ScopedKey remote(registry_);
-    if (!remote.Took(registry_.ConnectRegistry(sRemoteComputer, RootKey(hkey), remote.out()))) return false;
+    if (!remote.Took(registry_.ConnectRegistry(remoteComputer, RootKey(hkey), remote.out()))) return false;
     ScopedKey key(registry_);
-    if (!key.Took(registry_.OpenKey(remote.get(), KeyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key.out())))
+    if (!key.Took(registry_.OpenKey(remote.get(), keyPath.value_or(ObjectPath()), platform::kKeyAllAccess, key.out())))
         return false;
-    return WriteValue(key.get(), ValueName, Value, DType);
+    return WriteValue(key.get(), valueName, value, valueType);
 }
 
 std::string RegistryRoutines::TrimNull(std::string& item) {

@@ -26,48 +26,48 @@ public:
     explicit RegistryRoutines(platform::Registry& registry) : registry_(registry) {}
 
     std::int32_t hkey() const { return hkey_; }
-    void hkey(std::int32_t vData) { hkey_ = vData; }
+    void hkey(std::int32_t value) { hkey_ = value; }
     const std::string& KeyRoot() const { return keyRoot_; }
-    void KeyRoot(const std::string& vData) { keyRoot_ = vData; }
+    void KeyRoot(const std::string& value) { keyRoot_ = value; }
     const std::string& Subkey() const { return subkey_; }
-    void Subkey(const std::string& vData) { subkey_ = vData; }
+    void Subkey(const std::string& value) { subkey_ = value; }
 
     // True when the object path opens for reading.
     bool KeyExists();
 
-    // Creates (or opens) KeyRoot + "\" + the key name (`KeyName`, else Subkey): "0" on success,
+    // Creates (or opens) KeyRoot + "\" + the key name (`keyName`, else Subkey): "0" on success,
     // the empty text on failure.
-    std::string CreateKey(const std::optional<std::string>& KeyName = std::nullopt);
+    std::string CreateKey(const std::optional<std::string>& keyName = std::nullopt);
 
-    // Deletes KeyRoot + "\" + KeyName; the registry's status code.
-    std::int32_t DeleteKey(const std::string& KeyName);
+    // Deletes KeyRoot + "\" + keyName; the registry's status code.
+    std::int32_t DeleteKey(const std::string& keyName);
 
     // Deletes a value of the object path; the status code of the open or of the deletion.
-    std::int32_t DeleteValue(const std::string& ValueName);
+    std::int32_t DeleteValue(const std::string& valueName);
 
-    // The subkeys of `KeyName` below `hkey` (of `hkey` itself when `KeyName` is empty).
-    Collection<std::string> EnumRegistryKeys(std::int32_t hkey, const std::string& KeyName);
+    // The subkeys of `keyName` below `hkey` (of `hkey` itself when `keyName` is empty).
+    Collection<std::string> EnumRegistryKeys(std::int32_t hkey, const std::string& keyName);
 
-    // The values of `KeyName` below `hkey`, converted for display (binary as hex pairs, multi-strings
+    // The values of `keyName` below `hkey`, converted for display (binary as hex pairs, multi-strings
     // comma-separated).
-    Collection<RegistryItem> EnumRegistryValues(std::int32_t hkey, const std::string& KeyName);
+    Collection<RegistryItem> EnumRegistryValues(std::int32_t hkey, const std::string& keyName);
 
-    // One value of the object path, converted by its type; `DefaultValue` (or empty) when the key or
+    // One value of the object path, converted by its type; `defaultValue` (or empty) when the key or
     // the value is missing or the type is not converted.
-    Variant GetRegistryValue(const std::string& ValueName, const Variant& DefaultValue = Variant());
+    Variant GetRegistryValue(const std::string& valueName, const Variant& defaultValue = Variant());
 
-    // Writes one value of the object path as type `DType`. True when written, and when a type that
+    // Writes one value of the object path as type `valueType`. True when written, and when a type that
     // is not converted left nothing to write; False when the key does not open, the write fails or
     // the value cannot take the type.
-    bool SetRegistryValue(const std::string& ValueName, const Variant& Value, std::int32_t DType);
+    bool SetRegistryValue(const std::string& valueName, const Variant& value, std::int32_t valueType);
 
     // The same on another computer's registry; "Error!" when it cannot be reached.
-    Variant ReadRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey,
-                                    const std::string& ValueName,
-                                    const std::optional<std::string>& KeyPath = std::nullopt);
-    bool WriteRemoteRegistryValue(const std::string& sRemoteComputer, std::int32_t hkey, const std::string& ValueName,
-                                  const Variant& Value, std::int32_t DType,
-                                  const std::optional<std::string>& KeyPath = std::nullopt);
+    Variant ReadRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey,
+                                    const std::string& valueName,
+                                    const std::optional<std::string>& keyPath = std::nullopt);
+    bool WriteRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey, const std::string& valueName,
+                                  const Variant& value, std::int32_t valueType,
+                                  const std::optional<std::string>& keyPath = std::nullopt);
 
     // Cuts `item` at its first NUL and returns it.
     static std::string TrimNull(std::string& item);

@@ -118,13 +118,13 @@ public:
 class FakeSwitch final : public platform::Switch {
 public:
     bool Value() const override { return value; }
-    void Value(bool v) override { value = v; }
+    void SetValue(bool v) override { value = v; }
     std::string Caption() const override { return caption; }
-    void Caption(const std::string& c) override { caption = c; }
+    void SetCaption(const std::string& c) override { caption = c; }
     std::uint32_t BackColor() const override { return backColor; }
-    void BackColor(std::uint32_t c) override { backColor = c; }
+    void SetBackColor(std::uint32_t c) override { backColor = c; }
     std::uint32_t BackOver() const override { return backOver; }
-    void BackOver(std::uint32_t c) override { backOver = c; }
+    void SetBackOver(std::uint32_t c) override { backOver = c; }
 
     bool value = false;
     std::string caption = "KirelXPButton1";
@@ -134,9 +134,9 @@ public:
 class FakeTimer final : public platform::Timer {
 public:
     std::uint32_t Interval() const override { return interval; }
-    void Interval(std::uint32_t ms) override { interval = ms; }
+    void SetInterval(std::uint32_t ms) override { interval = ms; }
     bool Enabled() const override { return enabled; }
-    void Enabled(bool e) override { enabled = e; }
+    void SetEnabled(bool e) override { enabled = e; }
     std::uint32_t interval = 0;
     bool enabled = false;
 };

@@ -99,14 +99,14 @@ TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     MSG stale;
     while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {
     }
-    window.Timer().Interval(20);
-    window.Timer().Enabled(true);
+    window.Timer().SetInterval(20);
+    window.Timer().SetEnabled(true);
     // A loop that only yields, as a long sweep does: the timer's ticks still arrive.
     win32::Win32MessagePump pump;
     DWORD until = ::GetTickCount() + 3000;
     while (ticks < 3 && ::GetTickCount() < until) ASSERT_TRUE(pump.YieldToMessages());
     EXPECT_GE(ticks, 3);
-    window.Timer().Enabled(false);
+    window.Timer().SetEnabled(false);
 
     // A quit request ends the loop and is kept for the main loop.
     ::PostQuitMessage(7);

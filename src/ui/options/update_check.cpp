@@ -15,11 +15,11 @@ const char* const kTitle = "Updates";
 
 }  // namespace
 
-UpdateCheck::UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, platform::MessagePump& pump,
+UpdateCheck::UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& transfer, platform::MessagePump& pump,
                          platform::Files& files, FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3,
                          std::string programFolder, ProgramVersion version, std::string server)
     : frame_(frame),
-      Inet_(Inet),
+      transfer_(transfer),
       pump_(pump),
       files_(files),
       FD1_(FD1),
@@ -28,12 +28,12 @@ UpdateCheck::UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, plat
       folder_(std::move(programFolder)),
       version_(version),
       server_(std::move(server)) {
-    Inet_.StopWaitingWhen([this] { return cancelled_; });
+    transfer_.StopWaitingWhen([this] { return cancelled_; });
 }
 
 void UpdateCheck::ConnectEvents() {
-    FD1_.DownloadErrors = [this](const std::string& strError) {
-        if (!cancelled_) frame_.MsgBoxExclamation("Error downloading definition updates " + strError, kTitle);
+    FD1_.DownloadErrors = [this](const std::string& message) {
+        if (!cancelled_) frame_.MsgBoxExclamation("Error downloading definition updates " + message, kTitle);
     };
     FD1_.DowloadComplete = [this] { frame_.SetLCaption(0, "Definitions Updates: Complete"); };
     FD1_.CheckFile = [this](const std::string& partialPath) -> std::string {
@@ -43,8 +43,8 @@ void UpdateCheck::ConnectEvents() {
         if (problem.empty()) return std::string();
         return "The downloaded file is not a definitions list (" + problem + "). The installed definitions are kept.";
     };
-    FD2_.DownloadErrors = [this](const std::string& strError) {
-        if (!cancelled_) frame_.MsgBoxExclamation("Error downloading program updates " + strError, kTitle);
+    FD2_.DownloadErrors = [this](const std::string& message) {
+        if (!cancelled_) frame_.MsgBoxExclamation("Error downloading program updates " + message, kTitle);
     };
     FD2_.DowloadComplete = [this] { frame_.SetLCaption(1, "Program Updates: Complete"); };
     FD2_.CheckFile = [this](const std::string& partialPath) -> std::string {
@@ -56,14 +56,14 @@ void UpdateCheck::ConnectEvents() {
     FD3_.DowloadComplete = nullptr;
     for (FileDownloader* fd : {&FD1_, &FD2_, &FD3_}) {
         fd->DownloadEvents = nullptr;
-        fd->DownloadProgress = [this](const std::string& intPercent) { Progress(intPercent); };
+        fd->DownloadProgress = [this](const std::string& percent) { Progress(percent); };
     }
 }
 
-void UpdateCheck::Progress(const std::string& intPercent) {
+void UpdateCheck::Progress(const std::string& percentText) {
     if (cancelled_) return;
     std::int32_t percent = 0;
-    if (!RoundToInt32(LeadingNumber(intPercent), percent)) return;
+    if (!RoundToInt32(LeadingNumber(percentText), percent)) return;
     percent = std::clamp<std::int32_t>(percent, -32768, 32767);
     DrawProgress(frame_.pb(), static_cast<std::int16_t>(percent), kProgressForeColor, kProgressBackColor);
 }
@@ -85,7 +85,7 @@ double UpdateCheck::LocalDefinitionsVersion() {
 bool UpdateCheck::RemoteVersion(const std::string& path, double& version) {
     std::string text;
     platform::TransferError error;
-    if (!OpenURL(Inet_, pump_, server_ + path, text, error)) {
+    if (!OpenURL(transfer_, pump_, server_ + path, text, error)) {
         if (cancelled_) return false;
         frame_.MsgBoxExclamation("Cannot check for updates: the update server " + server_ +
                                      " could not be reached.\r\r" + error.description,

@@ -47,13 +47,13 @@ struct ProgramVersion {
 
 class UpdateCheck {
 public:
-    // `Inet` fetches the version texts; `FD1` the definitions, `FD2` the setup program, `FD3` the
+    // `transfer` fetches the version texts; `FD1` the definitions, `FD2` the setup program, `FD3` the
     // definitions version file. `programFolder` has no trailing backslash; `server` is the web
     // server's address without a trailing slash.
-    UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& Inet, platform::MessagePump& pump, platform::Files& files,
+    UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& transfer, platform::MessagePump& pump, platform::Files& files,
                 FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3, std::string programFolder,
                 ProgramVersion version, std::string server);
-    ~UpdateCheck() { Inet_.StopWaitingWhen(nullptr); }
+    ~UpdateCheck() { transfer_.StopWaitingWhen(nullptr); }
 
     // Sets the downloaders' event handlers: messages and captions for FD1 and FD2, progress for all.
     void ConnectEvents();
@@ -73,10 +73,10 @@ private:
     // The version in the server's text file at `path`; false after reporting a request that failed
     // outright.
     bool RemoteVersion(const std::string& path, double& version);
-    void Progress(const std::string& intPercent);
+    void Progress(const std::string& percentText);
 
     UpdatesFrame& frame_;
-    platform::HttpTransfer& Inet_;
+    platform::HttpTransfer& transfer_;
     platform::MessagePump& pump_;
     platform::Files& files_;
     FileDownloader& FD1_;
