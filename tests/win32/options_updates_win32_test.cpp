@@ -151,7 +151,7 @@ TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndFailuresKeepTheInstalledVe
         {"20\r\n", "21", nullptr, "1.0", nullptr, {1, 0}, "Definitions Updates:", kNoProgram,
          "Updates owned: Error downloading definition updates The file, \"", "20\r\n"},
         // A missing local version counts as 0.
-        {nullptr, "1", "new definitions", "1.0", nullptr, {1, 0}, "Definitions Updates: Complete", kNoProgram, "", "1"},
+        {nullptr, "1", "67305985\r\n", "1.0", nullptr, {1, 0}, "Definitions Updates: Complete", kNoProgram, "", "1"},
         // The setup program's own failure has its own message; the caption keeps its text.
         {"20\r\n", "20", nullptr, "2", nullptr, {1, 0}, kNoDefs, "Program Updates:",
          "Updates owned: Error downloading program updates The file, \"", "20\r\n"},
