@@ -2,6 +2,7 @@
 // raster canvas (text and ovals are recorded there, so only the solid parts are compared).
 #include <gtest/gtest.h>
 
+#include <cmath>
 #include <memory>
 #include <vector>
 
@@ -69,6 +70,10 @@ TEST(XPButtonColour, ShiftBlendAndRounding) {
     EXPECT_EQ(RoundHalfEven(-2.5), -2);
     EXPECT_EQ(RoundHalfEven(76.5), 76);
     EXPECT_EQ(RoundHalfEven(2.6), 3);
+    // A corrupt stored size saturates instead of overflowing.
+    EXPECT_EQ(RoundHalfEven(1e300), INT32_MAX);
+    EXPECT_EQ(RoundHalfEven(-1e300), INT32_MIN);
+    EXPECT_EQ(RoundHalfEven(std::nan("")), 0);
 }
 
 TEST(XPButtonColour, PaletteBySchemes) {
