@@ -37,6 +37,7 @@ public:
     int pollsUntilDone = 0;                          // StillExecuting answers true this often
     std::optional<platform::TransferError> executeFails, headerFails, lengthFails, chunkFails;
     std::size_t chunkFailsAt = 0;                    // GetChunk fails once this many bytes were handed out
+    std::vector<std::size_t> chunkScript;            // at most these sizes from the first chunks on
 
     // What happened.
     std::string url, userName, password, requestHeader;
@@ -63,6 +64,7 @@ public:
         ++executes;
         requestHeader = headerToSend;
         position_ = 0;
+        scripted_ = 0;
         pollsLeft_ = pollsUntilDone;
         if (server != nullptr) {
             server->requests.push_back(url);
@@ -106,6 +108,7 @@ public:
             return false;
         }
         std::size_t end = std::min(body.size(), deliverOnly);
+        if (scripted_ < chunkScript.size()) size = std::min(size, chunkScript[scripted_++]);
         std::size_t take = position_ < end ? std::min(size, end - position_) : 0;
         data = body.substr(position_, take);
         position_ += take;
@@ -115,6 +118,7 @@ public:
 
 private:
     std::size_t position_ = 0;
+    std::size_t scripted_ = 0;
     int pollsLeft_ = 0;
 };
 
