@@ -1,6 +1,6 @@
 // Any bytes as sw2.def: loading ends without a crash or hang, the list holds the pieces the
-// splitter cuts, and every answer points at a line that holds the key (a listed row key is always
-// found, even in a file out of order).
+// splitter cuts in memory bounded by the file's size, and every answer points at a line that holds
+// the key (a listed row key is always found, even in a file out of order).
 #include <cstdlib>
 #include <string>
 #include <vector>
@@ -15,6 +15,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     std::vector<std::string> pieces;
     FastSplit(text, pieces, std::string(ChooseSeparator(text)));
     if (list.size() != pieces.size()) std::abort();
+    if (list.MemoryBytes() > 64 * size + 4096) std::abort();
 
     char buffer[12];
     auto check = [&](const std::string& key) {
