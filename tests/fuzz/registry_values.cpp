@@ -77,14 +77,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
             if (written && type == 4 && number && back != value) std::abort();
             if (type == 3 && written != std::holds_alternative<Bytes>(value)) std::abort();
         }
-        const auto items = reg.EnumRegistryValues(platform::kHkeyCurrentUser, kPath);
-        for (std::size_t i = 0; i < items.size(); ++i)
-            if (!std::holds_alternative<std::string>(items[i].value) && !std::holds_alternative<std::int32_t>(items[i].value) &&
-                !IsEmpty(items[i].value))
-                std::abort();
-        reg.EnumRegistryKeys(platform::kHkeyCurrentUser, kPath);
         if (in.ConsumeBool() && reg.DeleteValue(name) == 0 && !IsEmpty(reg.GetRegistryValue(name))) std::abort();
     }
+    const auto items = reg.EnumRegistryValues(platform::kHkeyCurrentUser, kPath);
+    for (std::size_t i = 0; i < items.size(); ++i)
+        if (std::holds_alternative<Bytes>(items[i].value)) std::abort();  // binary data is listed as hex text
+    reg.EnumRegistryKeys(platform::kHkeyCurrentUser, kPath);
     if (registry.OpenHandles() != 0) std::abort();
     return 0;
 }
