@@ -18,6 +18,8 @@ public:
     std::string body;
     std::optional<platform::TransferError> executeFails, headerFails, lengthFails, chunkFails;
     std::size_t chunkFailsAt = 0;                    // GetChunk fails once this many bytes were handed out
+    std::vector<std::size_t> chunkScript;            // at most these sizes from the first chunks on
+    std::size_t deliverOnly = std::string::npos;     // the connection ends after this many body bytes
 
     // What happened.
     std::string url, userName, password, requestHeader;
@@ -41,6 +43,7 @@ public:
     bool ExecuteGet(const std::string& headerToSend, platform::TransferError& error) override {
         requestHeader = headerToSend;
         position_ = 0;
+        scripted_ = 0;
         if (executeFails) {
             error = *executeFails;
             return false;
@@ -69,7 +72,9 @@ public:
             error = *chunkFails;
             return false;
         }
-        std::size_t take = position_ < body.size() ? std::min(size, body.size() - position_) : 0;
+        std::size_t end = std::min(body.size(), deliverOnly);
+        if (scripted_ < chunkScript.size()) size = std::min(size, chunkScript[scripted_++]);
+        std::size_t take = position_ < end ? std::min(size, end - position_) : 0;
         data = body.substr(position_, take);
         position_ += take;
         return true;
@@ -78,6 +83,7 @@ public:
 
 private:
     std::size_t position_ = 0;
+    std::size_t scripted_ = 0;
 };
 
 }  // namespace vantorel::testing

@@ -6,6 +6,10 @@
 namespace vantorel::xpbutton {
 
 std::int32_t RoundHalfEven(double value) {
+    // Values beyond the 32-bit range (a corrupt stored font size, say) saturate; NaN reads as 0.
+    if (std::isnan(value)) return 0;
+    if (value >= 2147483647.0) return INT32_MAX;
+    if (value <= -2147483648.0) return INT32_MIN;
     double floor = std::floor(value);
     double diff = value - floor;
     if (diff > 0.5) return static_cast<std::int32_t>(floor) + 1;

@@ -10,7 +10,8 @@ namespace vantorel::xpbutton {
 
 using platform::Rgb;
 
-// Rounds to the nearest integer, halves to even (0.5 -> 0, 1.5 -> 2, -1.5 -> -2).
+// Rounds to the nearest integer, halves to even (0.5 -> 0, 1.5 -> 2, -1.5 -> -2). Values beyond the
+// 32-bit range saturate; NaN gives 0.
 std::int32_t RoundHalfEven(double value);
 
 // Adds `amount` to each channel (halved first, toward zero, when `softBevel`); with `scaleBlue`

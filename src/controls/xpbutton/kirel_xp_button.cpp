@@ -2,6 +2,8 @@
 // render.cpp, pictures in pictures.cpp.
 #include "controls/xpbutton/kirel_xp_button.h"
 
+#include <algorithm>
+
 namespace vantorel::xpbutton {
 
 char AccessKeyOf(const std::string& caption) {
@@ -209,7 +211,10 @@ void KirelXPButton::SetFontUnderline(bool value) {
     Paint(0, true);
 }
 
-std::int16_t KirelXPButton::FontSize() const { return static_cast<std::int16_t>(RoundHalfEven(font_.size)); }
+// A stored size beyond the 16-bit range reads as the nearest size that fits, not a wrapped one.
+std::int16_t KirelXPButton::FontSize() const {
+    return static_cast<std::int16_t>(std::clamp<std::int32_t>(RoundHalfEven(font_.size), INT16_MIN, INT16_MAX));
+}
 
 void KirelXPButton::SetFontSize(std::int16_t value) {
     font_.size = value;
