@@ -110,8 +110,8 @@ class Setup(unittest.TestCase):
 
     def test_2_upgrade_over_the_running_program(self):
         SESSION.start(PROGRAM_FILES + r"\vantorel.exe")
-        self.assertTrue(wait_for(lambda: "Started" in SESSION.program_output(), 60), SESSION.program_output())
-        self.assertIn(f"definitions from {PROGRAM_FILES}\\sw2.def", SESSION.program_output())
+        self.assertTrue(wait_for(lambda: "Started" in SESSION.said(), 60), SESSION.said())
+        self.assertIn(f"definitions from {PROGRAM_FILES}\\sw2.def", SESSION.said())
         SESSION.reg_add(HKCU_KEY, "Attempts", "42")
         SESSION.reg_add(HKLM_KEY, "Tray", "0")
         newer = b"16777343\r\n"
@@ -132,7 +132,7 @@ class Setup(unittest.TestCase):
                 self.assertEqual(read(os.path.join(self.folder, "defver")),
                                  defver if kept else read(os.path.join(ROOT, "data", "defver")))
                 self.assertEqual(read(os.path.join(self.folder, "sw2.def")) == newer, kept)
-        self.assertIn("Unloaded", SESSION.program_output(), "the first one ended by its own exit path")
+        self.assertIn("Unloaded", SESSION.said(), "the first one ended by its own exit path")
         self.assertEqual((SESSION.reg_query(HKCU_KEY, "Attempts"), SESSION.reg_query(HKLM_KEY, "Tray")), ("42", "0"))
 
     def test_3_silent_uninstall_leaves_nothing_of_ours(self):

@@ -101,6 +101,9 @@ class MainWindowWin32 : public ::testing::TestWithParam<UINT> {};
 INSTANTIATE_TEST_SUITE_P(EndedBy, MainWindowWin32, ::testing::Values(WM_CLOSE, WM_ENDSESSION));
 
 TEST_P(MainWindowWin32, LayoutSwitchLightsAndTheWindowLogicOnTheRealWindow) {
+    MSG stale;  // windows of earlier tests on this thread posted their quit message when destroyed
+    while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {
+    }
     win32::MainWindow window;
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
     const UINT dpi = window.Dpi();
