@@ -123,7 +123,7 @@ class Setup(unittest.TestCase):
                 first = SESSION.find(is_main, timeout=30)
                 self.assertIsNotNone(first, "the program runs")
                 if updates_open:
-                    button = next(c for c in SESSION.controls(first) if c.caption == "&Updates")
+                    button = next(c for c in SESSION.windows(first) if c.caption == "&Updates")
                     SESSION.post(button, 0xF5)  # BM_CLICK
                     self.assertIsNotNone(SESSION.find(lambda w: w.caption == "Updates" and w.visible))
                 self.assertEqual(SESSION.run_in_desktop(setup_exe() + " /S"), 0)
