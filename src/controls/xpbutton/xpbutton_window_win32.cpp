@@ -301,10 +301,7 @@ void XPButtonWindow::SetAccessKey(char key) {
     ::SetWindowTextA(hwnd_, text.c_str());
 }
 
-std::int32_t XPButtonWindow::ScreenDpi() const {
-    WindowDc screen(nullptr);
-    return screen.get() ? ::GetDeviceCaps(screen.get(), LOGPIXELSX) : 96;
-}
+std::int32_t XPButtonWindow::ScreenDpi() const { return win32::ScreenDpi(LOGPIXELSX); }
 
 void XPButtonWindow::PropertyChanged(const std::string& key) {
     if (onPropertyChanged) onPropertyChanged(key);

@@ -131,10 +131,7 @@ UINT DpiOfWindow(HWND hwnd) {
             if (dpi != 0) return dpi;
         }
     }
-    HDC dc = ::GetDC(hwnd);
-    UINT dpi = static_cast<UINT>(::GetDeviceCaps(dc, LOGPIXELSY));
-    ::ReleaseDC(hwnd, dc);
-    return dpi == 0 ? 96 : dpi;
+    return static_cast<UINT>(ScreenDpi());
 }
 
 int TwipsToPixels(int twips, UINT dpi) { return ::MulDiv(twips, static_cast<int>(dpi), 1440); }

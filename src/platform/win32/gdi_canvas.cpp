@@ -16,10 +16,7 @@ constexpr UINT kMeasureFlags = DT_CALCRECT | DT_WORDBREAK;          // 1040
 }  // namespace
 
 UniqueHfont MakeFont(const platform::FontDesc& font, int dpi) {
-    if (dpi == 0) {
-        WindowDc screen(nullptr);
-        dpi = screen.get() ? ::GetDeviceCaps(screen.get(), LOGPIXELSY) : 96;
-    }
+    if (dpi == 0) dpi = ScreenDpi();
     const LONG height = -static_cast<LONG>(std::lround(font.size * dpi / 72.0));
     return UniqueHfont(::CreateFontA(height, 0, 0, 0, font.bold ? FW_BOLD : FW_NORMAL, font.italic, font.underline,
                                      font.strikethrough, DEFAULT_CHARSET, OUT_DEFAULT_PRECIS, CLIP_DEFAULT_PRECIS,

@@ -62,6 +62,14 @@ private:
     HDC dc_;
 };
 
+// The screen's DPI along `axis` (LOGPIXELSX or LOGPIXELSY), as pictures, fonts and twips are measured
+// against it; 96 without a screen.
+inline int ScreenDpi(int axis = LOGPIXELSY) {
+    WindowDc screen(nullptr);
+    const int dpi = screen.get() ? ::GetDeviceCaps(screen.get(), axis) : 0;
+    return dpi > 0 ? dpi : 96;
+}
+
 // BeginPaint on construction, EndPaint on scope exit: a WM_PAINT handler's device context.
 class PaintGuard {
 public:

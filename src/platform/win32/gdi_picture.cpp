@@ -5,12 +5,8 @@
 namespace vantorel::win32 {
 
 namespace {
-std::int32_t ScreenDpi() {
-    WindowDc screen(nullptr);
-    return screen.get() ? ::GetDeviceCaps(screen.get(), LOGPIXELSX) : 96;
-}
 std::int32_t ToHimetric(std::int32_t pixels) {
-    return static_cast<std::int32_t>(std::lround(pixels * 2540.0 / ScreenDpi()));
+    return static_cast<std::int32_t>(std::lround(pixels * 2540.0 / ScreenDpi(LOGPIXELSX)));
 }
 }  // namespace
 

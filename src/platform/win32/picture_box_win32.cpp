@@ -20,13 +20,8 @@ COLORREF GdiPictureBox::Resolve(std::uint32_t colour) {
 
 GdiPictureBox::GdiPictureBox(int width, int height, HWND window)
     : width_(width), height_(height), window_(window) {
-    HDC screen = ::GetDC(nullptr);
-    if (screen != nullptr) {
-        int dpiX = ::GetDeviceCaps(screen, LOGPIXELSX), dpiY = ::GetDeviceCaps(screen, LOGPIXELSY);
-        if (dpiX > 0) twipsX_ = 1440 / dpiX;
-        if (dpiY > 0) twipsY_ = 1440 / dpiY;
-        ::ReleaseDC(nullptr, screen);
-    }
+    twipsX_ = 1440 / ScreenDpi(LOGPIXELSX);
+    twipsY_ = 1440 / ScreenDpi(LOGPIXELSY);
     dc_ = ::CreateCompatibleDC(nullptr);
     void* bits = nullptr;
     bitmap_ = CreateDib(dc_, width, -height, 32, &bits);
