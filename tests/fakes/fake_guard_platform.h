@@ -6,6 +6,7 @@
 #include <cstring>
 #include <functional>
 #include <string>
+#include <tuple>
 #include <utility>
 #include <vector>
 
@@ -27,18 +28,17 @@ inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint
     return platform::TcpRow{state, Ipv4(10, 0, 0, 1), 0x3930, remote, remotePort};
 }
 
-// The guard's view as a recorder: the count loaded at start-up and each count shown after it.
+// The guard's view as a recorder of each count shown after a teardown.
 class FakeGuardView final : public GuardView {
 public:
-    void CountLoaded(std::int32_t count) override { loaded.push_back(count); }
+    void CountLoaded(std::int32_t) override {}
     void CountIntercepted(std::int32_t count) override { shown.push_back(count); }
-    std::vector<std::int32_t> loaded, shown;
+    std::vector<std::int32_t> shown;
 };
 
 class FakeConnectionTable final : public platform::ConnectionTable {
 public:
-    std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool order) override {
-        lastOrder = order;
+    std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool) override {
         if (beforeFetch) beforeFetch();
         if (failWith != platform::kNoError) return failWith;
         std::uint32_t needed = platform::TcpTableBytes(static_cast<std::uint32_t>(rows.size()));
@@ -61,9 +61,7 @@ public:
     std::uint32_t failWith = platform::kNoError;
     std::uint32_t overstateCount = 0;  // a count larger than the rows written
     std::function<void()> beforeFetch;
-
-    bool lastOrder = true;
-    std::vector<platform::TcpRow> entries;    // every SetTcpEntry call
+    std::vector<platform::TcpRow> entries;  // every SetTcpEntry call
 };
 
 class FakeNotifyArea final : public platform::NotifyArea {
@@ -90,26 +88,19 @@ public:
         icons.push_back(i);
     }
     std::string Caption() const override { return caption; }
-    void SetCaption(const std::string& text) override {
-        caption = text;
-        ++captionChanges;
-    }
+    void SetCaption(const std::string& text) override { caption = text; }
     bool Visible() const override { return visible; }
     void SetVisible(bool v) override { visible = v; }
     platform::WindowState State() const override { return state; }
     void SetState(platform::WindowState s) override { state = s; }
     std::int32_t Width() const override { return width; }
     std::int32_t Height() const override { return height; }
-    void Move(std::int32_t l, std::int32_t t) override {
-        left = l;
-        top = t;
-    }
+    void Move(std::int32_t l, std::int32_t t) override { std::tie(left, top) = std::tie(l, t); }
 
     platform::WindowHandle handle = 0x1234;
     platform::IconHandle icon = 0x777;
     std::vector<platform::IconHandle> icons;  // every icon set, in order
     std::string caption = "FrmMain";
-    int captionChanges = 0;
     bool visible = false;
     platform::WindowState state = platform::WindowState::Normal;
     std::int32_t width = 616, height = 320, left = 0, top = 0;
@@ -154,10 +145,8 @@ public:
 
 class FakeInstance final : public platform::Instance {
 public:
-    bool PreviousInstance() override { return running; }
-    void CreateNamedMutex(const std::string& name) override { mutexes.push_back(name); }
-    bool running = false;
-    std::vector<std::string> mutexes;
+    bool PreviousInstance() override { return false; }
+    void CreateNamedMutex(const std::string&) override {}
 };
 
 }  // namespace vantorel::testing
