@@ -1,11 +1,11 @@
-// The definitions list: splitting the file, canonical keys, and lookups that answer exactly as a
-// halving search over the texts, for sorted, unsorted and hostile files.
+// The definitions list: splitting the file, canonical keys, and lookups in sorted, unsorted and
+// hostile files. Lookups answering exactly as the halving search over the texts, for any sorted file,
+// are the fuzz target tests/fuzz/definitions_sorted.cpp.
 #include "guard/definitions.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <random>
 #include <tuple>
 
 namespace vantorel {
@@ -76,39 +76,6 @@ TEST(DefinitionList, EveryLineCountsUnsortedFilesStillMatchAndATrailingLineBreak
         EXPECT_EQ(got, found) << text;
     }
     EXPECT_EQ(FindDefinition(DefinitionList::FromText("-9\n12\n5"), "-9"), 0);
-}
-
-TEST(DefinitionList, IndexAnswersExactlyAsTheHalvingSearch) {
-    // Random sorted lists with duplicates and odd lines: every probe answers as the text search.
-    std::mt19937 random(7);
-    for (int round = 0; round < 40; ++round) {
-        std::vector<std::string> lines;
-        int n = 1 + static_cast<int>(random() % 300);
-        for (int i = 0; i < n; ++i) {
-            auto value = static_cast<std::int32_t>(random() % 64) - 32;  // small range: many duplicates
-            if (random() % 5 == 0) value = static_cast<std::int32_t>(random());
-            lines.push_back(std::to_string(value));
-            if (random() % 40 == 0) lines.push_back(random() % 2 ? "0042" : " 7");
-            if (random() % 20 == 0) lines.push_back("");
-        }
-        std::sort(lines.begin(), lines.end());
-        std::string text;
-        for (const auto& line : lines) text += line + "\n";
-        text.pop_back();
-        DefinitionList list = DefinitionList::FromText(text);
-        ASSERT_EQ(Elements(list), Split(text, "\n")) << "every line as the splitter gives it";
-        if (!list.sorted()) continue;
-        for (std::int32_t probe = -40; probe <= 40; ++probe) {
-            char buffer[12];
-            ASSERT_EQ(list.FindKey(probe), list.FindText(FormatKey(probe, buffer))) << "probe " << probe;
-        }
-        for (const auto& line : lines) {
-            std::int32_t key = 0;
-            if (ParseCanonicalKey(line, key)) {
-                ASSERT_EQ(list.FindKey(key), list.FindText(line));
-            }
-        }
-    }
 }
 
 TEST(DefinitionList, BadInputGivesHarmlessKeys) {

@@ -84,11 +84,7 @@ struct MainRig {
         tray.events = &events;
     }
     void Put(std::int32_t root, const std::string& name, const std::string& value) {
-        RegistryRoutines reg(registry);
-        reg.hkey(root);
-        reg.KeyRoot(kSettingsKey);
-        reg.CreateKey();
-        reg.SetRegistryValue(name, value, platform::kRegSz);
+        registry.PutRaw(root, kSettingsKey, name, platform::kRegSz, std::vector<std::uint8_t>(value.begin(), value.end()));
     }
     std::string Get(std::int32_t root, const std::string& name) {
         RegistryRoutines reg(registry);

@@ -22,16 +22,6 @@ using platform::kTcpStateEstablished;
 
 std::string Key(std::uint32_t address) { return std::to_string(static_cast<std::int32_t>(address)); }
 
-// A sorted definitions text from address fields.
-DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
-    std::vector<std::string> keys;
-    for (auto a : addresses) keys.push_back(Key(a));
-    std::sort(keys.begin(), keys.end());
-    std::string text;
-    for (const auto& k : keys) text += k + "\r\n";
-    return DefinitionList::FromText(text);
-}
-
 std::string StoredAttempts(FakeRegistry& registry) {
     RegistryRoutines reg(registry);
     reg.hkey(platform::kHkeyCurrentUser);

@@ -3,6 +3,7 @@
 // switch, timers and the instance test.
 #pragma once
 
+#include <algorithm>
 #include <cstring>
 #include <functional>
 #include <string>
@@ -11,6 +12,7 @@
 #include <vector>
 
 #include "fakes/fake_message_pump.h"
+#include "guard/definitions.h"
 #include "guard/guard_view.h"
 #include "platform/connection_table.h"
 #include "platform/notify_area.h"
@@ -22,6 +24,16 @@ namespace vantorel::testing {
 constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std::uint8_t d) {
     return static_cast<std::uint32_t>(a) | static_cast<std::uint32_t>(b) << 8 | static_cast<std::uint32_t>(c) << 16 |
            static_cast<std::uint32_t>(d) << 24;
+}
+
+// A sorted definitions list holding the given address fields.
+inline DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
+    std::vector<std::string> keys;
+    for (auto a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
+    std::sort(keys.begin(), keys.end());
+    std::string text;
+    for (const auto& k : keys) text += k + "\r\n";
+    return DefinitionList::FromText(text);
 }
 
 inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint32_t remotePort = 0x5000) {

@@ -56,15 +56,6 @@ protected:
     FakeGuardView view_;
 };
 
-DefinitionList ListOf(std::vector<std::string> addresses) {
-    std::vector<std::string> keys;
-    for (const auto& a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(AddressField(a))));
-    std::sort(keys.begin(), keys.end());
-    std::string text;
-    for (const auto& k : keys) text += k + "\r\n";
-    return DefinitionList::FromText(text);
-}
-
 TEST_F(RealTeardown, RowsAreLaidOutLikeTheWindowsTable) {
     Listener listener = Listen("127.0.0.3");
     ASSERT_TRUE(listener.fd);
@@ -110,14 +101,12 @@ TEST_F(RealTeardown, ListedPeersAreAbortedAndCountedOnceUnlistedPeersKeepWorking
     Connection toHigh = Connect(high);
     ASSERT_TRUE(toListed.server && toUnlisted.server && toHigh.server);
 
-    DefinitionList list = ListOf({"127.0.0.2", "127.0.0.200", "192.0.2.1"});
+    DefinitionList list = ListOf({AddressField("127.0.0.2"), AddressField("127.0.0.200"), AddressField("192.0.2.1")});
     std::int32_t count = 0;
     ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, view_}, list, count);
     sweep.SweepConnections();
-    EXPECT_EQ(sweep.LastSweep().rows, 9u);
-    EXPECT_EQ(sweep.LastSweep().requested, 2u);
-    EXPECT_EQ(sweep.LastSweep().intercepted, 2u);
-    EXPECT_EQ(count, 2);
+    EXPECT_EQ(std::make_tuple(sweep.LastSweep().rows, sweep.LastSweep().requested, sweep.LastSweep().intercepted),
+              std::make_tuple(9u, 2u, 2u));
     EXPECT_EQ(view_.shown, (std::vector<std::int32_t>{1, 2}));
 
     EXPECT_EQ(ReadError(toListed.client.get()), ECONNABORTED) << "the listed connection was aborted";
@@ -147,13 +136,12 @@ TEST_F(RealTeardown, TablesBeyondTheFirstBufferAreSweptWhole) {
     Connection last = Connect(listed);  // its row comes well after row 1001
     ASSERT_TRUE(last.server);
 
-    DefinitionList list = ListOf({"127.0.0.2"});
+    DefinitionList list = ListOf({AddressField("127.0.0.2")});
     std::int32_t count = 0;
     ConnectionSweep sweep(SweepServices{*table_, pump_, registry_, view_}, list, count);
     sweep.SweepConnections();
-    EXPECT_EQ(sweep.LastSweep().rows, 2u * 1201 + 2);
-    EXPECT_EQ(sweep.LastSweep().fetchCalls, 2);
-    EXPECT_EQ(count, 1);
+    EXPECT_EQ(std::make_tuple(sweep.LastSweep().rows, sweep.LastSweep().fetchCalls, count),
+              std::make_tuple(2u * 1201 + 2, 2, 1));
     EXPECT_EQ(ReadError(last.client.get()), ECONNABORTED);
     EXPECT_EQ(ReadError(background.front().client.get()), EAGAIN);
 }
@@ -190,7 +178,7 @@ TEST_F(RealTeardown, WithoutTheRightToTearDownNothingIsCounted) {
     Listener listed = Listen("127.0.0.2");
     Connection connection = Connect(listed);
     ASSERT_TRUE(connection.server);
-    DefinitionList list = ListOf({"127.0.0.2"});
+    DefinitionList list = ListOf({AddressField("127.0.0.2")});
 
     // In a child process without CAP_NET_ADMIN the kernel refuses every teardown; the child reports
     // through its exit code: 0 all as expected, else the first check that failed.
@@ -205,10 +193,7 @@ TEST_F(RealTeardown, WithoutTheRightToTearDownNothingIsCounted) {
         std::int32_t count = 5;
         ConnectionSweep sweep(SweepServices{table, pump, registry, view}, list, count);
         for (int i = 0; i < 3; ++i) sweep.SweepConnections();
-        if (sweep.LastSweep().requested != 1) ::_exit(11);
-        if (count != 5) ::_exit(12);
-        if (!view.shown.empty()) ::_exit(13);
-        ::_exit(0);
+        ::_exit(sweep.LastSweep().requested != 1 ? 11 : count != 5 ? 12 : !view.shown.empty() ? 13 : 0);
     }
     int status = 0;
     ASSERT_EQ(::waitpid(child, &status, 0), child);
