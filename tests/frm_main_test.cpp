@@ -84,7 +84,7 @@ struct MainRig {
         tray.events = &events;
     }
     void Put(std::int32_t root, const std::string& name, const std::string& value) {
-        registry.PutRaw(root, kSettingsKey, name, platform::kRegSz, std::vector<std::uint8_t>(value.begin(), value.end()));
+        registry.PutRaw(root, kSettingsKey, name, platform::kRegSz, {value.begin(), value.end()});
     }
     std::string Get(std::int32_t root, const std::string& name) {
         RegistryRoutines reg(registry);

@@ -67,12 +67,12 @@ TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
     for (const auto& [type, start, tray, debugger, boxes] : cases) {
         FakeRegistry registry;
         auto put = [&](std::int32_t root, const char* key, const char* name, const std::string& v, std::int32_t t) {
-            registry.PutRaw(root, key, name, t, std::vector<std::uint8_t>(v.begin(), v.end()));
+            registry.PutRaw(root, key, name, t, {v.begin(), v.end()});
         };
         put(kHkeyLocalMachine, kRunKey, "Vantorel", "C:\\vantorel.exe", platform::kRegSz);
         put(kHkeyLocalMachine, kSettingsKey, "Start", start, type);
         put(kHkeyLocalMachine, kSettingsKey, "Tray", tray, platform::kRegSz);
-        put(platform::kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger", debugger, platform::kRegSz);
+        put(platform::kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger", debugger, 1);
         OptionsRig rig(registry);
         rig.form.Form_Load();
         std::string got;
