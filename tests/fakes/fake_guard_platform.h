@@ -147,9 +147,7 @@ public:
 class FakeWindowManager final : public platform::WindowManager {
 public:
     bool SetWindowPos(platform::WindowHandle, platform::WindowHandle, std::int32_t, std::int32_t, std::int32_t,
-                      std::int32_t, std::uint32_t) override {
-        return true;
-    }
+                      std::int32_t, std::uint32_t) override { return true; }
     std::int32_t ScreenWidth() const override { return 1024; }
     std::int32_t ScreenHeight() const override { return 768; }
     bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t) override { return true; }
