@@ -75,16 +75,9 @@ TEST_F(RealTeardown, RowsAreLaidOutLikeTheWindowsTable) {
                               std::uint32_t{htons(listener.port)}))
         << "127.0.0.3 in network order, read little-endian";
 
-    // A sorted table comes back in address and port order.
-    std::vector<std::uint32_t> words(1 + 5 * 16);
-    auto size = static_cast<std::uint32_t>(words.size() * 4);
-    ASSERT_EQ(table_->GetTcpTable(words.data(), size, true), platform::kNoError);
-    ASSERT_EQ(words[0], 3u);
-    EXPECT_EQ(words[1 + 1], 0x0100007Fu) << "127.0.0.1 sorts first";
-
     // Too small a buffer: the size needed, nothing written.
+    std::vector<std::uint32_t> words(1 + 5, 77);
     std::uint32_t small = 4 + 20;
-    words[0] = 77;
     EXPECT_EQ(table_->GetTcpTable(words.data(), small, false), platform::kErrorInsufficientBuffer);
     EXPECT_EQ(small, 4u + 3 * 20);
     EXPECT_EQ(words[0], 77u);
