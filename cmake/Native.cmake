@@ -18,12 +18,8 @@ add_executable(vantorel_tests
     tests/file_downloader_test.cpp
     tests/http_header_test.cpp
     tests/leading_number_test.cpp
-    tests/contract/file_system_contract.cpp
-    tests/contract/file_system_contract_fake.cpp
     tests/sweep_test.cpp
     tests/frm_main_test.cpp
-    tests/contract/registry_contract.cpp
-    tests/contract/registry_contract_fake.cpp
 )
 target_link_libraries(vantorel_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)
 gtest_discover_tests(vantorel_tests DISCOVERY_TIMEOUT 60)

@@ -58,32 +58,26 @@ Variant Read(FakeRegistry& registry, const std::string& key, const std::string& 
 }
 
 TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
-    FakeRegistry registry;
-    RegistryRoutines vantorel(registry), ie(registry), run(registry);
-    vantorel.hkey(platform::kHkeyLocalMachine);
-    vantorel.KeyRoot(kSettingsKey);
-    vantorel.CreateKey();
-    ie.hkey(platform::kHkeyCurrentUser);
-    ie.KeyRoot(kInternetExplorerMainKey);
-    ie.CreateKey();
-    run.hkey(platform::kHkeyLocalMachine);
-    run.KeyRoot(std::string(kRunKey) + "\\");
-    run.CreateKey();
-    run.SetRegistryValue("Vantorel", std::string("C:\\vantorel.exe"), platform::kRegSz);
-    const std::tuple<Variant, std::string, std::string, bool, bool, bool> cases[] = {
-        {std::string("2"), "0", "Yes", false, false, false},
-        {std::string("abc"), " 1 ", "no", false, true, false},
-        {std::int32_t{1}, "1x", "yes", true, false, true},
+    using platform::kHkeyLocalMachine;
+    const std::tuple<std::int32_t, std::string, std::string, std::string, std::string> cases[] = {
+        {platform::kRegSz, "2", "0", "Yes", "000"},
+        {platform::kRegSz, "abc", " 1 ", "no", "010"},
+        {platform::kRegDword, std::string("\1\0\0\0", 4), "1x", "yes", "101"},
     };
-    for (const auto& [start, tray, debugger, expectStart, expectTray, expectDebugger] : cases) {
-        vantorel.SetRegistryValue("Start", start, std::holds_alternative<std::int32_t>(start) ? 4 : 1);
-        vantorel.SetRegistryValue("Tray", tray, 1);
-        ie.SetRegistryValue("Disable Script Debugger", debugger, 1);
+    for (const auto& [type, start, tray, debugger, boxes] : cases) {
+        FakeRegistry registry;
+        auto put = [&](std::int32_t root, const char* key, const char* name, const std::string& v, std::int32_t t) {
+            registry.PutRaw(root, key, name, t, {v.begin(), v.end()});
+        };
+        put(kHkeyLocalMachine, kRunKey, "Vantorel", "C:\\vantorel.exe", platform::kRegSz);
+        put(kHkeyLocalMachine, kSettingsKey, "Start", start, type);
+        put(kHkeyLocalMachine, kSettingsKey, "Tray", tray, platform::kRegSz);
+        put(platform::kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger", debugger, 1);
         OptionsRig rig(registry);
         rig.form.Form_Load();
-        EXPECT_EQ(std::make_tuple(rig.box[0].Value(), rig.box[1].Value(), rig.box[2].Value()),
-                  std::make_tuple(expectStart, expectTray, expectDebugger))
-            << VariantText(start) << " " << tray << " " << debugger;
+        std::string got;
+        for (const FakeCheckBox& box : rig.box) got += box.Value() ? '1' : '0';
+        EXPECT_EQ(got, boxes) << tray << " " << debugger;
     }
 }
 

@@ -1,10 +1,8 @@
 // Registry routines against the fake: what the real registry cannot be made to hold through the
-// ANSI calls (odd stored data), handle hygiene, and the text helpers.
+// ANSI calls (odd stored data), and handle hygiene.
 #include "settings/registry_routines.h"
 
 #include <gtest/gtest.h>
-
-#include <tuple>
 
 #include "fakes/fake_registry.h"
 
@@ -19,18 +17,6 @@ RegistryRoutines Vantorel(FakeRegistry& registry) {
     reg.hkey(kHkeyCurrentUser);
     reg.KeyRoot("SOFTWARE\\Vantorel\\");
     return reg;
-}
-
-TEST(RegistryRoutines, FieldsStartEmptyAndTrimNullCutsAtTheFirstNul) {
-    FakeRegistry registry;
-    RegistryRoutines reg(registry);
-    EXPECT_EQ(std::make_tuple(reg.hkey(), reg.KeyRoot(), reg.Subkey(), reg.KeyExists()),
-              std::make_tuple(0, std::string(), std::string(), false)) << "root 0 is no key";
-    for (auto [item, trimmed] : {std::pair{std::string("abc\0def", 7), "abc"}, std::pair{std::string("abc"), "abc"},
-                                 std::pair{std::string("\0x", 2), ""}}) {
-        EXPECT_EQ(RegistryRoutines::TrimNull(item), trimmed);
-        EXPECT_EQ(item, trimmed);
-    }
 }
 
 TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
@@ -68,26 +54,25 @@ TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
     EXPECT_EQ(registry.OpenHandles(), 0u);
 }
 
-TEST(RegistryRoutines, EveryOperationDoesItsWorkAndClosesWhatItOpened) {
+TEST(RegistryRoutines, EveryOperationClosesWhatItOpened) {
+    // What each operation does is proved on the real registry (tests/contract/); here, no handle leaks.
     FakeRegistry registry;
     RegistryRoutines reg = Vantorel(registry);
-    EXPECT_EQ(reg.CreateKey(), "0");
-    EXPECT_TRUE(reg.KeyExists());
-    EXPECT_TRUE(reg.SetRegistryValue("State", std::string("1"), 1));
-    EXPECT_FALSE(reg.SetRegistryValue("State", std::string("x"), 4));
-    EXPECT_EQ(reg.GetRegistryValue("State"), Variant(std::string("1")));
-    EXPECT_TRUE(IsEmpty(reg.GetRegistryValue("Missing")));
-    EXPECT_EQ(reg.EnumRegistryKeys(kHkeyCurrentUser, "SOFTWARE").size(), 1u);
-    EXPECT_EQ(reg.EnumRegistryValues(kHkeyCurrentUser, "SOFTWARE\\Vantorel").size(), 1u);
-    EXPECT_TRUE(reg.WriteRemoteRegistryValue("", kHkeyCurrentUser, "State", std::string("0"), 1));
-    EXPECT_EQ(reg.ReadRemoteRegistryValue("", kHkeyCurrentUser, "State"), Variant(std::string("0")));
-    EXPECT_EQ(reg.ReadRemoteRegistryValue("\\\\far", kHkeyCurrentUser, "State"), Variant(std::string("Error!")));
-    EXPECT_EQ(reg.DeleteValue("State"), 0);
-    EXPECT_EQ(reg.DeleteValue("State"), platform::kErrorFileNotFound);
+    reg.CreateKey();
+    reg.SetRegistryValue("State", std::string("1"), 1);
+    reg.SetRegistryValue("State", std::string("x"), 4);
+    reg.GetRegistryValue("State");
+    reg.GetRegistryValue("Missing");
+    reg.EnumRegistryKeys(kHkeyCurrentUser, "SOFTWARE");
+    reg.EnumRegistryValues(kHkeyCurrentUser, "SOFTWARE\\Vantorel");
+    reg.WriteRemoteRegistryValue("", kHkeyCurrentUser, "State", std::string("0"), 1);
+    reg.ReadRemoteRegistryValue("", kHkeyCurrentUser, "State");
+    reg.ReadRemoteRegistryValue("\\\\far", kHkeyCurrentUser, "State");
+    reg.DeleteValue("State");
+    reg.DeleteValue("State");
     EXPECT_EQ(registry.OpenHandles(), 0u);
     // Enumerating the predefined root itself leaves it open for the next call.
-    auto keys = reg.EnumRegistryKeys(kHkeyCurrentUser, "");
-    EXPECT_EQ(std::make_pair(keys.size(), keys[0]), std::make_pair(std::size_t{1}, std::string("SOFTWARE")));
+    EXPECT_EQ(reg.EnumRegistryKeys(kHkeyCurrentUser, "").size(), 1u);
     EXPECT_TRUE(reg.KeyExists());
     EXPECT_EQ(registry.OpenHandles(), 0u);
 }

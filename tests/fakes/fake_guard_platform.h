@@ -3,13 +3,16 @@
 // switch, timers and the instance test.
 #pragma once
 
+#include <algorithm>
 #include <cstring>
 #include <functional>
 #include <string>
+#include <tuple>
 #include <utility>
 #include <vector>
 
 #include "fakes/fake_message_pump.h"
+#include "guard/definitions.h"
 #include "guard/guard_view.h"
 #include "platform/connection_table.h"
 #include "platform/notify_area.h"
@@ -23,22 +26,31 @@ constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std
            static_cast<std::uint32_t>(d) << 24;
 }
 
+// A sorted definitions list holding the given address fields.
+inline DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
+    std::vector<std::string> keys;
+    for (auto a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
+    std::sort(keys.begin(), keys.end());
+    std::string text;
+    for (const auto& k : keys) text += k + "\r\n";
+    return DefinitionList::FromText(text);
+}
+
 inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint32_t remotePort = 0x5000) {
     return platform::TcpRow{state, Ipv4(10, 0, 0, 1), 0x3930, remote, remotePort};
 }
 
-// The guard's view as a recorder: the count loaded at start-up and each count shown after it.
+// The guard's view as a recorder of each count shown after a teardown.
 class FakeGuardView final : public GuardView {
 public:
-    void CountLoaded(std::int32_t count) override { loaded.push_back(count); }
+    void CountLoaded(std::int32_t) override {}
     void CountIntercepted(std::int32_t count) override { shown.push_back(count); }
-    std::vector<std::int32_t> loaded, shown;
+    std::vector<std::int32_t> shown;
 };
 
 class FakeConnectionTable final : public platform::ConnectionTable {
 public:
-    std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool order) override {
-        lastOrder = order;
+    std::uint32_t GetTcpTable(void* table, std::uint32_t& size, bool) override {
         if (beforeFetch) beforeFetch();
         if (failWith != platform::kNoError) return failWith;
         std::uint32_t needed = platform::TcpTableBytes(static_cast<std::uint32_t>(rows.size()));
@@ -61,9 +73,7 @@ public:
     std::uint32_t failWith = platform::kNoError;
     std::uint32_t overstateCount = 0;  // a count larger than the rows written
     std::function<void()> beforeFetch;
-
-    bool lastOrder = true;
-    std::vector<platform::TcpRow> entries;    // every SetTcpEntry call
+    std::vector<platform::TcpRow> entries;  // every SetTcpEntry call
 };
 
 class FakeNotifyArea final : public platform::NotifyArea {
@@ -90,26 +100,19 @@ public:
         icons.push_back(i);
     }
     std::string Caption() const override { return caption; }
-    void SetCaption(const std::string& text) override {
-        caption = text;
-        ++captionChanges;
-    }
+    void SetCaption(const std::string& text) override { caption = text; }
     bool Visible() const override { return visible; }
     void SetVisible(bool v) override { visible = v; }
     platform::WindowState State() const override { return state; }
     void SetState(platform::WindowState s) override { state = s; }
     std::int32_t Width() const override { return width; }
     std::int32_t Height() const override { return height; }
-    void Move(std::int32_t l, std::int32_t t) override {
-        left = l;
-        top = t;
-    }
+    void Move(std::int32_t l, std::int32_t t) override { std::tie(left, top) = std::tie(l, t); }
 
     platform::WindowHandle handle = 0x1234;
     platform::IconHandle icon = 0x777;
     std::vector<platform::IconHandle> icons;  // every icon set, in order
     std::string caption = "FrmMain";
-    int captionChanges = 0;
     bool visible = false;
     platform::WindowState state = platform::WindowState::Normal;
     std::int32_t width = 616, height = 320, left = 0, top = 0;
@@ -144,9 +147,7 @@ public:
 class FakeWindowManager final : public platform::WindowManager {
 public:
     bool SetWindowPos(platform::WindowHandle, platform::WindowHandle, std::int32_t, std::int32_t, std::int32_t,
-                      std::int32_t, std::uint32_t) override {
-        return true;
-    }
+                      std::int32_t, std::uint32_t) override { return true; }
     std::int32_t ScreenWidth() const override { return 1024; }
     std::int32_t ScreenHeight() const override { return 768; }
     bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t) override { return true; }
@@ -154,10 +155,8 @@ public:
 
 class FakeInstance final : public platform::Instance {
 public:
-    bool PreviousInstance() override { return running; }
-    void CreateNamedMutex(const std::string& name) override { mutexes.push_back(name); }
-    bool running = false;
-    std::vector<std::string> mutexes;
+    bool PreviousInstance() override { return false; }
+    void CreateNamedMutex(const std::string&) override {}
 };
 
 }  // namespace vantorel::testing

@@ -29,17 +29,11 @@ FakeRegistry::Node* FakeRegistry::NodeOf(RegKey key) const {
 }
 
 FakeRegistry::Node* FakeRegistry::Walk(Node* from, const std::string& path, bool create, std::int32_t& status) {
-    std::vector<std::string> parts;
-    std::string part;
+    std::vector<std::string> parts(1);
     for (char c : path) {
-        if (c == '\\') {
-            parts.push_back(part);
-            part.clear();
-        } else {
-            part.push_back(c);
-        }
+        if (c == '\\') parts.emplace_back();
+        else parts.back().push_back(c);
     }
-    parts.push_back(part);
     while (!parts.empty() && parts.back().empty()) parts.pop_back();  // trailing separators name the same key
     Node* node = from;
     for (const std::string& name : parts) {
@@ -70,24 +64,22 @@ RegKey FakeRegistry::NewHandle(Node* node, std::int32_t access) {
     return key;
 }
 
-std::int32_t FakeRegistry::OpenKey(RegKey parent, const std::string& path, std::int32_t access, RegKey& key) {
+std::int32_t FakeRegistry::Open(RegKey parent, const std::string& path, std::int32_t access, RegKey& key,
+                                bool create) {
     Node* from = NodeOf(parent);
     if (from == nullptr) return 6;  // ERROR_INVALID_HANDLE
     std::int32_t status = kErrorSuccess;
-    Node* node = Walk(from, path, false, status);
-    if (node == nullptr) return status;
-    key = NewHandle(node, access);
-    return kErrorSuccess;
+    Node* node = Walk(from, path, create, status);
+    if (node != nullptr) key = NewHandle(node, access);
+    return status;
+}
+
+std::int32_t FakeRegistry::OpenKey(RegKey parent, const std::string& path, std::int32_t access, RegKey& key) {
+    return Open(parent, path, access, key, false);
 }
 
 std::int32_t FakeRegistry::CreateKey(RegKey parent, const std::string& path, std::int32_t access, RegKey& key) {
-    Node* from = NodeOf(parent);
-    if (from == nullptr) return 6;
-    std::int32_t status = kErrorSuccess;
-    Node* node = Walk(from, path, true, status);
-    if (node == nullptr) return status;
-    key = NewHandle(node, access);
-    return kErrorSuccess;
+    return Open(parent, path, access, key, true);
 }
 
 std::int32_t FakeRegistry::CloseKey(RegKey key) {
@@ -127,12 +119,17 @@ std::int32_t FakeRegistry::QueryValue(RegKey key, const std::string& name, std::
     if (node == nullptr) return 6;
     auto it = node->values.find(Lower(name));
     if (it == node->values.end()) return kErrorFileNotFound;
-    type = it->second.type;
-    auto size = static_cast<std::uint32_t>(it->second.data.size());
+    return CopyOut(it->second, type, data, count);
+}
+
+std::int32_t FakeRegistry::CopyOut(const Value& value, std::int32_t& type, std::vector<std::uint8_t>& data,
+                                   std::uint32_t& count) {
+    type = value.type;
+    auto size = static_cast<std::uint32_t>(value.data.size());
     std::uint32_t capacity = std::min<std::uint32_t>(count, static_cast<std::uint32_t>(data.size()));
     count = size;
     if (size > capacity) return kErrorMoreData;
-    std::copy(it->second.data.begin(), it->second.data.end(), data.begin());
+    std::copy(value.data.begin(), value.data.end(), data.begin());
     return kErrorSuccess;
 }
 
@@ -167,13 +164,7 @@ std::int32_t FakeRegistry::EnumValue(RegKey key, std::uint32_t index, std::uint3
     const Value& value = std::next(node->values.begin(), index)->second;
     if (value.name.size() + 1 > nameCapacity) return kErrorMoreData;
     name = value.name;
-    type = value.type;
-    auto size = static_cast<std::uint32_t>(value.data.size());
-    std::uint32_t capacity = std::min<std::uint32_t>(count, static_cast<std::uint32_t>(data.size()));
-    count = size;
-    if (size > capacity) return kErrorMoreData;
-    std::copy(value.data.begin(), value.data.end(), data.begin());
-    return kErrorSuccess;
+    return CopyOut(value, type, data, count);
 }
 
 std::int32_t FakeRegistry::ConnectRegistry(const std::string& computer, RegKey root, RegKey& key) {

@@ -64,6 +64,10 @@ private:
     // Walks `path` below `from`; creates missing keys when `create` is set. Null when missing.
     Node* Walk(Node* from, const std::string& path, bool create, std::int32_t& status);
     platform::RegKey NewHandle(Node* node, std::int32_t access);
+    std::int32_t Open(platform::RegKey parent, const std::string& path, std::int32_t access, platform::RegKey& key,
+                      bool create);
+    static std::int32_t CopyOut(const Value& value, std::int32_t& type, std::vector<std::uint8_t>& data,
+                                std::uint32_t& count);
 
     std::map<std::int32_t, std::unique_ptr<Node>> roots_;
     std::map<platform::RegKey, Handle> handles_;

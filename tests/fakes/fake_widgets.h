@@ -7,61 +7,48 @@ namespace vantorel::testing {
 
 class FakeButton final : public platform::Button {
 public:
-    explicit FakeButton(std::string caption = {}) : caption_(std::move(caption)) {}
-    void SetCaption(const std::string& caption) override { caption_ = caption; }
-    std::string Caption() const override { return caption_; }
-    void SetEnabled(bool enabled) override { enabled_ = enabled; }
-    bool Enabled() const override { return enabled_; }
+    void SetCaption(const std::string& text) override { caption = text; }
+    std::string Caption() const override { return caption; }
+    void SetEnabled(bool value) override { enabled = value; }
+    bool Enabled() const override { return enabled; }
     // The user clicks: nothing happens while disabled.
     void UserClick() {
-        if (enabled_ && Click) Click();
+        if (enabled && Click) Click();
     }
-
-private:
-    std::string caption_;
-    bool enabled_ = true;
+    std::string caption;
+    bool enabled = true;
 };
 
 class FakeLabel final : public platform::Label {
 public:
-    explicit FakeLabel(std::string caption = {}) : caption_(std::move(caption)) {}
-    void SetCaption(const std::string& caption) override { caption_ = caption; }
-    std::string Caption() const override { return caption_; }
-
-private:
-    std::string caption_;
+    void SetCaption(const std::string& text) override { caption = text; }
+    std::string Caption() const override { return caption; }
+    std::string caption;
 };
 
 class FakeFrame final : public platform::Frame {
 public:
-    explicit FakeFrame(std::string caption = {}, bool visible = true)
-        : caption_(std::move(caption)), visible_(visible) {}
-    void SetCaption(const std::string& caption) override { caption_ = caption; }
-    std::string Caption() const override { return caption_; }
-    void SetVisible(bool visible) override { visible_ = visible; }
-    bool Visible() const override { return visible_; }
-
-private:
-    std::string caption_;
-    bool visible_;
+    void SetCaption(const std::string& text) override { caption = text; }
+    std::string Caption() const override { return caption; }
+    void SetVisible(bool value) override { visible = value; }
+    bool Visible() const override { return visible; }
+    std::string caption;
+    bool visible = true;
 };
 
 class FakeCheckBox final : public platform::CheckBox {
 public:
-    explicit FakeCheckBox(std::string caption = {}) : caption_(std::move(caption)) {}
-    void SetCaption(const std::string& caption) override { caption_ = caption; }
-    std::string Caption() const override { return caption_; }
-    void SetValue(bool checked) override { checked_ = checked; }
-    bool Value() const override { return checked_; }
+    void SetCaption(const std::string& text) override { caption = text; }
+    std::string Caption() const override { return caption; }
+    void SetValue(bool value) override { checked = value; }
+    bool Value() const override { return checked; }
     // The user's click: the box toggles, then raises its click.
     void UserToggle() {
-        checked_ = !checked_;
+        checked = !checked;
         if (Click) Click();
     }
-
-private:
-    std::string caption_;
-    bool checked_ = false;
+    std::string caption;
+    bool checked = false;
 };
 
 }  // namespace vantorel::testing

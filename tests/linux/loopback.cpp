@@ -28,10 +28,8 @@ FileDescriptor::~FileDescriptor() {
 }
 
 std::string TeardownUnavailableReason() {
-    if (::geteuid() != 0)
-        return "not run as root: tearing connections down (SOCK_DESTROY) and a private network namespace need root, "
-               "so the real-teardown tests are skipped";
-    return std::string();
+    return ::geteuid() == 0 ? "" : "not run as root: tearing connections down (SOCK_DESTROY) and a private network "
+                                   "namespace need root, so the real-teardown tests are skipped";
 }
 
 std::string EnterPrivateNetwork() {

@@ -1,27 +1,11 @@
 #!/usr/bin/python3
-"""A scriptable HTTP server for the download tests, on 127.0.0.1 only.
+"""A scriptable HTTP server for the download tests, on 127.0.0.1 only; the path says what to answer.
 
-The path says what to answer; bodies are a fixed byte pattern (byte i is (7 i + i // 251) mod 256)
-so a test can check every byte it received:
-
-  /body/N            200, Content-Length N
-  /range/N           206 with the whole body when the request carries "Range: bytes=0-", else 400
-  /status/CODE       that status with a short body
-  /auth/N            401 unless Basic credentials vt / secret come along, then 200 with N bytes
-  /cut/N/SENT        announces N bytes, sends SENT, then closes the connection
-  /nolength/N        N bytes without a Content-Length, ended by closing the connection
-  /length/TEXT/N     Content-Length: TEXT (any text), then N bytes and a close
-  /slow/N/MS[/PIECE] N bytes in pieces of PIECE (1024) bytes with a pause of MS milliseconds before each
-  /stall/MS          answers 200 with 10 bytes only after MS milliseconds
-  /noanswer          accepts the request and never answers
-  /trickle/N/MS      announces N bytes and sends one byte every MS milliseconds
-  /endless           announces 1,000,000,000 bytes and sends as fast as it is read
-  /twolengths/A/B    Content-Length: A and Content-Length: B, then A bytes
-  /vt/NAME           an update server: "defver" 99, "mainver" 0, "sw2.def" a list of keys
-  /do/KIND,ARG,.../NAME/vt/FILE  the update server, answering FILE NAME as /KIND/ARG/... would
-                     (a bare "trickle" sends 2000 bytes at one a second)
-
-With --tls CERT KEY it speaks https instead. The listening port is chosen by the system and written to --port-file once the server listens.
+Bodies are a fixed pattern (byte i is (7 i + i // 251) mod 256). Paths: /body/N, /range/N (206 only for
+"Range: bytes=0-"), /status/CODE, /auth/N (Basic vt / secret), /cut/N/SENT, /nolength/N, /length/TEXT/N,
+/slow/N/MS[/PIECE], /stall/MS, /noanswer, /trickle/N/MS, /endless, /twolengths/A/B, /vt/NAME (an update
+server) and /do/KIND,ARG,.../NAME/vt/FILE (the update server answering FILE NAME as /KIND/ARG/... would).
+With --tls CERT KEY it speaks https. The port, chosen by the system, is written to --port-file.
 """
 import argparse
 import base64
@@ -32,16 +16,13 @@ import time
 from http.server import BaseHTTPRequestHandler, ThreadingHTTPServer
 
 
-def pattern(size):
-    return bytes(((i * 7 + i // 251) & 0xFF) for i in range(size))
-
-
 _cache = {}
 
 
 def body(size):
     if size not in _cache:
-        _cache[size] = pattern(size) if size <= 1 << 20 else (pattern(1 << 20) * (size // (1 << 20) + 1))[:size]
+        unit = bytes(((i * 7 + i // 251) & 0xFF) for i in range(min(size, 1 << 20)))
+        _cache[size] = (unit * (size // len(unit) + 1))[:size] if unit else b""
     return _cache[size]
 
 
@@ -117,31 +98,24 @@ class Handler(BaseHTTPRequestHandler):
                     self.answer(200, body(int(args[0])))
                 else:
                     self.answer(401, b"who are you?", extra=[("WWW-Authenticate", 'Basic realm="vt"')])
-            elif kind == "cut":
-                n, sent = int(args[0]), int(args[1])
+            elif kind in ("cut", "length"):  # announces N (or TEXT), sends SENT (or N) bytes and closes
+                announced, n = (args[0], int(args[1])) if kind == "length" else (args[0], int(args[0]))
                 self.send_response(200)
-                self.send_header("Content-Length", str(n))
+                self.send_header("Content-Length", announced)
                 self.end_headers()
-                self.wfile.write(body(n)[:sent])
+                self.wfile.write(body(n)[:int(args[1])])
                 self.cut()
             elif kind == "nolength":
                 self.answer(200, body(int(args[0])), length=False, close=True)
-            elif kind == "length":
-                self.send_response(200)
-                self.send_header("Content-Length", args[0])
-                self.end_headers()
-                self.wfile.write(body(int(args[1])))
-                self.cut()
             elif kind == "slow":
                 n, pause = int(args[0]), int(args[1]) / 1000.0
                 piece = int(args[2]) if len(args) > 2 else 1024
                 self.send_response(200)
                 self.send_header("Content-Length", str(n))
                 self.end_headers()
-                data = body(n)
                 for start in range(0, n, piece):
                     time.sleep(pause)
-                    self.wfile.write(data[start:start + piece])
+                    self.wfile.write(body(n)[start:start + piece])
                     self.wfile.flush()
             elif kind == "stall":
                 time.sleep(int(args[0]) / 1000.0)

@@ -1,7 +1,5 @@
 #!/bin/sh
-# Starts or stops nginx as a loopback update server for the tests, by PID.
-#   nginx_fixture.sh start DIR   serves DIR/www on a free 127.0.0.1 port, written to DIR/server.port
-#   nginx_fixture.sh stop DIR    ends the nginx whose PID is in DIR/server.pid
+# start DIR: nginx serves DIR/www on a free 127.0.0.1 port (in DIR/server.port); stop DIR ends it by its PID.
 set -u
 action=$1
 dir=$2

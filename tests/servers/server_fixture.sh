@@ -1,6 +1,5 @@
 #!/bin/sh
-# Starts or stops a test server in the background, by PID: server_fixture.sh start DIR SCRIPT [ARGS...]
-# writes DIR/server.pid and waits for DIR/server.port; server_fixture.sh stop DIR ends that PID.
+# start DIR SCRIPT [ARGS...]: a test server in the background, waiting for DIR/server.port; stop DIR ends its PID.
 set -u
 action=$1
 dir=$2

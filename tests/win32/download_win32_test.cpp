@@ -20,6 +20,7 @@
 #include <sstream>
 
 #include "download/file_downloader.h"
+#include "fakes/fake_http_transfer.h"
 #include "platform/win32/file_system_win32.h"
 #include "platform/win32/http_transfer_win32.h"
 #include "platform/win32/shell_win32.h"
@@ -29,12 +30,25 @@ namespace {
 
 using testing::ReadFile;
 using testing::WriteFile;
-using Events = std::vector<std::string>;
+const auto Pattern = testing::FakeHttpTransfer::Body;
 
-std::string Pattern(std::size_t size) {
-    std::string data(size, '\0');
-    for (std::size_t i = 0; i < size; ++i) data[i] = static_cast<char>((i * 7 + i / 251) & 0xFF);
-    return data;
+// The loopback server whose port the fixture wrote to `file`.
+std::string Server(const std::string& scheme, const std::string& file) {
+    std::string port = ReadFile("Z:" + file);
+    while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back()))) port.pop_back();
+    return scheme + "://127.0.0.1:" + port;
+}
+
+// A thread timer standing for the user's click on "Cancel" after `ms`; the time it fired in `at`.
+FileDownloader* cancelTarget = nullptr;
+DWORD cancelledAt = 0;
+UINT_PTR CancelAfter(FileDownloader& fd, UINT ms) {
+    cancelTarget = &fd;
+    return ::SetTimer(nullptr, 0, ms, [](HWND, UINT, UINT_PTR id, DWORD) {
+        ::KillTimer(nullptr, id);
+        cancelledAt = ::GetTickCount();
+        cancelTarget->Cancel();
+    });
 }
 
 std::string Progress(std::initializer_list<int> steps) {
@@ -48,9 +62,7 @@ protected:
     void SetUp() override {
         const char* file = std::getenv("VANTOREL_HTTP_PORT_FILE");
         ASSERT_NE(file, nullptr) << "no test server: VANTOREL_HTTP_PORT_FILE is not set";
-        std::string port = ReadFile(std::string("Z:") + file);
-        while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back()))) port.pop_back();
-        server_ = "http://127.0.0.1:" + port;
+        server_ = Server("http", file);
         char temp[MAX_PATH];
         ::GetTempPathA(MAX_PATH, temp);
         folder_ = std::string(temp) + "vtdl-" + std::to_string(::GetCurrentProcessId()) + "-" +
@@ -67,7 +79,8 @@ protected:
         ::RemoveDirectoryA((folder_ + "\\new").c_str());
         EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
     }
-    // Runs one download; true when it completed. A download that did not complete changed nothing.
+    // Runs one download; true when it completed. One that did not changed nothing (and TearDown finds
+    // no partial file left).
     bool Get(const std::string& path, const std::string& user = "", const std::string& password = "") {
         events_.clear();
         bool done = fd_.DownloadFile(path.rfind("/", 0) == 0 ? server_ + path : path, dest_, user, password);
@@ -95,8 +108,7 @@ TEST_F(WinInetDownload, BodiesOfEverySizeArriveWholeWithProgressPerChunk) {
         WriteFile(dest_, kOld);
         EXPECT_TRUE(Get(path)) << path;
         EXPECT_EQ(events_, events) << path;
-        const std::size_t size = std::stoul(path.substr(path.rfind('/') + 1));
-        EXPECT_EQ(ReadFile(dest_), Pattern(size)) << path << ": an announced size of 0 gives an empty file";
+        EXPECT_EQ(ReadFile(dest_), Pattern(std::stoul(path.substr(path.rfind('/') + 1)))) << path;
     }
     // Several worker blocks (64 KiB) and a last short chunk: every byte in place.
     EXPECT_TRUE(Get("/body/300001"));
@@ -124,11 +136,15 @@ TEST_F(WinInetDownload, RefusalsCutsAndUnusableSizesLeaveTheInstalledFile) {
     EXPECT_FALSE(Get("/cut/5000/3072"));
     EXPECT_EQ(events_,
               "progress:20 progress:41 progress:61 progress:61 error:The connection with the server was reset. ");
-    // Sizes beyond a signed 32-bit integer, and negative ones: refused with a message naming them.
-    for (const std::string length : {"99999999999", "-5", "2147483648", "1e999"}) {
-        EXPECT_FALSE(Get("/length/" + length + "/3000"));
+    // Sizes beyond a signed 32-bit integer, negative ones and two different ones: refused, named.
+    const std::pair<std::string, std::string> sizes[] = {
+        {"/length/99999999999/3000", "99999999999"}, {"/length/-5/3000", "-5"},
+        {"/length/2147483648/3000", "2147483648"}, {"/length/1e999/3000", "1e999"},
+        {"/twolengths/3000/5000", "both 3000 and 5000"}};
+    for (const auto& [path, named] : sizes) {
+        EXPECT_FALSE(Get(path));
         EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;
-        EXPECT_NE(events_.find(length), std::string::npos) << events_;
+        EXPECT_NE(events_.find(named), std::string::npos) << events_;
     }
     EXPECT_TRUE(Get("/auth/3000", "vt", "secret")) << "the protected file with the right credentials";
     EXPECT_EQ(ReadFile(dest_), Pattern(3000));
@@ -144,44 +160,23 @@ TEST_F(WinInetDownload, SlowDataShowsProgressAndCancelEndsEveryWaitWithinASecond
     EXPECT_TRUE(Get("/slow/4096/500/1024"));
     EXPECT_LT(longest, 1000u) << "the longest wait for progress";
     EXPECT_TRUE(ReadFile(dest_) == Pattern(4096));
-    WriteFile(dest_, kOld);
+    WriteFile(dest_, kOld);  // what a failed download must leave
 
-    // The user cancels (a thread timer stands for the click) while the server does not answer,
-    // trickles a byte a second, or sends without end.
-    static FileDownloader* target = nullptr;
-    static DWORD cancelledAt = 0;
-    target = &fd_;
-    for (const char* path : {"/noanswer", "/trickle/2000/1000", "/endless"}) {
+    // The user cancels while the server does not answer, trickles a byte a second, sends without end,
+    // or holds its answer for 8 s.
+    fd_.DownloadProgress = nullptr;
+    for (const char* path : {"/noanswer", "/trickle/2000/1000", "/endless", "/stall/8000"}) {
         SCOPED_TRACE(path);
-        events_.clear();
-        fd_.DownloadProgress = nullptr;
-        UINT_PTR timer = ::SetTimer(nullptr, 0, 1500, [](HWND, UINT, UINT_PTR id, DWORD) {
-            ::KillTimer(nullptr, id);
-            cancelledAt = ::GetTickCount();
-            target->Cancel();
-        });
+        UINT_PTR timer = CancelAfter(fd_, 1500);
         EXPECT_FALSE(Get(path));
         DWORD took = ::GetTickCount() - cancelledAt;
         ::KillTimer(nullptr, timer);
         EXPECT_LT(took, 1000u) << "the download returned " << took << " ms after the cancel";
         EXPECT_TRUE(events_.empty());
-        EXPECT_EQ(ReadFile(dest_), kOld);
-        EXPECT_EQ(::GetFileAttributesA((dest_ + ".part").c_str()), INVALID_FILE_ATTRIBUTES);
     }
 }
 
-TEST_F(WinInetDownload, AServerThatNeverAnswersIsGivenUpAfterTheSilenceLimit) {
-    win32::WinInetTransfer inet(pump_, win32::WinInetTransfer::kDefaultBlockSize, 500);
-    FileDownloader fd(inet, disk_, pump_);
-    fd.DownloadErrors = [this](const std::string& s) { events_ += "error:" + s; };
-    DWORD started = ::GetTickCount();
-    EXPECT_FALSE(fd.DownloadFile(server_ + "/noanswer", dest_));
-    EXPECT_LT(::GetTickCount() - started, 3000u);
-    EXPECT_NE(events_.find("timed out"), std::string::npos) << events_;
-    EXPECT_EQ(ReadFile(dest_), kOld);
-}
-
-TEST_F(WinInetDownload, FailedConnectionsAreRequestErrors) {
+TEST_F(WinInetDownload, FailedConnectionsAndSilenceAreRequestErrors) {
     WSADATA wsa;  // a port nobody listens on: bind one, note it, close it
     ::WSAStartup(MAKEWORD(2, 2), &wsa);
     SOCKET probe = ::socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
@@ -199,6 +194,14 @@ TEST_F(WinInetDownload, FailedConnectionsAreRequestErrors) {
         EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;
         EXPECT_EQ(events_.substr(events_.size() - 11), " occurred. ") << events_;
     }
+    // A server that never answers is given up after the silence limit.
+    win32::WinInetTransfer inet(pump_, win32::WinInetTransfer::kDefaultBlockSize, 500);
+    FileDownloader fd(inet, disk_, pump_);
+    fd.DownloadErrors = [this](const std::string& s) { events_ += "error:" + s; };
+    DWORD started = ::GetTickCount();
+    EXPECT_FALSE(fd.DownloadFile(server_ + "/noanswer", dest_));
+    EXPECT_LT(::GetTickCount() - started, 3000u);
+    EXPECT_NE(events_.find("timed out"), std::string::npos) << events_;
 }
 
 TEST_F(WinInetDownload, CancelsStopAtOnceAndTheTransferIsUsableAgain) {
@@ -210,18 +213,6 @@ TEST_F(WinInetDownload, CancelsStopAtOnceAndTheTransferIsUsableAgain) {
     EXPECT_FALSE(Get("/body/8000000"));
     EXPECT_LT(::GetTickCount() - started, 5000u) << "the worker stops without reading the rest";
     EXPECT_EQ(events_, "progress:0 ");
-
-    // The server holds its answer for 8 s; the user cancels after about 300 ms (a thread timer
-    // stands for the click).
-    static FileDownloader* target = nullptr;
-    target = &fd_;
-    started = ::GetTickCount();
-    UINT_PTR timer = ::SetTimer(nullptr, 0, 300, [](HWND, UINT, UINT_PTR, DWORD) { target->Cancel(); });
-    EXPECT_FALSE(Get("/stall/8000"));
-    ::KillTimer(nullptr, timer);
-    EXPECT_LT(::GetTickCount() - started, 3000u) << "cancelling a request the server has not answered";
-    EXPECT_EQ(events_, "");
-
     fd_.DownloadProgress = nullptr;
     EXPECT_TRUE(Get("/body/2000"));
     EXPECT_EQ(ReadFile(dest_), Pattern(2000));
@@ -249,11 +240,7 @@ TEST_F(WinInetDownload, WindowMessagesRunWhileASlowDownloadWaits) {
 TEST_F(WinInetDownload, TrustedCertificateDeliversAndUntrustedIsRefused) {
     const char* dir = std::getenv("VANTOREL_HTTPS_DIR");
     ASSERT_NE(dir, nullptr) << "VANTOREL_HTTPS_DIR is not set";
-    auto server = [&](const char* which) {
-        std::string port = ReadFile(std::string("Z:") + dir + "/" + which + "/server.port");
-        while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back()))) port.pop_back();
-        return "https://127.0.0.1:" + port;
-    };
+    auto server = [&](const char* which) { return Server("https", std::string(dir) + "/" + which + "/server.port"); };
     std::string der = ReadFile(std::string("Z:") + dir + "/certs/ca.der");
     HCERTSTORE root = ::CertOpenStore(CERT_STORE_PROV_SYSTEM_A, 0, 0, CERT_SYSTEM_STORE_LOCAL_MACHINE, "ROOT");
     ASSERT_NE(root, nullptr);
