@@ -31,10 +31,7 @@ public:
     }
     void ReleaseShape() override { shapeHeld = false; }
     bool PointerOverSelf() const override { return pointerOver; }
-    void StartOverTimer(std::int32_t ms) override {
-        timerRunning = true;
-        timerPeriod = ms;
-    }
+    void StartOverTimer(std::int32_t) override { timerRunning = true; }
     void StopOverTimer() override { timerRunning = false; }
     void SendKeys(const std::string& keys) override { sentKeys.push_back(keys); }
     void CaptureMouse() override {}
@@ -61,7 +58,6 @@ public:
     bool shapeHeld = false;
     bool pointerOver = false;
     bool timerRunning = false;
-    std::int32_t timerPeriod = 0;
     std::vector<std::string> sentKeys;
     std::int32_t dpi = 96;
     bool designMode = false;
