@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <tuple>
 #include <vector>
 
 #include "controls/xpbutton/kirel_xp_button.h"
@@ -120,10 +121,12 @@ constexpr Rgb Palette::*D = &Palette::DarkShadowColor;
 constexpr Rgb Palette::*A = &Palette::AccentColor;
 constexpr Rgb Palette::*AL = &Palette::AccentLightColor;
 Want C(Rgb c) { return {nullptr, 0, c}; }
+// A pixel, or with y = T the colour of caption text x in drawing order.
 struct Pixel {
     int x, y;
     Want want;
 };
+constexpr int T = -1;
 
 // Pixels of every look on a 40 × 20 button, in the states played by Look::Play.
 TEST(XPButtonLooks, EveryLookInEveryState) {
@@ -136,21 +139,22 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         {2, 1, "p", {{0, 0, {D}}, {39, 19, {H}}, {1, 1, {Sh}}, {38, 18, {L}}}},
         {2, 1, "D", {{0, 0, {D}}, {1, 1, {H}}, {38, 18, {D}}}},  // the default: dark frame round an inset bevel
         {2, 1, "Dp", {{1, 1, {Sh}}, {38, 18, {Sh}}, {2, 2, {F}}}},
-        {2, 1, "Dpd", {{0, 0, {H}}}},
+        {2, 1, "Dpd", {{0, 0, {H}}, {0, T, {H}}, {1, T, {Sh}}}},  // the caption engraved
         {3, 3, "", {{0, 5, C(0x733C00)}, {1, 1, C(0x7B4D10)}, {1, 5, C(SB(b, -5))}, {2, 5, C(SB(b, -10))}}},
         // Row 10 of the gradient: 25 / 20 × 10 = 12.5, rounded to even.
         {3, 3, "", {{38, 5, C(SB(b, -36))}, {5, 18, C(SB(b, -48))}, {5, 1, C(SB(b, 16))}, {20, 10, C(SB(b, -12))}}},
         {3, 3, "f", {{1, 5, C(0xE7AE8C)}, {5, 18, C(0xEF826B)}}},  // the blue trim
         {3, 3, "fh", {{1, 5, C(0x31B2FF)}, {5, 2, C(0x8CDBFF)}, {2, 5, C(0x6BCBFF)}}},  // orange wins
         {3, 3, "fhp", {{0, 5, C(0x733C00)}, {37, 5, C(b)}, {1, 5, C(SB(q, -32))}, {5, 1, C(SB(q, -32))}}},
-        {3, 3, "fhpd", {{5, 5, C(SB(b, -24))}, {0, 5, C(SB(b, -84))}, {1, 1, C(SB(b, -72))}}},
+        {3, 3, "fhpd", {{5, 5, C(SB(b, -24))}, {0, 5, C(SB(b, -84))}, {1, 1, C(SB(b, -72))}, {0, T, C(SB(b, -104))}}},
         {4, 1, "", {{20, 10, {L}}, {0, 10, {D}}, {38, 10, {Sh}}, {37, 10, {F}}, {2, 10, {H}}, {3, 3, {H}}}},
         {4, 1, "p", {{20, 10, {Sh, -16}}, {1, 10, {Sh, -64}}, {2, 10, {Sh, -32}}, {37, 10, {Sh}}, {38, 10, {Sh, -16}}}},
         {5, 1, "", {{20, 10, {F, 12}}, {1, 10, {H}}, {0, 10, {Sh, -26}}, {39, 10, {H}}, {1, 18, {Sh, 26}}}},
         {5, 1, "p", {{20, 10, {Sh, 16}}, {39, 10, {H}}}},
-        {5, 1, "pd", {{0, 10, {Sh}}, {39, 10, {Sh}}}},
+        {5, 1, "pd", {{0, 10, {Sh}}, {39, 10, {Sh}}, {0, T, {Sh}}}},
         {6, 1, "", {{0, 0, {L, 8}}, {39, 19, {Sh}}, {1, 1, {L, 8}}}},
         {6, 1, "p", {{0, 0, {Sh}}, {38, 18, {L, 8}}}},
+        {4, 1, "p", {{0, T, {L}}}},
         {7, 1, "", {{0, 0, {H}}}},
         {8, 1, "", {{0, 0, {F}}}},
         {12, 1, "", {{0, 0, {F}}}},
@@ -163,12 +167,12 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         {7, 1, "hpd", {{0, 0, {H}}}},
         {8, 1, "hpd", {{0, 0, {F}}}},
         {9, 1, "h", {{0, 0, {A}}, {20, 10, {AL}}}},
-        {9, 1, "hp", {{0, 0, {A}}}},
+        {9, 1, "hp", {{0, 0, {A}}, {20, 10, C(BlendToWhite(0x6A240A, 128))}}},  // the fake's highlight colour
         {10, 1, "hp", {{0, 0, {F}}, {39, 19, {F}}}},  // the face alone
         // The gradient of ButtonType 14 reaches H − 29 (58 / 20 × 10) at row 10.
         {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}, {20, 10, {H, -29}}}},
         {14, 1, "Dh", {{20, 10, {L}}}},
-        {14, 1, "Dhp", {{20, 10, {F, -9}}, {0, 10, {Sh, -48}}, {38, 10, {H}}}},
+        {14, 1, "Dhp", {{20, 10, {F, -9}}, {0, 10, {Sh, -48}}, {38, 10, {H}}, {0, T, {Sh, -50}}}},
         {0, 1, "", {{0, 0, {F}}}},  // outside 1 to 14: the face only
     };
     for (const auto& [type, scheme, steps, pixels] : cases) {
@@ -176,47 +180,34 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         look.Play(steps);
         for (const Pixel& px : pixels) {
             const Rgb want = px.want.entry ? S(look.p().*px.want.entry, px.want.shift) : px.want.fixed;
-            EXPECT_EQ(look.At(px.x, px.y), want) << type << " \"" << steps << "\" (" << px.x << ", " << px.y << ")";
+            EXPECT_EQ(px.y == T ? look.canvas.texts.at(px.x).colour : look.At(px.x, px.y), want)
+                << type << " \"" << steps << "\" (" << px.x << ", " << px.y << ")";
         }
     }
 }
 
 TEST(XPButtonLooks, CaptionsOfTheLooks) {
-    auto text = [](int type, const char* steps, int scheme = 1) {
-        auto look = std::make_unique<Look>(type, 40, 20, scheme);
-        look->Play(steps);
-        return look;
-    };
-    auto l = text(2, "");
-    EXPECT_EQ(l->canvas.texts.at(0).box, l->button.captionRect());
-    l = text(2, "p");
-    EXPECT_EQ(l->canvas.texts.at(0).box, l->button.captionRectDown());
-    l = text(2, "Dpd");  // engraved
-    ASSERT_EQ(l->canvas.texts.size(), 2u);
-    EXPECT_EQ(std::make_pair(l->canvas.texts[0].colour, l->canvas.texts[1].colour),
-              std::make_pair(l->p().HighlightColor, l->p().ShadowColor));
-    l = text(3, "fhpd", 3);
-    EXPECT_EQ(l->canvas.texts.at(0).colour, SB(0xF0F0F0, -104));
-    EXPECT_TRUE(l->canvas.focusRects.empty()) << "the gradient look shows focus by its trim";
-    l = text(4, "p");
-    EXPECT_EQ(l->canvas.texts.at(0).colour, l->p().LightColor);
-    l->button.SetSpecialEffect(3);  // the pressed caption's effect copies use the pressed fill as their base
-    l->Press();
-    EXPECT_EQ(l->canvas.texts.at(0).colour, S(S(l->p().ShadowColor, -16), -40));
-    l = text(5, "fp");  // the focus frame stays, the caption does not move when pressed
-    const Box c = l->button.captionRect();
-    EXPECT_EQ(std::make_pair(l->At(c.left - 2, c.top - 1), l->canvas.texts.at(0).box), std::make_pair(0xCC9999u, c));
-    l->button.SetEnabled(false);
-    EXPECT_EQ(l->canvas.texts.at(0).colour, l->p().ShadowColor);
-    l = text(9, "hp");
-    EXPECT_EQ(l->At(20, 10), BlendToWhite(l->p().AccentColor, 128));
-    l = text(14, "D");  // the default button's caption is bold without changing the font
-    EXPECT_TRUE(l->canvas.texts.at(0).font.bold);
-    EXPECT_FALSE(l->button.FontBold());
-    l->Play("hp");
-    EXPECT_EQ(l->canvas.texts.at(0).colour, S(l->p().ShadowColor, -50));
-    EXPECT_TRUE(text(0, "")->canvas.texts.empty());
-    EXPECT_TRUE(text(10, "")->canvas.texts.empty());
+    Look l(2);  // the caption moves down-right when pressed
+    EXPECT_EQ(l.canvas.texts.at(0).box, l.button.captionRect());
+    l.Press();
+    EXPECT_EQ(l.canvas.texts.at(0).box, l.button.captionRectDown());
+    Look g(3, 40, 20, 3);
+    g.Play("f");
+    EXPECT_TRUE(g.canvas.focusRects.empty()) << "the gradient look shows focus by its trim";
+    Look e(4);
+    e.button.SetSpecialEffect(3);  // the pressed caption's effect copies use the pressed fill as their base
+    e.Press();
+    EXPECT_EQ(e.canvas.texts.at(0).colour, S(S(e.p().ShadowColor, -16), -40));
+    Look f(5);
+    f.Play("fp");  // the focus frame stays, the caption does not move when pressed
+    const Box c = f.button.captionRect();
+    EXPECT_EQ(std::make_pair(f.At(c.left - 2, c.top - 1), f.canvas.texts.at(0).box), std::make_pair(0xCC9999u, c));
+    Look d(14);
+    d.Play("D");  // the default button's caption is bold without changing the font
+    EXPECT_TRUE(d.canvas.texts.at(0).font.bold);
+    EXPECT_FALSE(d.button.FontBold());
+    EXPECT_TRUE(Look(0).canvas.texts.empty());
+    EXPECT_TRUE(Look(10).canvas.texts.empty());
 }
 
 TEST(XPButtonLooks, SpecialLooksAndStates) {
