@@ -5,11 +5,11 @@
 namespace vantorel::testing {
 
 FakeButtonHost::FakeButtonHost() {
-    // The classic Windows scheme.
+    // The classic Windows scheme, but for a 3D light distinct from the face so that the looks tell them apart.
     systemColours = {{platform::kColorHighlight, 0x6A240A}, {platform::kColorBtnFace, 0xC8D0D4},
                      {platform::kColorBtnShadow, 0x808080}, {platform::kColorBtnText, 0x000000},
                      {platform::kColorBtnHighlight, 0xFFFFFF}, {platform::kColor3dDkShadow, 0x404040},
-                     {platform::kColor3dLight, 0xC8D0D4}};
+                     {platform::kColor3dLight, 0xDCE4E8}};
 }
 
 platform::Rgb FakeButtonHost::SystemColour(int index) const {
