@@ -192,19 +192,16 @@ TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
     EXPECT_FALSE(f.Painted());
     f.button.Refresh();
     EXPECT_TRUE(f.Painted());
-    f.host.height = 0;  // height 0 paints nothing (and does not fail)
-    f.button.OnResize();
-    f.button.Paint(0, true);
-
-    f.host.height = 23;  // an ambient change recomputes unless the scheme is custom
-    f.button.OnResize();
-    f.host.systemColours[platform::kColorBtnFace] = 0x0000AA;
+    f.host.systemColours[platform::kColorBtnFace] = 0x0000AA;  // an ambient change recomputes unless custom
     f.button.OnAmbientChanged();
     EXPECT_EQ(f.button.palette().FaceColor, 0x0000AAu);
     f.button.SetColorScheme(2);
     f.host.systemColours[platform::kColorBtnFace] = 0x00BB00;
     f.button.OnAmbientChanged();
     EXPECT_EQ(f.button.palette().FaceColor, 0x123456u);
+    f.host.height = 0;  // height 0 paints nothing (and does not fail)
+    f.button.OnResize();
+    f.button.Paint(0, true);
 
     f.host.pointerOver = true;  // terminating releases the shape, stops the hover timer and painting
     f.button.OnMouseMove(0, 0, 1, 1);
