@@ -30,7 +30,7 @@ void BM_FullPaint(benchmark::State& state) {
     Setup s(static_cast<int>(state.range(0)));
     for (auto _ : state) {
         s.button.Paint(0, true);
-        benchmark::DoNotOptimize(s.canvas.pixels().data());
+        benchmark::DoNotOptimize(s.canvas.At(0, 0));
     }
 }
 BENCHMARK(BM_FullPaint)->DenseRange(1, 14);

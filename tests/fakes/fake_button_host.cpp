@@ -18,7 +18,6 @@ platform::Rgb FakeButtonHost::SystemColour(int index) const {
 }
 
 bool FakeButtonHost::CaptureParentPixels(std::int32_t w, std::int32_t h, std::vector<std::uint8_t>& pixels) {
-    if (duringCapture) duringCapture();
     const std::int32_t stride = platform::DibStride(w);
     pixels.assign(static_cast<std::size_t>(stride) * h, 0);
     for (std::int32_t row = 0; row < h; ++row)

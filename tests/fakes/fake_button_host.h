@@ -2,7 +2,6 @@
 // (notifications, shapes, timers, keys, presents) and answers from settable fields.
 #pragma once
 
-#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -67,8 +66,6 @@ public:
     platform::Rgb parentBack = 0x00FFEEDD;
     platform::Rgb parentText = 0x00112233;
     platform::Rgb parentPixel = 0x00336699;
-    // Runs inside CaptureParentPixels, as pending window messages would.
-    std::function<void()> duringCapture;
     std::map<int, platform::Rgb> systemColours;
 };
 

@@ -56,7 +56,6 @@ public:
                      const std::vector<std::uint8_t>& pixels) override;
 
     platform::Rgb At(std::int32_t x, std::int32_t y) const { return pixels_[static_cast<std::size_t>(y) * w_ + x]; }
-    const std::vector<platform::Rgb>& pixels() const { return pixels_; }
 
     // The records are emptied by Clear.
     std::vector<TextCall> texts;
