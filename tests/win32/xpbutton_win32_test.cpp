@@ -83,21 +83,39 @@ TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
                         << "type " << type << " scheme " << scheme << " state " << state << (p ? " with picture" : "");
 }
 
-// A top-level window holding one button, on the private display.
+// A parent that paints vertical stripes whose red channel is the column number, so copied pixels
+// tell where they were copied from.
+LRESULT CALLBACK StripesProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
+    if (message == WM_ERASEBKGND) return 1;
+    if (message != WM_PAINT) return ::DefWindowProcA(hwnd, message, wParam, lParam);
+    PAINTSTRUCT ps;
+    HDC dc = ::BeginPaint(hwnd, &ps);
+    for (int x = 0; x < 256; ++x) {
+        HBRUSH brush = ::CreateSolidBrush(RGB(x, 0x40, 0x80));
+        RECT column{x, 0, x + 1, 200};
+        ::FillRect(dc, &column, brush);
+        ::DeleteObject(brush);
+    }
+    ::EndPaint(hwnd, &ps);
+    return 0;
+}
+
+// A top-level window holding one button, on the private display; plain or painted by `proc`.
 struct Hosted {
     HWND parent = nullptr;
     win32::XPButtonWindow button;
     Log log;
 
-    Hosted() {
+    explicit Hosted(WNDPROC proc = ::DefWindowProcA) {
         WNDCLASSA wc{};
-        wc.lpfnWndProc = ::DefWindowProcA;
+        wc.lpfnWndProc = proc;
         wc.hInstance = ::GetModuleHandleA(nullptr);
-        wc.lpszClassName = "XPButtonTestParent";
+        wc.lpszClassName = proc == ::DefWindowProcA ? "XPButtonTestParent" : "XPButtonStripes";
         wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
         ::RegisterClassA(&wc);
-        parent = ::CreateWindowA("XPButtonTestParent", "XPButton test", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 10, 10, 300,
-                                 200, nullptr, nullptr, wc.hInstance, nullptr);
+        parent = ::CreateWindowA(wc.lpszClassName, "XPButton test", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 10, 10, 300, 200,
+                                 nullptr, nullptr, wc.hInstance, nullptr);
+        ::UpdateWindow(parent);
         if (!parent || !button.Create(parent, 1, 20, 20, 120, 40, "BtnOnOff")) return;
         button.events().Click = [this] { log.push_back(button.button().Value() ? "Click on" : "Click"); };
         auto mouse = [this](const char* name) {
@@ -243,45 +261,16 @@ TEST(XPButtonWindow, ArrowKeysMoveTheFocusThroughInjectedTabs) {
     second.Destroy();
 }
 
-// A parent that paints vertical stripes whose red channel is the column number, so copied pixels
-// tell where they were copied from.
-LRESULT CALLBACK StripesProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
-    if (message == WM_ERASEBKGND) return 1;
-    if (message != WM_PAINT) return ::DefWindowProcA(hwnd, message, wParam, lParam);
-    PAINTSTRUCT ps;
-    HDC dc = ::BeginPaint(hwnd, &ps);
-    for (int x = 0; x < 256; ++x) {
-        HBRUSH brush = ::CreateSolidBrush(RGB(x, 0x40, 0x80));
-        RECT column{x, 0, x + 1, 200};
-        ::FillRect(dc, &column, brush);
-        ::DeleteObject(brush);
-    }
-    ::EndPaint(hwnd, &ps);
-    return 0;
-}
-
 TEST(XPButtonWindow, TransparentLookCopiesTheParentAtTheControlsPixelPosition) {
-    WNDCLASSA wc{};
-    wc.lpfnWndProc = StripesProc;
-    wc.hInstance = ::GetModuleHandleA(nullptr);
-    wc.lpszClassName = "XPButtonStripes";
-    ::RegisterClassA(&wc);
-    HWND parent = ::CreateWindowA("XPButtonStripes", "stripes", WS_POPUP | WS_VISIBLE, 0, 0, 256, 200, nullptr,
-                                  nullptr, wc.hInstance, nullptr);
-    ASSERT_NE(parent, nullptr);
-    ::UpdateWindow(parent);
-    win32::XPButtonWindow button;
-    ASSERT_TRUE(button.Create(parent, 1, 37, 20, 60, 30, ""));
-    button.button().SetButtonType(11);
-    button.Show();
+    Hosted h(StripesProc);
+    ASSERT_NE(h.button.hwnd(), nullptr);
+    h.button.button().SetButtonType(11);
     Hosted::Pump();
     // The copy starts at the control's left edge in pixels, whatever the container's units, and
     // the control has its height back after the capture.
-    EXPECT_EQ(button.canvas().At(0, 15), static_cast<Rgb>(RGB(37, 0x40, 0x80)));
-    EXPECT_EQ(button.canvas().At(59, 15), static_cast<Rgb>(RGB(96, 0x40, 0x80)));
-    EXPECT_EQ(button.button().height(), 30);
-    button.Destroy();
-    ::DestroyWindow(parent);
+    EXPECT_EQ(h.button.canvas().At(0, 15), static_cast<Rgb>(RGB(20, 0x40, 0x80)));
+    EXPECT_EQ(h.button.canvas().At(119, 15), static_cast<Rgb>(RGB(139, 0x40, 0x80)));
+    EXPECT_EQ(h.button.button().height(), 40);
 }
 
 TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
