@@ -1,6 +1,6 @@
 // The push button's properties, property store and the input cases real window messages under Wine
 // (tests/win32/xpbutton_win32_test.cpp) do not reach: handlers that change their arguments, drags,
-// key sequences, hidden and batched painting, ambient changes and the end of the control.
+// hidden and batched painting, ambient changes and the end of the control.
 #include <gtest/gtest.h>
 
 #include <string>
@@ -22,31 +22,28 @@ struct Fixture {
     FakeButtonHost host;
     RasterCanvas canvas;
     KirelXPButton button{host, canvas};
-    Log log;
+    int clicks = 0;
 
-    // A new control, shown and sized, noting its clicks and hover events.
-    Fixture() {
+    // A new control, shown and sized, counting its clicks.
+    explicit Fixture(bool init = true) {
+        if (!init) return;
         button.InitNewControl();
         button.OnShow();
         button.OnResize();
-        button.events.Click = [this] { log.push_back("Click"); };
-        button.events.MouseOver = [this] { log.push_back("MouseOver"); };
-        button.events.MOUSEOUT = [this] { log.push_back("MOUSEOUT"); };
+        button.events.Click = [this] { ++clicks; };
         host.notified.clear();
     }
     // Whether the control painted since Mark().
-    void Mark() { canvas.FillBox(0, 0, canvas.width(), canvas.height(), 0x0A0B0C); }
+    void Mark() { canvas.FillBox(0, 0, 75, 23, 0x0A0B0C); }
     bool Painted() const { return canvas.At(5, 5) != 0x0A0B0C; }
-    int Clicks() const { return static_cast<int>(std::count(log.begin(), log.end(), "Click")); }
 };
 
 TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
-    FakeButtonHost host;
-    host.systemColours[platform::kColorBtnText] = 0x123456;
-    RasterCanvas canvas;
-    KirelXPButton fresh(host, canvas);
+    Fixture n(false);
+    n.host.systemColours[platform::kColorBtnText] = 0x123456;
+    KirelXPButton& fresh = n.button;
     fresh.InitNewControl();
-    EXPECT_EQ(fresh.Caption() + " " + fresh.FontName() + " " + host.windowFont.name + " " + fresh.Version(),
+    EXPECT_EQ(fresh.Caption() + " " + fresh.FontName() + " " + n.host.windowFont.name + " " + fresh.Version(),
               "KirelXPButton1 Verdana Verdana 2.0.6");
     EXPECT_EQ((std::vector<Rgb>{fresh.BackColor(), fresh.BackOver(), fresh.ForeColor(), fresh.ForeOver(),
                                 fresh.MaskColor()}),
@@ -54,74 +51,42 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     EXPECT_EQ(std::make_tuple(fresh.ButtonType(), fresh.ColorScheme(), fresh.Enabled(), fresh.ShowFocusRect(),
                               fresh.UseMaskColor(), fresh.SoftBevel()),
               std::make_tuple(3, 1, true, true, true, false));
-    EXPECT_TRUE(host.notified.empty()) << "no setter ran";
+    EXPECT_TRUE(n.host.notified.empty()) << "no setter ran";
+    PropertyBag written;
+    fresh.WriteProperties(written);
+    EXPECT_TRUE(written.ReadBool("HAND", false));
+    EXPECT_FALSE(written.Contains("ImageIndex")) << "ImageIndex 0 is not written";
 
-    Fixture f;
-    KirelXPButton& b = f.button;
-    auto picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4, 0x102030));
-    auto over = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1, 0x0000FF));
-    auto cursor = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1, 0));
+    // A value other than the default under every key, in the order the control writes them.
+    PicturePtr picture = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>(4));
+    PicturePtr over = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1));
+    PicturePtr cursor = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1));
     const FontDesc font{"Tahoma", 11.5, true, true, false, true};
-    b.SetButtonType(9);
-    b.SetCaption("&Go now");
-    b.SetEnabled(false);
-    b.SetFont(font);
-    b.SetColorScheme(2);
-    b.SetShowFocusRect(false);
-    b.SetBackColor(0x00FF00);
-    b.SetBackOver(0x0000FF);
-    b.SetForeColor(0x111111);
-    b.SetForeOver(0x222222);
-    b.SetMaskColor(0xFF00FF);
-    b.SetMousePointer(11);
-    b.SetMouseIcon(cursor);
-    b.SetPictureNormal(picture);
-    b.SetPictureOver(over);
-    b.SetUseMaskColor(false);
-    b.SetSoftBevel(true);
-    b.SetPicturePosition(3);
-    b.SetUseGreyscale(true);
-    b.SetSpecialEffect(2);
-    b.SetCheckBoxBehaviour(true);
-    b.SetValue(true);
-    b.SetImageIndex(7);
+    const std::pair<const char*, PropertyValue> stored[] = {
+        {"BTYPE", 9},           {"TX", std::string("&Go now")}, {"ENAB", false},   {"FONT", font},
+        {"COLTYPE", 2},         {"FOCUSR", false},              {"BCOL", 0x00FF00}, {"BCOLO", 0x0000FF},
+        {"FCOL", 0x111111},     {"FCOLO", 0x222222},            {"MCOL", 0xFF00FF}, {"MPTR", std::int16_t{11}},
+        {"MICON", cursor},      {"PICN", picture},              {"PICH", over},     {"UMCOL", false},
+        {"SOFT", true},         {"PICPOS", 3},                  {"NGREY", true},    {"FX", 2},
+        {"HAND", false},        {"CHECK", true},                {"VALUE", true},    {"ImageIndex", std::int16_t{7}}};
     PropertyBag bag;
-    b.WriteProperties(bag);
-    EXPECT_EQ(bag.Keys(), (std::vector<std::string>{"BTYPE", "TX", "ENAB", "FONT", "COLTYPE", "FOCUSR", "BCOL",
-                                                    "BCOLO", "FCOL", "FCOLO", "MCOL", "MPTR", "MICON", "PICN", "PICH",
-                                                    "UMCOL", "SOFT", "PICPOS", "NGREY", "FX", "HAND", "CHECK", "VALUE",
-                                                    "ImageIndex"}));
-    EXPECT_TRUE(std::holds_alternative<std::int16_t>(*bag.Find("MPTR")));
-    EXPECT_TRUE(bag.ReadBool("HAND", false));
-
-    FakeButtonHost host2;
-    RasterCanvas canvas2;
-    KirelXPButton c(host2, canvas2);
-    c.ReadProperties(bag);
-    PropertyBag again;  // what was read writes back the same, but for HAND (false once read)
-    c.WriteProperties(again);
+    for (const auto& [key, value] : stored) bag.Write(key, value);
+    Fixture r(false);
+    r.button.ReadProperties(bag);
+    PropertyBag again;  // what was read writes back the same
+    r.button.WriteProperties(again);
     EXPECT_EQ(again.Keys(), bag.Keys());
-    for (const std::string& key : bag.Keys()) {
-        if (key != "HAND") {
-            EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
-        }
-    }
-    EXPECT_FALSE(again.ReadBool("HAND", true));
-    EXPECT_EQ(std::make_tuple(c.accessKey(), host2.windowEnabled, host2.windowFont, host2.pointer, host2.mouseIcon,
-                              c.pictureRect().width),
-              std::make_tuple('g', false, font, 11, platform::PicturePtr(cursor), 2))
+    for (const std::string& key : bag.Keys()) EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
+    EXPECT_EQ(std::make_tuple(r.button.accessKey(), r.host.windowEnabled, r.host.windowFont, r.host.pointer,
+                              r.host.mouseIcon, r.button.pictureRect().width),
+              std::make_tuple('g', false, font, 11, cursor, 2))
         << "the window follows what was read";
-    EXPECT_TRUE(host2.notified.empty()) << "reading runs no setter";
-    c.SetImageIndex(0);
-    PropertyBag zero;
-    c.WriteProperties(zero);
-    EXPECT_FALSE(zero.Contains("ImageIndex")) << "ImageIndex 0 is not written";
+    EXPECT_TRUE(r.host.notified.empty()) << "reading runs no setter";
 }
 
 TEST(XPButtonProperties, ReadDefaultsFromAStore) {
-    FakeButtonHost host;
-    RasterCanvas canvas;
-    KirelXPButton b(host, canvas);
+    Fixture f(false);
+    KirelXPButton& b = f.button;
     b.ReadProperties(PropertyBag{});
     EXPECT_EQ(std::make_tuple(b.ButtonType(), b.Caption(), b.Enabled(), b.ColorScheme(), b.MaskColor(), b.ImageIndex()),
               std::make_tuple(2, std::string(), true, 1, 0xC0C0C0u, 0)) << "a fresh control gets type 3, a read one 2";
@@ -132,9 +97,8 @@ TEST(XPButtonProperties, ReadDefaultsFromAStore) {
     PropertyBag bag;  // BCOL and FCOL without over colours: the over colours follow them
     bag.Write("BCOL", std::int32_t{0x0000FF});
     bag.Write("FCOL", std::int32_t{0x00FF00});
-    KirelXPButton c(host, canvas);
-    c.ReadProperties(bag);
-    EXPECT_EQ(std::make_pair(c.BackOver(), c.ForeOver()), std::make_pair(0x0000FFu, 0x00FF00u));
+    b.ReadProperties(bag);
+    EXPECT_EQ(std::make_pair(b.BackOver(), b.ForeOver()), std::make_pair(0x0000FFu, 0x00FF00u));
 }
 
 TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
@@ -145,9 +109,9 @@ TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
     f.host.designMode = false;
     b.SetBackColor(0x00FF00);
     EXPECT_EQ(b.BackOver(), 0x0000FFu);
-    b.SetValue(true);  // without CheckBoxBehaviour: stored and notified, not painted
     auto pic = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 1, 1, std::vector<Rgb>{0});
     f.Mark();
+    b.SetValue(true);  // without CheckBoxBehaviour: stored and notified, not painted
     b.SetPictureOver(pic);  // away from the pointer: no paint
     EXPECT_FALSE(f.Painted());
     EXPECT_EQ(f.host.notified, (Log{"BCOL", "BCOL", "VALUE", "PICO"}));
@@ -159,9 +123,8 @@ TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
     f.host.notified.clear();
     b.SetFontBold(true);
     b.SetFontSize(12);
-    EXPECT_EQ(std::make_tuple(f.host.windowFont.bold, f.host.windowFont.size, f.host.notified.empty()),
-              std::make_tuple(true, 12.0, true));
-    EXPECT_TRUE(f.Painted());
+    EXPECT_EQ(std::make_tuple(f.host.windowFont.bold, f.host.windowFont.size, f.host.notified.empty(), f.Painted()),
+              std::make_tuple(true, 12.0, true, true));
     for (auto [size, rounded] : {std::pair{10.5, 10}, std::pair{11.5, 12}}) {
         FontDesc font = b.Font();
         font.size = size;
@@ -175,53 +138,21 @@ TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
     EXPECT_EQ(f.host.notified.back(), "BTYPE");
 }
 
-TEST(XPButtonInput, HandlersThatChangeTheirArgumentsAndKeySequences) {
+TEST(XPButtonInput, HandlersThatChangeTheirArgumentsAndDrags) {
     Fixture f;
     f.button.events.MouseDown = [](std::int16_t& b, std::int16_t&, float&, float&) { b = 2; };
     f.button.OnMouseDown(1, 0, 0, 0);
     EXPECT_EQ(f.button.lastState(), 0) << "a MouseDown handler that makes the button 2 stops the pressed paint";
     f.button.events.MouseDown = nullptr;
-    f.button.OnMouseDown(4, 0, 1, 1);  // middle button: pressed, then up, no click
-    EXPECT_EQ(f.button.lastState(), 2);
-    f.button.OnMouseUp(4, 0, 1, 1);
-    f.button.OnClick();
-    EXPECT_EQ(f.button.lastState(), 0);
-    EXPECT_EQ(f.Clicks(), 0);
-
-    f.button.OnKeyDown(32, 0);  // space, another key, space up: no click
-    f.button.OnKeyDown(65, 0);
-    f.button.OnKeyUp(32, 0);
-    EXPECT_EQ(f.Clicks(), 0);
     f.button.events.KeyDown = [](std::int16_t& k, std::int16_t&) { k = 0; };  // stops the control's handling
     f.button.OnKeyDown(39, 0);
     f.button.OnKeyDown(32, 0);
     f.button.OnKeyUp(32, 0);
     EXPECT_TRUE(f.host.sentKeys.empty());
-    EXPECT_EQ(f.Clicks(), 0);
+    EXPECT_EQ(f.clicks, 0);
 
-    f.button.SetCheckBoxBehaviour(true);  // the click handler sees the new Value; a toggle is no store change
-    std::vector<bool> seen;
-    f.button.events.Click = [&] { seen.push_back(f.button.Value()); };
-    f.host.notified.clear();
-    f.button.OnAccessKey();
-    EXPECT_EQ(seen, std::vector<bool>{true});
-    EXPECT_TRUE(f.host.notified.empty());
-    f.button.Paint(0, true);
-    EXPECT_EQ(f.button.lastState(), 2) << "with Value true every paint shows pressed";
-    f.button.SetEnabled(false);  // a disabled control never clicks, whatever the platform reports
-    f.button.OnMouseDown(1, 0, 1, 1);
-    f.button.OnClick();
-    f.button.OnAccessKey();
-    EXPECT_EQ(seen.size(), 1u);
-}
-
-TEST(XPButtonInput, DraggingOutAndBackIn) {
-    Fixture f;
-    f.host.pointerOver = true;
+    f.host.pointerOver = true;  // hovering, pressed, dragged out and back in
     f.button.OnMouseMove(0, 0, 1, 1);
-    f.button.OnMouseMove(0, 0, 2, 2);  // already hovering: nothing more
-    EXPECT_EQ(f.log, Log{"MouseOver"});
-    EXPECT_EQ(f.host.timerPeriod, 3);
     f.button.OnMouseDown(1, 0, 1, 1);
     f.host.pointerOver = false;
     f.button.OnMouseMove(1, 0, 100, 1);  // leaving with the left button held paints up
@@ -233,6 +164,11 @@ TEST(XPButtonInput, DraggingOutAndBackIn) {
     f.Mark();
     f.button.OnMouseMove(2, 0, 1, 1);  // moves with the right button stop after the event
     EXPECT_FALSE(f.Painted());
+
+    f.button.SetCheckBoxBehaviour(true);  // a toggle is no store change
+    f.host.notified.clear();
+    f.button.OnAccessKey();
+    EXPECT_EQ(std::make_tuple(f.clicks, f.button.Value(), f.host.notified.empty()), std::make_tuple(1, true, true));
 }
 
 TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
@@ -256,19 +192,16 @@ TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
     EXPECT_FALSE(f.Painted());
     f.button.Refresh();
     EXPECT_TRUE(f.Painted());
-    f.host.height = 0;  // height 0 paints nothing (and does not fail)
-    f.button.OnResize();
-    f.button.Paint(0, true);
-
-    f.host.height = 23;  // an ambient change recomputes unless the scheme is custom
-    f.button.OnResize();
-    f.host.systemColours[platform::kColorBtnFace] = 0x0000AA;
+    f.host.systemColours[platform::kColorBtnFace] = 0x0000AA;  // an ambient change recomputes unless custom
     f.button.OnAmbientChanged();
     EXPECT_EQ(f.button.palette().FaceColor, 0x0000AAu);
     f.button.SetColorScheme(2);
     f.host.systemColours[platform::kColorBtnFace] = 0x00BB00;
     f.button.OnAmbientChanged();
     EXPECT_EQ(f.button.palette().FaceColor, 0x123456u);
+    f.host.height = 0;  // height 0 paints nothing (and does not fail)
+    f.button.OnResize();
+    f.button.Paint(0, true);
 
     f.host.pointerOver = true;  // terminating releases the shape, stops the hover timer and painting
     f.button.OnMouseMove(0, 0, 1, 1);
@@ -279,9 +212,9 @@ TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
 }
 
 TEST(XPButtonInput, AccessKeyParsing) {
-    // Only the first doubled "&&" is skipped.
-    const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"A&&B &Run", 'r'}, {"Go&", 0},
-                                                  {"&", 0}, {"x", 0}, {"A&&B &&C &D", 0}, {"E&xit", 'x'}};
+    // Only the first doubled "&&" is skipped (proved with Alt keys under Wine); the edges here.
+    const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"Go&", 0},
+                                                  {"&", 0},       {"x", 0},           {"E&xit", 'x'}};
     for (auto [caption, key] : cases) EXPECT_EQ(AccessKeyOf(caption), key) << caption;
 }
 

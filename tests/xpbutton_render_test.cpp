@@ -4,6 +4,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <tuple>
 #include <vector>
 
 #include "controls/xpbutton/kirel_xp_button.h"
@@ -58,25 +59,16 @@ struct Look {
 };
 
 TEST(XPButtonColour, ShiftBlendAndRounding) {
-    struct Shift {
-        Rgb from;
-        int amount;
-        bool blue, soft;
-        Rgb to;
-    };
-    const Shift shifts[] = {
+    const std::tuple<Rgb, int, bool, bool, Rgb> shifts[] = {
         {0xC0C0C0, 48, true, false, 0xF0F0F0},   // blue scaling: 192 + 48 in every channel
         {0xFFC0C0, 48, true, false, 0xFFF0F0},   // a full blue clamps at 255
         {0x804020, -64, false, false, 0x400000},  // clamps at 0
-        {MakeRgb(250, 10, 100), 10, false, false, MakeRgb(255, 20, 110)},
         {0xF0F0F0, -2, true, false, MakeRgb(238, 238, 238)},  // blue: 240 × −2 / 192 = −2.5 → −2
-        {0x808080, -1, false, true, 0x808080},    // SoftBevel halves toward zero: −1 → 0
-        {0x808080, -3, false, true, 0x7F7F7F},    // −3 → −1
+        {0x808080, -3, false, true, 0x7F7F7F},    // SoftBevel halves toward zero: −3 → −1
         {0x808080, 47, false, true, 0x979797},    // 47 → 23
     };
-    for (const Shift& s : shifts) EXPECT_EQ(ShiftColor(s.from, s.amount, s.blue, s.soft), s.to) << std::hex << s.from;
-    EXPECT_EQ(BlendToWhite(0x000000, 176), MakeRgb(176, 176, 176));  // c × (255 − a) / 255 + a, truncating
-    EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176),
+    for (auto [from, amount, blue, soft, to] : shifts) EXPECT_EQ(ShiftColor(from, amount, blue, soft), to) << from;
+    EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176),  // c × (255 − a) / 255 + a, truncating
               MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
     EXPECT_EQ(BlendToWhite(0xFFFFFF, 128), 0xFFFFFFu);
     const std::pair<double, int> halves[] = {{0.5, 0},   {1.5, 2},   {-0.5, 0}, {-1.5, -2},
@@ -128,45 +120,41 @@ constexpr Rgb Palette::*Sh = &Palette::ShadowColor;
 constexpr Rgb Palette::*D = &Palette::DarkShadowColor;
 constexpr Rgb Palette::*A = &Palette::AccentColor;
 constexpr Rgb Palette::*AL = &Palette::AccentLightColor;
-Want Fixed(Rgb c) { return {nullptr, 0, c}; }
+Want C(Rgb c) { return {nullptr, 0, c}; }
+// A pixel, or with y = T the colour of caption text x in drawing order.
 struct Pixel {
     int x, y;
     Want want;
 };
-struct LookCase {
-    int type, scheme;
-    const char* steps;
-    std::vector<Pixel> pixels;
-};
+constexpr int T = -1;
 
+// Pixels of every look on a 40 × 20 button, in the states played by Look::Play.
 TEST(XPButtonLooks, EveryLookInEveryState) {
-    const Rgb b = 0xF0F0F0;  // BaseColor of scheme 3 (above), shifted with blue scaling by the gradient look
-    const std::vector<LookCase> cases = {
-        {1, 1, "", {{0, 0, {D}}, {39, 19, {D}}, {1, 1, {H}}, {38, 1, {Sh}}, {1, 18, {Sh}}, {2, 2, {H}}}},
-        {1, 1, "", {{37, 17, {Sh}}, {20, 10, {F}}}},
+    const Rgb b = 0xF0F0F0;  // BaseColor of scheme 3, shifted with blue scaling by the gradient look
+    const Rgb q = SB(b, -32);  // the pressed gradient's base
+    const std::tuple<int, int, const char*, std::vector<Pixel>> cases[] = {
+        {1, 1, "", {{0, 0, {D}}, {1, 1, {H}}, {38, 1, {Sh}}, {1, 18, {Sh}}, {2, 2, {H}}, {37, 17, {Sh}}}},
         {1, 1, "p", {{1, 1, {Sh}}, {38, 18, {H}}, {0, 0, {D}}}},
         {2, 1, "", {{0, 0, {H}}, {39, 0, {D}}, {0, 19, {D}}, {1, 1, {L}}, {38, 18, {Sh}}}},
         {2, 1, "p", {{0, 0, {D}}, {39, 19, {H}}, {1, 1, {Sh}}, {38, 18, {L}}}},
         {2, 1, "D", {{0, 0, {D}}, {1, 1, {H}}, {38, 18, {D}}}},  // the default: dark frame round an inset bevel
         {2, 1, "Dp", {{1, 1, {Sh}}, {38, 18, {Sh}}, {2, 2, {F}}}},
-        {2, 1, "Dpd", {{0, 0, {H}}}},
-        {3, 3, "", {{0, 5, Fixed(0x733C00)}, {1, 1, Fixed(0x7B4D10)}, {38, 18, Fixed(0x7B4D10)}}},
-        {3, 3, "", {{1, 5, Fixed(SB(b, -5))}, {2, 5, Fixed(SB(b, -10))}, {38, 5, Fixed(SB(b, -36))}}},
-        {3, 3, "", {{5, 18, Fixed(SB(b, -48))}, {5, 1, Fixed(SB(b, 16))}}},
-        {3, 3, "f", {{1, 5, Fixed(0xE7AE8C)}, {5, 18, Fixed(0xEF826B)}}},  // the blue trim
-        {3, 3, "fh", {{1, 5, Fixed(0x31B2FF)}, {5, 2, Fixed(0x8CDBFF)}, {2, 5, Fixed(0x6BCBFF)}}},  // orange wins
-        {3, 3, "fhp", {{37, 5, Fixed(b)}, {1, 5, Fixed(SB(SB(b, -32), -32))}, {5, 1, Fixed(SB(SB(b, -32), -32))}}},
-        {3, 3, "fhp", {{0, 5, Fixed(0x733C00)}}},
-        {3, 3, "fhpd", {{5, 5, Fixed(SB(b, -24))}, {0, 5, Fixed(SB(b, -84))}, {1, 1, Fixed(SB(b, -72))}}},
+        {2, 1, "Dpd", {{0, 0, {H}}, {0, T, {H}}, {1, T, {Sh}}}},  // the caption engraved
+        {3, 3, "", {{0, 5, C(0x733C00)}, {1, 1, C(0x7B4D10)}, {1, 5, C(SB(b, -5))}, {2, 5, C(SB(b, -10))}}},
+        // Row 10 of the gradient: 25 / 20 × 10 = 12.5, rounded to even.
+        {3, 3, "", {{38, 5, C(SB(b, -36))}, {5, 18, C(SB(b, -48))}, {5, 1, C(SB(b, 16))}, {20, 10, C(SB(b, -12))}}},
+        {3, 3, "f", {{1, 5, C(0xE7AE8C)}, {5, 18, C(0xEF826B)}}},  // the blue trim
+        {3, 3, "fh", {{1, 5, C(0x31B2FF)}, {5, 2, C(0x8CDBFF)}, {2, 5, C(0x6BCBFF)}}},  // orange wins
+        {3, 3, "fhp", {{0, 5, C(0x733C00)}, {37, 5, C(b)}, {1, 5, C(SB(q, -32))}, {5, 1, C(SB(q, -32))}}},
+        {3, 3, "fhpd", {{5, 5, C(SB(b, -24))}, {0, 5, C(SB(b, -84))}, {1, 1, C(SB(b, -72))}, {0, T, C(SB(b, -104))}}},
         {4, 1, "", {{20, 10, {L}}, {0, 10, {D}}, {38, 10, {Sh}}, {37, 10, {F}}, {2, 10, {H}}, {3, 3, {H}}}},
-        {4, 1, "", {{37, 17, {Sh}}}},
         {4, 1, "p", {{20, 10, {Sh, -16}}, {1, 10, {Sh, -64}}, {2, 10, {Sh, -32}}, {37, 10, {Sh}}, {38, 10, {Sh, -16}}}},
-        {5, 1, "", {{20, 10, {F, 12}}, {1, 10, {H}}, {0, 10, {Sh, -26}}, {39, 10, {H}}, {38, 10, {Sh, -26}}}},
-        {5, 1, "", {{1, 18, {Sh, 26}}}},
+        {5, 1, "", {{20, 10, {F, 12}}, {1, 10, {H}}, {0, 10, {Sh, -26}}, {39, 10, {H}}, {1, 18, {Sh, 26}}}},
         {5, 1, "p", {{20, 10, {Sh, 16}}, {39, 10, {H}}}},
-        {5, 1, "pd", {{0, 10, {Sh}}, {39, 10, {Sh}}}},
+        {5, 1, "pd", {{0, 10, {Sh}}, {39, 10, {Sh}}, {0, T, {Sh}}}},
         {6, 1, "", {{0, 0, {L, 8}}, {39, 19, {Sh}}, {1, 1, {L, 8}}}},
         {6, 1, "p", {{0, 0, {Sh}}, {38, 18, {L, 8}}}},
+        {4, 1, "p", {{0, T, {L}}}},
         {7, 1, "", {{0, 0, {H}}}},
         {8, 1, "", {{0, 0, {F}}}},
         {12, 1, "", {{0, 0, {F}}}},
@@ -178,98 +166,55 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         {12, 1, "hp", {{0, 0, {D}}, {39, 19, {H}}}},
         {7, 1, "hpd", {{0, 0, {H}}}},
         {8, 1, "hpd", {{0, 0, {F}}}},
-        {12, 1, "hpd", {{0, 0, {F}}}},
-        {9, 1, "", {{0, 0, {F}}}},
         {9, 1, "h", {{0, 0, {A}}, {20, 10, {AL}}}},
-        {9, 1, "hp", {{0, 0, {A}}}},
-        {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}}},
-        {14, 1, "", {{20, 10, {H, -29}}}},  // 58/20 × 10
+        {9, 1, "hp", {{0, 0, {A}}, {20, 10, C(BlendToWhite(0x6A240A, 128))}}},  // the fake's highlight colour
+        {10, 1, "hp", {{0, 0, {F}}, {39, 19, {F}}}},  // the face alone
+        // The gradient of ButtonType 14 reaches H − 29 (58 / 20 × 10) at row 10.
+        {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}, {20, 10, {H, -29}}}},
         {14, 1, "Dh", {{20, 10, {L}}}},
-        {14, 1, "Dhp", {{20, 10, {F, -9}}, {0, 10, {Sh, -48}}, {38, 10, {H}}}},
+        {14, 1, "Dhp", {{20, 10, {F, -9}}, {0, 10, {Sh, -48}}, {38, 10, {H}}, {0, T, {Sh, -50}}}},
         {0, 1, "", {{0, 0, {F}}}},  // outside 1 to 14: the face only
     };
-    for (const LookCase& c : cases) {
-        Look look(c.type, 40, 20, c.scheme);
-        look.Play(c.steps);
-        for (const Pixel& px : c.pixels) {
+    for (const auto& [type, scheme, steps, pixels] : cases) {
+        Look look(type, 40, 20, scheme);
+        look.Play(steps);
+        for (const Pixel& px : pixels) {
             const Rgb want = px.want.entry ? S(look.p().*px.want.entry, px.want.shift) : px.want.fixed;
-            EXPECT_EQ(look.At(px.x, px.y), want)
-                << "type " << c.type << " \"" << c.steps << "\" (" << px.x << ", " << px.y << ")";
+            EXPECT_EQ(px.y == T ? look.canvas.texts.at(px.x).colour : look.At(px.x, px.y), want)
+                << type << " \"" << steps << "\" (" << px.x << ", " << px.y << ")";
         }
     }
 }
 
 TEST(XPButtonLooks, CaptionsOfTheLooks) {
-    auto text = [](int type, const char* steps, int scheme = 1) {
-        auto look = std::make_unique<Look>(type, 40, 20, scheme);
-        look->Play(steps);
-        return look;
-    };
-    auto l = text(2, "");
-    EXPECT_EQ(l->canvas.texts.at(0).box, l->button.captionRect());
-    l = text(2, "p");
-    EXPECT_EQ(l->canvas.texts.at(0).box, l->button.captionRectDown());
-    l = text(2, "Dpd");  // engraved
-    ASSERT_EQ(l->canvas.texts.size(), 2u);
-    EXPECT_EQ(std::make_pair(l->canvas.texts[0].colour, l->canvas.texts[1].colour),
-              std::make_pair(l->p().HighlightColor, l->p().ShadowColor));
-    l = text(3, "fhpd", 3);
-    EXPECT_EQ(l->canvas.texts.at(0).colour, SB(0xF0F0F0, -104));
-    EXPECT_TRUE(l->canvas.focusRects.empty()) << "the gradient look shows focus by its trim";
-    l = text(4, "p");
-    EXPECT_EQ(l->canvas.texts.at(0).colour, l->p().LightColor);
-    l->button.SetSpecialEffect(3);  // the pressed caption's effect copies use the pressed fill as their base
-    l->Press();
-    EXPECT_EQ(l->canvas.texts.at(0).colour, S(S(l->p().ShadowColor, -16), -40));
-    l = text(5, "fp");  // the focus frame stays, the caption does not move when pressed
-    const Box c = l->button.captionRect();
-    EXPECT_EQ(l->At(c.left - 2, c.top - 1), 0xCC9999u);
-    EXPECT_EQ(l->canvas.texts.at(0).box, c);
-    l->button.SetEnabled(false);
-    EXPECT_EQ(l->canvas.texts.at(0).colour, l->p().ShadowColor);
-    l = text(9, "hp");
-    EXPECT_EQ(l->At(20, 10), BlendToWhite(l->p().AccentColor, 128));
-    l = text(14, "D");  // the default button's caption is bold without changing the font
-    EXPECT_TRUE(l->canvas.texts.at(0).font.bold);
-    EXPECT_FALSE(l->button.FontBold());
-    l->Play("hp");
-    EXPECT_EQ(l->canvas.texts.at(0).colour, S(l->p().ShadowColor, -50));
-    EXPECT_TRUE(text(0, "")->canvas.texts.empty());
-}
-
-TEST(XPButtonLooks, GradientRowsRoundHalvesToEven) {
-    // H = 50: step 0.5; rows 3, 4, 5, 6, 7 use −2 (−1.5), −2, −2 (−2.5), −3, −4 (−3.5).
-    Look g(3, 20, 50, 3);
-    EXPECT_EQ((std::vector<Rgb>{g.At(10, 3), g.At(10, 4), g.At(10, 5), g.At(10, 6), g.At(10, 7)}),
-              (std::vector<Rgb>{SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -2), SB(0xF0F0F0, -3),
-                                MakeRgb(236, 236, 235)}));
-    // SoftBevel halves every amount, the gradient steps included: H = 25, row 3 uses −3 → −1.
-    Look soft(3, 20, 25, 3);
-    soft.button.SetSoftBevel(true);
-    const Rgb softBase = ShiftColor(0xC0C0C0, 48, true, true);
-    EXPECT_EQ(softBase, 0xD8D8D8u);
-    EXPECT_EQ(std::make_pair(soft.At(10, 3), soft.At(10, 5)), std::make_pair(SB(softBase, -1), SB(softBase, -2)));
+    Look l(2);  // the caption moves down-right when pressed
+    EXPECT_EQ(l.canvas.texts.at(0).box, l.button.captionRect());
+    l.Press();
+    EXPECT_EQ(l.canvas.texts.at(0).box, l.button.captionRectDown());
+    Look g(3, 40, 20, 3);
+    g.Play("f");
+    EXPECT_TRUE(g.canvas.focusRects.empty()) << "the gradient look shows focus by its trim";
+    Look e(4);
+    e.button.SetSpecialEffect(3);  // the pressed caption's effect copies use the pressed fill as their base
+    e.Press();
+    EXPECT_EQ(e.canvas.texts.at(0).colour, S(S(e.p().ShadowColor, -16), -40));
+    Look f(5);
+    f.Play("fp");  // the focus frame stays, the caption does not move when pressed
+    const Box c = f.button.captionRect();
+    EXPECT_EQ(std::make_pair(f.At(c.left - 2, c.top - 1), f.canvas.texts.at(0).box), std::make_pair(0xCC9999u, c));
+    Look d(14);
+    d.Play("D");  // the default button's caption is bold without changing the font
+    EXPECT_TRUE(d.canvas.texts.at(0).font.bold);
+    EXPECT_FALSE(d.button.FontBold());
+    EXPECT_TRUE(Look(0).canvas.texts.empty());
+    EXPECT_TRUE(Look(10).canvas.texts.empty());
 }
 
 TEST(XPButtonLooks, SpecialLooksAndStates) {
-    Look face(10);  // the face alone, no caption
-    EXPECT_EQ(face.canvas.pixels(), std::vector<Rgb>(40 * 20, face.p().FaceColor));
-    EXPECT_TRUE(face.canvas.texts.empty());
-
-    Look parent(11);  // the parent's pixels in place of the face
-    EXPECT_EQ(std::make_pair(parent.At(0, 0), parent.At(39, 19)),
-              std::make_pair(parent.host.parentPixel, parent.host.parentPixel));
-    // A resize arriving while the background is captured is ignored; Refresh captures again.
-    parent.host.duringCapture = [&] {
-        parent.host.height = 0;
-        parent.button.OnResize();
-    };
-    parent.button.Refresh();
-    EXPECT_EQ(parent.button.height(), 20);
-    EXPECT_EQ(parent.At(5, 5), parent.host.parentPixel);
-    parent.host.duringCapture = nullptr;
-    parent.host.height = 20;
-    parent.button.OnHide();  // shown again, the control copies the parent as it is now
+    // The transparent look: the parent's pixels in place of the face (where they come from and a
+    // resize during the capture are proved under Wine); shown again, it copies the parent as it is now.
+    Look parent(11);
+    parent.button.OnHide();
     parent.host.parentPixel = 0x445566;
     parent.button.OnShow();
     EXPECT_EQ(parent.At(5, 5), 0x445566u);
@@ -280,6 +225,10 @@ TEST(XPButtonLooks, SpecialLooksAndStates) {
     EXPECT_EQ(oval.canvas.ovals.at(0).pen, oval.p().ShadowColor);
     oval.Press();
     EXPECT_EQ(oval.canvas.ovals.at(0).brush, S(oval.p().FaceColor, -32));
+
+    Look soft(3, 40, 20, 3);  // SoftBevel halves every amount, the gradient steps included
+    soft.button.SetSoftBevel(true);
+    EXPECT_EQ(soft.At(20, 10), ShiftColor(ShiftColor(0xC0C0C0, 48, true, true), -12, true, true));
 
     // Paint(1) draws the face only; a checked two-state button is drawn pressed, unless disabled.
     Look l(1);

@@ -1,13 +1,15 @@
 #include "fakes/fake_button_host.h"
 
+#include "fakes/raster_canvas.h"
+
 namespace vantorel::testing {
 
 FakeButtonHost::FakeButtonHost() {
-    // The classic Windows scheme.
+    // The classic Windows scheme, but for a 3D light distinct from the face so that the looks tell them apart.
     systemColours = {{platform::kColorHighlight, 0x6A240A}, {platform::kColorBtnFace, 0xC8D0D4},
                      {platform::kColorBtnShadow, 0x808080}, {platform::kColorBtnText, 0x000000},
                      {platform::kColorBtnHighlight, 0xFFFFFF}, {platform::kColor3dDkShadow, 0x404040},
-                     {platform::kColor3dLight, 0xC8D0D4}};
+                     {platform::kColor3dLight, 0xDCE4E8}};
 }
 
 platform::Rgb FakeButtonHost::SystemColour(int index) const {
@@ -16,16 +18,10 @@ platform::Rgb FakeButtonHost::SystemColour(int index) const {
 }
 
 bool FakeButtonHost::CaptureParentPixels(std::int32_t w, std::int32_t h, std::vector<std::uint8_t>& pixels) {
-    if (duringCapture) duringCapture();
     const std::int32_t stride = platform::DibStride(w);
     pixels.assign(static_cast<std::size_t>(stride) * h, 0);
     for (std::int32_t row = 0; row < h; ++row)
-        for (std::int32_t col = 0; col < w; ++col) {
-            std::uint8_t* p = pixels.data() + static_cast<std::size_t>(row) * stride + col * 3;
-            p[0] = static_cast<std::uint8_t>(parentPixel >> 16);
-            p[1] = static_cast<std::uint8_t>(parentPixel >> 8);
-            p[2] = static_cast<std::uint8_t>(parentPixel);
-        }
+        for (std::int32_t col = 0; col < w; ++col) PutDibPixel(pixels, stride, row, col, parentPixel);
     return true;
 }
 
@@ -39,19 +35,10 @@ bool MemoryPicture::Render(std::int32_t w, std::int32_t h, platform::Rgb fill, s
     out.assign(static_cast<std::size_t>(stride) * h, 0);
     for (std::int32_t y = 0; y < h; ++y)
         for (std::int32_t x = 0; x < w; ++x) {
-            platform::Rgb c = 0;
-            const bool inside = x < w_ && y < h_;
             const std::size_t i = static_cast<std::size_t>(y) * w_ + x;
-            if (kind_ != platform::PictureKind::kBitmap) {
-                c = fill;
-                if (inside && !(i < transparent_.size() && transparent_[i])) c = pixels_[i];
-            } else if (inside) {
-                c = pixels_[i];
-            }
-            std::uint8_t* p = out.data() + static_cast<std::size_t>(h - 1 - y) * stride + x * 3;
-            p[0] = static_cast<std::uint8_t>(c >> 16);
-            p[1] = static_cast<std::uint8_t>(c >> 8);
-            p[2] = static_cast<std::uint8_t>(c);
+            const bool clear = x >= w_ || y >= h_ || (i < transparent_.size() && transparent_[i]);
+            const platform::Rgb blank = kind_ == platform::PictureKind::kBitmap ? 0 : fill;
+            PutDibPixel(out, stride, h - 1 - y, x, clear ? blank : pixels_[i]);
         }
     return true;
 }

@@ -2,7 +2,6 @@
 // (notifications, shapes, timers, keys, presents) and answers from settable fields.
 #pragma once
 
-#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -31,10 +30,7 @@ public:
     }
     void ReleaseShape() override { shapeHeld = false; }
     bool PointerOverSelf() const override { return pointerOver; }
-    void StartOverTimer(std::int32_t ms) override {
-        timerRunning = true;
-        timerPeriod = ms;
-    }
+    void StartOverTimer(std::int32_t) override { timerRunning = true; }
     void StopOverTimer() override { timerRunning = false; }
     void SendKeys(const std::string& keys) override { sentKeys.push_back(keys); }
     void CaptureMouse() override {}
@@ -61,7 +57,6 @@ public:
     bool shapeHeld = false;
     bool pointerOver = false;
     bool timerRunning = false;
-    std::int32_t timerPeriod = 0;
     std::vector<std::string> sentKeys;
     std::int32_t dpi = 96;
     bool designMode = false;
@@ -71,8 +66,6 @@ public:
     platform::Rgb parentBack = 0x00FFEEDD;
     platform::Rgb parentText = 0x00112233;
     platform::Rgb parentPixel = 0x00336699;
-    // Runs inside CaptureParentPixels, as pending window messages would.
-    std::function<void()> duringCapture;
     std::map<int, platform::Rgb> systemColours;
 };
 
