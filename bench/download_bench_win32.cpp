@@ -31,8 +31,8 @@ double Seconds(Clock::time_point since) { return std::chrono::duration<double>(C
 // The bare loop: one request, 64 KiB reads, nothing else.
 long long BareLoop(const std::string& url) {
     HINTERNET session = ::InternetOpenA("bench", INTERNET_OPEN_TYPE_PRECONFIG, nullptr, nullptr, 0);
-    HINTERNET request = ::InternetOpenUrlA(session, url.c_str(), nullptr, 0,
-                                           INTERNET_FLAG_RELOAD | INTERNET_FLAG_NO_CACHE_WRITE | INTERNET_FLAG_NO_UI, 0);
+    HINTERNET request = ::InternetOpenUrlA(
+        session, url.c_str(), nullptr, 0, INTERNET_FLAG_RELOAD | INTERNET_FLAG_NO_CACHE_WRITE | INTERNET_FLAG_NO_UI, 0);
     long long total = 0;
     if (request != nullptr) {
         std::vector<char> block(64 * 1024);
@@ -123,8 +123,9 @@ int main(int argc, char** argv) {
         bool PumpMessages() override { return true; }
     } nullPump;
     vantorel::win32::Win32MessagePump realPump;
-    vantorel::platform::MessagePump& pump =
-        std::getenv("VT_NULL_PUMP") && *std::getenv("VT_NULL_PUMP") ? static_cast<vantorel::platform::MessagePump&>(nullPump) : realPump;
+    vantorel::platform::MessagePump& pump = std::getenv("VT_NULL_PUMP") && *std::getenv("VT_NULL_PUMP")
+                                                ? static_cast<vantorel::platform::MessagePump&>(nullPump)
+                                                : realPump;
     vantorel::win32::WinInetTransfer inet(pump);
     vantorel::win32::Win32FileSystem disk;
     vantorel::FileDownloader fd(inet, disk, pump);
@@ -138,20 +139,24 @@ int main(int argc, char** argv) {
         const int n = 20000;
         MSG msg;
         Clock::time_point start = Clock::now();
-        for (int i = 0; i < n; ++i) ::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE);
+        for (int i = 0; i < n; ++i)
+            ::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE);
         double peek = Seconds(start) / n * 1e6;
         start = Clock::now();
-        for (int i = 0; i < n; ++i) ::GetQueueStatus(QS_ALLINPUT);
+        for (int i = 0; i < n; ++i)
+            ::GetQueueStatus(QS_ALLINPUT);
         double status = Seconds(start) / n * 1e6;
         HANDLE file = ::CreateFileA(dest.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_ALWAYS, 0, nullptr);
         std::string chunk(1024, 'x');
         DWORD written = 0;
         start = Clock::now();
-        for (int i = 0; i < n; ++i) ::WriteFile(file, chunk.data(), 1024, &written, nullptr);
+        for (int i = 0; i < n; ++i)
+            ::WriteFile(file, chunk.data(), 1024, &written, nullptr);
         double write = Seconds(start) / n * 1e6;
         std::string block(64 * 1024, 'y');
         start = Clock::now();
-        for (int i = 0; i < 800; ++i) ::WriteFile(file, block.data(), 64 * 1024, &written, nullptr);
+        for (int i = 0; i < 800; ++i)
+            ::WriteFile(file, block.data(), 64 * 1024, &written, nullptr);
         double write50 = Seconds(start) * 1e3;
         start = Clock::now();
         ::FlushFileBuffers(file);
@@ -187,8 +192,8 @@ int main(int argc, char** argv) {
         long long size = (static_cast<long long>(data.nFileSizeHigh) << 32) | data.nFileSizeLow;
         if (!ok) std::printf("download failed: %s\n", lastError.c_str());
         full.push_back(size / seconds / 1e6);
-        std::printf("%-28s %10lld %10.3f %12.1f %10d %12.1f  (%lld progress events)\n", "FileDownloader", size,
-                    seconds, full.back(), gTicks.count, gTicks.longestGapMs, progressEvents);
+        std::printf("%-28s %10lld %10.3f %12.1f %10d %12.1f  (%lld progress events)\n", "FileDownloader", size, seconds,
+                    full.back(), gTicks.count, gTicks.longestGapMs, progressEvents);
         ::DeleteFileA(dest.c_str());
 
         start = Clock::now();

@@ -65,11 +65,13 @@ const DefinitionList& TheDefinitions() {
         }
         std::vector<std::string> lines;
         lines.reserve(keys.size());
-        for (auto k : keys) lines.push_back(std::to_string(k));
+        for (auto k : keys)
+            lines.push_back(std::to_string(k));
         std::sort(lines.begin(), lines.end());
         lines.erase(std::unique(lines.begin(), lines.end()), lines.end());
         std::string text;
-        for (const auto& l : lines) text += l + "\r\n";
+        for (const auto& l : lines)
+            text += l + "\r\n";
         return DefinitionList::FromText(text);
     }();
     return list;
@@ -130,10 +132,10 @@ struct World {
         if (child == 0) {
             ::close(stop[1]);
             std::vector<int> accepted;
-            for (int i = 0; i < connections; ++i) accepted.push_back(::accept(listener.fd.get(), nullptr, nullptr));
+            for (int i = 0; i < connections; ++i)
+                accepted.push_back(::accept(listener.fd.get(), nullptr, nullptr));
             char byte;
-            while (::read(stop[0], &byte, 1) < 0) {
-            }
+            while (::read(stop[0], &byte, 1) < 0) {}
             ::_exit(0);
         }
         ::close(stop[0]);
@@ -216,7 +218,8 @@ BENCHMARK(BM_Sweep)->Arg(10000)->Iterations(60)->Unit(benchmark::kMillisecond);
 double ThreadCpuMs() {
     rusage usage{};
     ::getrusage(RUSAGE_THREAD, &usage);
-    return (usage.ru_utime.tv_sec + usage.ru_stime.tv_sec) * 1e3 + (usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) / 1e3;
+    return (usage.ru_utime.tv_sec + usage.ru_stime.tv_sec) * 1e3 +
+           (usage.ru_utime.tv_usec + usage.ru_stime.tv_usec) / 1e3;
 }
 
 void BM_ExposureWindow(benchmark::State& state) {

@@ -109,7 +109,8 @@ void RunPaintBenchmark() {
         button.SetButtonType(type == 15 ? 3 : type);
         const int rounds = type == 15 ? 1000000 : 200;
         const auto start = now();
-        for (int i = 0; i < rounds; ++i) button.Paint(0, type != 15);
+        for (int i = 0; i < rounds; ++i)
+            button.Paint(0, type != 15);
         const double us = static_cast<double>(now() - start) * 1e6 / static_cast<double>(frequency.QuadPart) / rounds;
         if (type == 15) {
             std::printf("unforced repaint, nothing changed: %.4f us\n", us);
@@ -170,8 +171,8 @@ public:
         if (!::RegisterClassA(&wc)) return false;
         RECT r{0, 0, kGridLeft + 2 * kStates * kColumnStep + 8, kGridTop + 28 * kRowStep + 8};
         ::AdjustWindowRect(&r, WS_OVERLAPPEDWINDOW, FALSE);
-        hwnd_ = ::CreateWindowA("XPButtonGallery", "KirelXPButton gallery", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, 0,
-                                0, r.right - r.left, r.bottom - r.top, nullptr, nullptr, instance, this);
+        hwnd_ = ::CreateWindowA("XPButtonGallery", "KirelXPButton gallery", WS_OVERLAPPEDWINDOW | WS_CLIPCHILDREN, 0, 0,
+                                r.right - r.left, r.bottom - r.top, nullptr, nullptr, instance, this);
         if (!hwnd_) return false;
         padlock_ = MakePadlock();
         MakeLiveControls();
@@ -181,7 +182,8 @@ public:
 
     void Show() {
         ::ShowWindow(hwnd_, SW_SHOW);
-        for (auto& live : live_) live->Show();
+        for (auto& live : live_)
+            live->Show();
         ::UpdateWindow(hwnd_);
     }
 

@@ -101,15 +101,16 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
 
     if (!window.Create(instance)) {
         char line[128];
-        std::snprintf(line, sizeof line, "Vantorel: the main window could not be created (CreateWindowExA, error %lu).\n",
+        std::snprintf(line, sizeof line,
+                      "Vantorel: the main window could not be created (CreateWindowExA, error %lu).\n",
                       ::GetLastError());
         WriteStdout(line);
         return 1;
     }
 
-    FrmMain frmMain(FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, previous}, tray, shell, program},
-                    window.Controls(),
-                    win32::ProgramFolder());
+    FrmMain frmMain(
+        FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, previous}, tray, shell, program},
+        window.Controls(), win32::ProgramFolder());
 
     std::string reportedCaption, reportedLight;
     std::uint64_t sweepsReported = 0;
@@ -121,7 +122,8 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
         if (light != reportedLight) WriteStdout("Light: " + light + "\n");
         if (sweeps != sweepsReported) {
             char line[160];
-            std::snprintf(line, sizeof line, "Swept the connection table %llu times; the last sweep examined %u rows.\n",
+            std::snprintf(line, sizeof line,
+                          "Swept the connection table %llu times; the last sweep examined %u rows.\n",
                           static_cast<unsigned long long>(sweeps), frmMain.guard().Sweep().LastSweep().examined);
             WriteStdout(line);
         }
@@ -164,6 +166,7 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     report();
 
     MSG message;
-    while (::GetMessageA(&message, nullptr, 0, 0) > 0) win32::DispatchQueuedMessage(message);
+    while (::GetMessageA(&message, nullptr, 0, 0) > 0)
+        win32::DispatchQueuedMessage(message);
     return static_cast<int>(message.wParam);
 }

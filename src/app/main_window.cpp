@@ -45,7 +45,7 @@ int MetricForDpi(int index, UINT dpi) {
 
 xpbutton::PropertyBag BtnOnOffDesign() {
     xpbutton::PropertyBag design;
-    design.Write("BTYPE", std::int32_t{3});    // the rounded XP look with a gradient face
+    design.Write("BTYPE", std::int32_t{3});  // the rounded XP look with a gradient face
     design.Write("TX", std::string("OFF"));
     design.Write("FONT", platform::FontDesc{"Verdana", 14.25, true, false, false, false});
     design.Write("COLTYPE", std::int32_t{2});  // colours from BackColor
@@ -77,9 +77,7 @@ void Win32Timer::SetEnabled(bool enabled) {
 
 MainWindow::MainWindow() = default;
 
-MainWindow::~MainWindow() {
-    Destroy();
-}
+MainWindow::~MainWindow() { Destroy(); }
 
 void MainWindow::Destroy() {
     if (hwnd_ != nullptr && !destroying_) ::DestroyWindow(hwnd_);
@@ -130,13 +128,15 @@ bool MainWindow::Create(HINSTANCE instance) {
         auto index = static_cast<std::size_t>(i);
         uf_[index] = std::make_unique<Win32Frame>(hwnd, kUfCaptions[i], kUfRects[i], dpi_, font_.get());
         HWND panel = uf_[index]->hwnd();
-        l_[static_cast<std::size_t>(1 - i)] = std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_.get());
+        l_[static_cast<std::size_t>(1 - i)] =
+            std::make_unique<Win32Label>(panel, kLCaptions[1 - i], kLRects[1 - i], dpi_, font_.get());
         const int buttonIndex = i == 1 ? 4 : 3;
         btnO_[static_cast<std::size_t>(buttonIndex)] =
             std::make_unique<Win32Button>(panel, kBtnOCaptions[buttonIndex], kPanelButtonRect, dpi_, font_.get());
     }
     for (int i = 0; i < 3; ++i) {
-        btnO_[static_cast<std::size_t>(i)] = std::make_unique<Win32Button>(hwnd, kBtnOCaptions[i], kRowRects[i], dpi_, font_.get());
+        btnO_[static_cast<std::size_t>(i)] =
+            std::make_unique<Win32Button>(hwnd, kBtnOCaptions[i], kRowRects[i], dpi_, font_.get());
     }
 
     // Explorer announces a restart with this message; the program runs elevated, so it has to be let
@@ -169,9 +169,12 @@ void MainWindow::ApplyDpi(UINT dpi) {
     ::SetWindowPos(onOff_.hwnd(), nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
                    SWP_NOZORDER | SWP_NOACTIVATE);
     onOff_.SetDpi(dpi);
-    for (auto& frame : uf_) frame->Relayout(dpi, font_.get());
-    for (auto& label : l_) label->Relayout(dpi, font_.get());
-    for (auto& button : btnO_) button->Relayout(dpi, font_.get());
+    for (auto& frame : uf_)
+        frame->Relayout(dpi, font_.get());
+    for (auto& label : l_)
+        label->Relayout(dpi, font_.get());
+    for (auto& button : btnO_)
+        button->Relayout(dpi, font_.get());
 
     HINSTANCE instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(hwnd_, GWLP_HINSTANCE));
     const int ids[3] = {IDI_BULB_DARK, IDI_BULB_LIT, IDI_PADLOCK};
@@ -294,9 +297,7 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
                 if (focus != nullptr && ::IsChild(hwnd, focus)) focus_ = focus;
             }
             break;
-        case WM_SETFOCUS:
-            ::SetFocus(focus_ != nullptr && ::IsWindow(focus_) ? focus_ : onOff_.hwnd());
-            return 0;
+        case WM_SETFOCUS: ::SetFocus(focus_ != nullptr && ::IsWindow(focus_) ? focus_ : onOff_.hwnd()); return 0;
         case WM_MOUSEMOVE:
             // The tray icon's notifications arrive as this message with the event code in the low
             // word: taken raw, not as a signed coordinate.
@@ -306,8 +307,7 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             if (handlers_.close) handlers_.close();
             else Destroy();
             return 0;
-        case WM_QUERYENDSESSION:
-            return TRUE;  // the user is logging off or the system shuts down: nothing holds it up
+        case WM_QUERYENDSESSION: return TRUE;  // the user is logging off or the system shuts down: nothing holds it up
         case WM_ENDSESSION:
             // The session ends once this returns: the same unload as "&Exit", now.
             if (wParam != FALSE) {
@@ -324,8 +324,7 @@ LRESULT MainWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             tmr_.hwnd_ = nullptr;
             timer_.hwnd_ = nullptr;
             break;
-        default:
-            break;
+        default: break;
     }
     return ::DefWindowProcA(hwnd, message, wParam, lParam);
 }

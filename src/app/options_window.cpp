@@ -62,8 +62,8 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     HINSTANCE instance = ::GetModuleHandleA(nullptr);
     RegisterWindowClass(instance, kOptionsClass, WindowProc);
     RegisterWindowClass(instance, kPictureClass, PictureProc);
-    hwnd_ = ::CreateWindowExA(kExStyle, kOptionsClass, "Options", kStyle, CW_USEDEFAULT, CW_USEDEFAULT, 100, 100,
-                              owner, nullptr, instance, this);
+    hwnd_ = ::CreateWindowExA(kExStyle, kOptionsClass, "Options", kStyle, CW_USEDEFAULT, CW_USEDEFAULT, 100, 100, owner,
+                              nullptr, instance, this);
     if (hwnd_ == nullptr) return;
 
     const UINT dpi = dpi_ = DpiOfWindow(hwnd_);
@@ -80,15 +80,16 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
                                   "Disable script debugging in Interent Explorer"};
     for (int i = 0; i < 3; ++i)
         boxes_[i] = std::make_unique<Win32CheckBox>(frames_[0]->hwnd(), boxCaptions[i], kBoxRects[i], dpi, font_.get());
-    hint_ = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Click to check for updates ->", kHintRect, dpi, font_.get());
+    hint_ =
+        std::make_unique<Win32Label>(frames_[1]->hwnd(), "Click to check for updates ->", kHintRect, dpi, font_.get());
     update_ = std::make_unique<Win32Button>(frames_[1]->hwnd(), "&Check for Updates", kUpdateRect, dpi, font_.get());
-    labels_[0] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Definitions Updates:", kLabelRects[0], dpi, font_.get());
+    labels_[0] =
+        std::make_unique<Win32Label>(frames_[1]->hwnd(), "Definitions Updates:", kLabelRects[0], dpi, font_.get());
     labels_[1] = std::make_unique<Win32Label>(frames_[1]->hwnd(), "Program Updates:", kLabelRects[1], dpi, font_.get());
     // pb: a sunken white box whose inside shows the picture box's image.
     RECT pb = ToPixels(kProgressRect, dpi);
-    pbWindow_ = ::CreateWindowExA(WS_EX_CLIENTEDGE, kPictureClass, "", WS_CHILD, pb.left, pb.top,
-                                  pb.right - pb.left, pb.bottom - pb.top, frames_[1]->hwnd(), nullptr, instance,
-                                  nullptr);
+    pbWindow_ = ::CreateWindowExA(WS_EX_CLIENTEDGE, kPictureClass, "", WS_CHILD, pb.left, pb.top, pb.right - pb.left,
+                                  pb.bottom - pb.top, frames_[1]->hwnd(), nullptr, instance, nullptr);
     RECT inside{};
     ::GetClientRect(pbWindow_, &inside);
     pb_ = std::make_unique<GdiPictureBox>(inside.right, inside.bottom, pbWindow_);
@@ -104,8 +105,8 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
     controls_.BtnUpdate = update_.get();
     controls_.L = {labels_[0].get(), labels_[1].get()};
     form_ = std::make_unique<FrmOptions>(
-        OptionsPlatform{registry, scheduler_, pump_, files_, disk_, inet_, transfer1_, transfer2_, transfer3_}, controls_,
-        *this, target, executablePath,
+        OptionsPlatform{registry, scheduler_, pump_, files_, disk_, inet_, transfer1_, transfer2_, transfer3_},
+        controls_, *this, target, executablePath,
         [this] {
             if (live() != nullptr) ::DestroyWindow(hwnd_);
         },
@@ -113,16 +114,18 @@ OptionsWindow::OptionsWindow(HWND owner, int frameIndex, platform::Registry& reg
             if (live() != nullptr) ::MessageBoxA(hwnd_, text.c_str(), "Options", MB_OK | MB_ICONEXCLAMATION);
         });
     form_->Form_Load();
-
 }
 
 void OptionsWindow::ApplyDpi(UINT dpi) {
     dpi_ = dpi;
     UniqueHfont old = std::move(font_);  // deleted once every control has the new one
     font_.reset(CreateDesignFont(dpi));
-    for (auto& frame : frames_) frame->Relayout(dpi, font_.get());
-    for (auto& box : boxes_) box->Relayout(dpi, font_.get());
-    for (auto& label : labels_) label->Relayout(dpi, font_.get());
+    for (auto& frame : frames_)
+        frame->Relayout(dpi, font_.get());
+    for (auto& box : boxes_)
+        box->Relayout(dpi, font_.get());
+    for (auto& label : labels_)
+        label->Relayout(dpi, font_.get());
     hint_->Relayout(dpi, font_.get());
     update_->Relayout(dpi, font_.get());
     close_->Relayout(dpi, font_.get());
@@ -230,20 +233,17 @@ LRESULT OptionsWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam)
             if (close_) {
                 HWND first = frames_[0]->Visible() ? boxes_[0]->hwnd()
                              : update_->Enabled()  ? update_->hwnd()
-                                                         : close_->hwnd();
+                                                   : close_->hwnd();
                 ::SetFocus(first);
             }
             return 0;
-        case WM_CLOSE:
-            ::DestroyWindow(hwnd);
-            return 0;
+        case WM_CLOSE: ::DestroyWindow(hwnd); return 0;
         case WM_DESTROY:
             closed_ = true;
             // A check running below this message (it pumps messages) stops at its next step.
             if (form_) form_->Updates().Cancel();
             return 0;
-        default:
-            break;
+        default: break;
     }
     return ::DefWindowProcA(hwnd, message, wParam, lParam);
 }

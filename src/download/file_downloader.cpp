@@ -198,8 +198,8 @@ void FileDownloader::FilePhase(const std::string& destination, std::int32_t anno
     }
 }
 
-bool FileDownloader::DownloadFile(const std::string& url, const std::string& destination,
-                                  const std::string& userName, const std::string& password) {
+bool FileDownloader::DownloadFile(const std::string& url, const std::string& destination, const std::string& userName,
+                                  const std::string& password) {
     cancel_ = false;
     std::int32_t received = 0;
     std::int32_t announced = 0;

@@ -132,11 +132,11 @@ private:
     void BuildIndex();
 
     std::size_t lines_ = 0;
-    std::vector<std::int32_t> keys_;       // the lines that are canonical keys, in file order
-    LineBits blank_;                       // empty lines
-    LineBits odd_;                         // other lines that are not canonical keys
-    std::string oddText_;                  // their bytes, one after the other
-    std::vector<std::uint32_t> oddEnds_;   // where each one ends in oddText_
+    std::vector<std::int32_t> keys_;      // the lines that are canonical keys, in file order
+    LineBits blank_;                      // empty lines
+    LineBits odd_;                        // other lines that are not canonical keys
+    std::string oddText_;                 // their bytes, one after the other
+    std::vector<std::uint32_t> oddEnds_;  // where each one ends in oddText_
     std::vector<Bucket> buckets_;
     bool sorted_ = true;
 };

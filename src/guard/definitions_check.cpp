@@ -27,8 +27,7 @@ std::string DefinitionsListProblem(std::string_view text) {
     while (start < text.size()) {
         std::size_t end = text.find(separator, start);
         if (end == std::string_view::npos) end = text.size();
-        if (!IsKey(text.substr(start, end - start)))
-            return "line " + std::to_string(line) + " is not an address key";
+        if (!IsKey(text.substr(start, end - start))) return "line " + std::to_string(line) + " is not an address key";
         start = end + separator.size();
         ++line;
     }

@@ -23,7 +23,8 @@ void Guard::Load() {
     platform_.instance.CreateNamedMutex(kMutexName);
 
     platform::Window& frm = window_.frmMain;
-    frm.Move((platform_.windows.ScreenWidth() - frm.Width()) / 2, (platform_.windows.ScreenHeight() - frm.Height()) / 2);
+    frm.Move((platform_.windows.ScreenWidth() - frm.Width()) / 2,
+             (platform_.windows.ScreenHeight() - frm.Height()) / 2);
 
     if (ReadIntSetting(platform_.registry, platform::kHkeyLocalMachine, kTrayValue, 0) == 0) frm.SetVisible(true);
 

@@ -2,9 +2,7 @@
 
 namespace vantorel {
 
-std::string DefinitionsPath(const std::string& programFolder) {
-    return programFolder + "\\" + kDefinitionsFileName;
-}
+std::string DefinitionsPath(const std::string& programFolder) { return programFolder + "\\" + kDefinitionsFileName; }
 
 bool DefinitionsUsable(const std::string& path, platform::Files& files) {
     std::optional<std::uint64_t> size = files.ReadableSize(path);

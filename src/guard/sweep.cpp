@@ -44,7 +44,8 @@ std::uint32_t ConnectionSweep::FetchTable() {
 
 void ConnectionSweep::Intercepted() {
     count_ = NextCount(count_);
-    OpenSettings(services_.registry, platform::kHkeyCurrentUser).SetRegistryValue(kAttemptsValue, count_, platform::kRegSz);
+    OpenSettings(services_.registry, platform::kHkeyCurrentUser)
+        .SetRegistryValue(kAttemptsValue, count_, platform::kRegSz);
     services_.view.CountIntercepted(count_);
 }
 

@@ -36,12 +36,12 @@ struct SweepServices {
 
 // What one sweep did.
 struct SweepResult {
-    bool fetched = false;            // the table was read
-    int fetchCalls = 0;              // GetTcpTable calls made
-    std::uint32_t rows = 0;          // rows in the table
-    std::uint32_t examined = 0;      // rows looked at (fewer when the program quits mid-sweep)
-    std::uint32_t requested = 0;     // teardowns asked for
-    std::uint32_t intercepted = 0;   // teardowns the system accepted (each one counted)
+    bool fetched = false;           // the table was read
+    int fetchCalls = 0;             // GetTcpTable calls made
+    std::uint32_t rows = 0;         // rows in the table
+    std::uint32_t examined = 0;     // rows looked at (fewer when the program quits mid-sweep)
+    std::uint32_t requested = 0;    // teardowns asked for
+    std::uint32_t intercepted = 0;  // teardowns the system accepted (each one counted)
 };
 
 class ConnectionSweep {
@@ -75,7 +75,7 @@ private:
     const DefinitionList& definitions_;
     std::int32_t& count_;
     std::vector<std::uint32_t> buffer_;  // 32-bit words: the entry count, then the rows
-    std::uint64_t runs_ = 0;  // runs started: a run that finds it changed after a yield was taken over
+    std::uint64_t runs_ = 0;             // runs started: a run that finds it changed after a yield was taken over
     bool running_ = false;
     SweepResult current_;  // the sweep under way
     SweepResult last_;

@@ -48,7 +48,7 @@ public:
     virtual bool Delete(const std::string& path) = 0;
     // GetDiskFreeSpaceA on `root` (which ends in "\"); false and zeros when it fails.
     virtual bool QueryDiskFreeSpace(const std::string& root, std::uint32_t& bytesPerSector,
-                                  std::uint32_t& sectorsPerCluster, std::uint32_t& freeClusters) = 0;
+                                    std::uint32_t& sectorsPerCluster, std::uint32_t& freeClusters) = 0;
 };
 
 }  // namespace vantorel::platform

@@ -81,7 +81,7 @@ public:
     // expansion needs including its terminator (0 on failure); `expanded` receives the buffer's text
     // up to its first NUL when it fitted.
     virtual std::uint32_t ExpandEnvironment(const std::string& source, std::uint32_t capacity,
-                                                   std::string& expanded) = 0;
+                                            std::string& expanded) = 0;
 };
 
 }  // namespace vantorel::platform

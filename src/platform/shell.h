@@ -10,7 +10,7 @@
 namespace vantorel::platform {
 
 inline constexpr std::uint32_t kMbOk = 0x00;
-inline constexpr std::uint32_t kMbIconStop = 0x10;         // the critical-stop icon
+inline constexpr std::uint32_t kMbIconStop = 0x10;  // the critical-stop icon
 inline constexpr std::uint32_t kMbIconExclamation = 0x30;
 inline constexpr std::int32_t kSwShowNormal = 1;
 
@@ -23,12 +23,11 @@ public:
 
     // ShellExecuteA(owner, operation, file, parameters, directory, show command); the shell's answer.
     virtual std::intptr_t Execute(WindowHandle owner, const std::string& operation, const std::string& file,
-                                       const std::string& parameters, const std::string& directory,
-                                       std::int32_t show) = 0;
+                                  const std::string& parameters, const std::string& directory, std::int32_t show) = 0;
 
     // A modal message box owned by `owner`; returns when the user has dismissed it.
     virtual void ShowMessage(WindowHandle owner, const std::string& text, const std::string& title,
-                            std::uint32_t style) = 0;
+                             std::uint32_t style) = 0;
 };
 
 // The program around the main window.

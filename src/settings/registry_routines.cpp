@@ -27,7 +27,8 @@ std::string StringOf(const Bytes& data, std::uint32_t count) {
 // The first four bytes, little-endian; a shorter value reads as if the rest of the buffer were zero.
 std::int32_t DwordOf(const Bytes& data, std::uint32_t count) {
     std::uint32_t value = 0;
-    for (std::uint32_t i = 0; i < 4 && i < count && i < data.size(); ++i) value |= std::uint32_t{data[i]} << (8 * i);
+    for (std::uint32_t i = 0; i < 4 && i < count && i < data.size(); ++i)
+        value |= std::uint32_t{data[i]} << (8 * i);
     return static_cast<std::int32_t>(value);
 }
 
@@ -145,20 +146,14 @@ Collection<RegistryItem> RegistryRoutines::EnumRegistryValues(std::int32_t hkey,
 
         Variant value;
         switch (type) {
-            case platform::kRegSz:
-                value = StringOf(data, count);
-                break;
+            case platform::kRegSz: value = StringOf(data, count); break;
             case platform::kRegExpandSz: {
                 std::string text = count == 0 ? std::string() : ExpandText(StringOf(data, count));
                 value = TrimNull(text);
                 break;
             }
-            case platform::kRegBinary:
-                value = HexPairs(data, count);
-                break;
-            case platform::kRegDword:
-                value = DwordOf(data, count);
-                break;
+            case platform::kRegBinary: value = HexPairs(data, count); break;
+            case platform::kRegDword: value = DwordOf(data, count); break;
             case platform::kRegMultiSz: {
                 std::string text = count < 2 ? std::string() : TextOf(data, count - 2);
                 for (char& c : text)
@@ -166,8 +161,7 @@ Collection<RegistryItem> RegistryRoutines::EnumRegistryValues(std::int32_t hkey,
                 value = text;
                 break;
             }
-            default:
-                break;
+            default: break;
         }
         values.Add(name, RegistryItem{name, std::move(value)});
     }
@@ -196,12 +190,8 @@ Variant RegistryRoutines::ReadValue(RegKey key, const std::string& name, Variant
         case platform::kRegExpandSz:
             if (count != 0) result = ExpandText(StringOf(data, count));
             break;
-        case platform::kRegBinary:
-            result = Bytes(data.begin(), data.begin() + count);
-            break;
-        case platform::kRegDword:
-            result = DwordOf(data, count);
-            break;
+        case platform::kRegBinary: result = Bytes(data.begin(), data.begin() + count); break;
+        case platform::kRegDword: result = DwordOf(data, count); break;
         case platform::kRegMultiSz: {
             if (count < 2) break;
             std::string text = TextOf(data, count - 2);
@@ -209,8 +199,7 @@ Variant RegistryRoutines::ReadValue(RegKey key, const std::string& name, Variant
             if (!TrimNull(first).empty()) result = text;
             break;
         }
-        default:
-            break;
+        default: break;
     }
     return result;
 }
@@ -244,8 +233,7 @@ bool RegistryRoutines::WriteValue(RegKey key, const std::string& name, const Var
                                   static_cast<std::uint8_t>(bits >> 16), static_cast<std::uint8_t>(bits >> 24)};
             return registry_.SetValue(key, name, type, le, 4) == platform::kErrorSuccess;
         }
-        default:
-            return true;  // a type that is not converted: nothing to write
+        default: return true;  // a type that is not converted: nothing to write
     }
 }
 

@@ -62,8 +62,7 @@ public:
     bool SetRegistryValue(const std::string& valueName, const Variant& value, std::int32_t valueType);
 
     // The same on another computer's registry; "Error!" when it cannot be reached.
-    Variant ReadRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey,
-                                    const std::string& valueName,
+    Variant ReadRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey, const std::string& valueName,
                                     const std::optional<std::string>& keyPath = std::nullopt);
     bool WriteRemoteRegistryValue(const std::string& remoteComputer, std::int32_t hkey, const std::string& valueName,
                                   const Variant& value, std::int32_t valueType,

@@ -63,9 +63,11 @@ void KirelXPButton::ReadProperties(const PropertyBag& bag) {
     host_.SetFont(font_);
     colorScheme_ = bag.ReadInt32("COLTYPE", 1);
     showFocusRect_ = bag.ReadBool("FOCUSR", true);
-    backColor_ = static_cast<Rgb>(bag.ReadInt32("BCOL", static_cast<std::int32_t>(0x80000000u | platform::kColorBtnFace)));
+    backColor_ =
+        static_cast<Rgb>(bag.ReadInt32("BCOL", static_cast<std::int32_t>(0x80000000u | platform::kColorBtnFace)));
     backOver_ = static_cast<Rgb>(bag.ReadInt32("BCOLO", static_cast<std::int32_t>(backColor_)));
-    foreColor_ = static_cast<Rgb>(bag.ReadInt32("FCOL", static_cast<std::int32_t>(0x80000000u | platform::kColorBtnText)));
+    foreColor_ =
+        static_cast<Rgb>(bag.ReadInt32("FCOL", static_cast<std::int32_t>(0x80000000u | platform::kColorBtnText)));
     foreOver_ = static_cast<Rgb>(bag.ReadInt32("FCOLO", static_cast<std::int32_t>(foreColor_)));
     maskColor_ = static_cast<Rgb>(bag.ReadInt32("MCOL", 0xC0C0C0));
     mousePointer_ = bag.ReadInt16("MPTR", 0);
@@ -447,19 +449,12 @@ void KirelXPButton::OnKeyDown(std::int16_t keyCode, std::int16_t shift) {
     if (events.KeyDown) events.KeyDown(keyCode, shift);
     lastKey_ = static_cast<std::uint8_t>(keyCode & 0xFF);
     switch (keyCode) {
-        case 32:
-            Paint(2, false);
-            break;
+        case 32: Paint(2, false); break;
         case 37:
-        case 38:
-            host_.SendKeys("+{Tab}");
-            break;
+        case 38: host_.SendKeys("+{Tab}"); break;
         case 39:
-        case 40:
-            host_.SendKeys("{Tab}");
-            break;
-        default:
-            break;
+        case 40: host_.SendKeys("{Tab}"); break;
+        default: break;
     }
 }
 

@@ -90,12 +90,12 @@ void KirelXPButton::BlitPicture(std::int32_t x, std::int32_t y, std::int32_t w, 
                     d[2] = sr;
                 }
             } else if (greyscale) {
-                const std::int32_t g =
-                    RoundHalfEven(RoundHalfEven(s[2] * 0.3) + s[1] * 0.59 + s[0] * 0.11);
+                const std::int32_t g = RoundHalfEven(RoundHalfEven(s[2] * 0.3) + s[1] * 0.59 + s[0] * 0.11);
                 const auto gb = static_cast<std::uint8_t>(std::clamp(g, 0, 255));
                 d[0] = d[1] = d[2] = gb;
             } else if (blend) {
-                for (int k = 0; k < 3; ++k) d[k] = static_cast<std::uint8_t>((2 * s[k] + d[k]) / 3);
+                for (int k = 0; k < 3; ++k)
+                    d[k] = static_cast<std::uint8_t>((2 * s[k] + d[k]) / 3);
             } else {
                 d[0] = s[0];
                 d[1] = s[1];
@@ -122,8 +122,8 @@ void KirelXPButton::DrawPictureEffect(std::int32_t offset, const platform::Pictu
     BlitPicture(r.x + offset + 1, r.y + offset + 1, r.width, r.height, picture, key, S(base, 40 * s), false, false,
                 false);
     if (specialEffect_ < 3) {
-        BlitPicture(r.x + offset - 1, r.y + offset - 1, r.width, r.height, picture, key, S(base, -40 * s), false,
-                    false, false);
+        BlitPicture(r.x + offset - 1, r.y + offset - 1, r.width, r.height, picture, key, S(base, -40 * s), false, false,
+                    false);
     }
 }
 

@@ -14,7 +14,8 @@
 namespace vantorel::xpbutton {
 
 // Flags, 16- and 32-bit integers, texts, fonts and pictures (a null picture is "none").
-using PropertyValue = std::variant<bool, std::int16_t, std::int32_t, std::string, platform::FontDesc, platform::PicturePtr>;
+using PropertyValue =
+    std::variant<bool, std::int16_t, std::int32_t, std::string, platform::FontDesc, platform::PicturePtr>;
 
 class PropertyBag {
 public:

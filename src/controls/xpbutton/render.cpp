@@ -105,7 +105,7 @@ platform::WindowShape KirelXPButton::BuildRegion() const {
         case 5: shape.removed = {{0, b}, {r, 0}}; break;
         case 3:
         case 4:
-            shape.removed = {{0, 0}, {1, 0}, {0, 1}, {r, 0}, {r - 1, 0}, {r, 1},
+            shape.removed = {{0, 0}, {1, 0}, {0, 1},     {r, 0}, {r - 1, 0}, {r, 1},
                              {0, b}, {1, b}, {0, b - 1}, {r, b}, {r - 1, b}, {r, b - 1}};
             break;
         case 13: shape.ellipse = true; break;

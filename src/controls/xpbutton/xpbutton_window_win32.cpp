@@ -57,8 +57,8 @@ bool XPButtonWindow::Create(HWND parent, int id, int x, int y, int w, int h, con
     if (!RegisterWindowClass(instance)) return false;
     parent_ = parent;
     name_ = name;
-    hwnd_ = ::CreateWindowExA(0, kClassName, name.c_str(), WS_CHILD | WS_TABSTOP | WS_CLIPSIBLINGS, x, y, w, h,
-                              parent, reinterpret_cast<HMENU>(static_cast<INT_PTR>(id)), instance, this);
+    hwnd_ = ::CreateWindowExA(0, kClassName, name.c_str(), WS_CHILD | WS_TABSTOP | WS_CLIPSIBLINGS, x, y, w, h, parent,
+                              reinterpret_cast<HMENU>(static_cast<INT_PTR>(id)), instance, this);
     if (!hwnd_) return false;
     canvas_.SetWindow(hwnd_);
     if (store) {
@@ -126,7 +126,7 @@ LRESULT XPButtonWindow::HandleMessage(UINT message, WPARAM wParam, LPARAM lParam
         case WM_MBUTTONDOWN:
         case WM_RBUTTONDBLCLK:  // a quick second right or middle press is a press like any other
         case WM_MBUTTONDBLCLK: {
-            const std::int16_t b = message == WM_LBUTTONDOWN ? 1
+            const std::int16_t b = message == WM_LBUTTONDOWN                                  ? 1
                                    : message == WM_RBUTTONDOWN || message == WM_RBUTTONDBLCLK ? 2
                                                                                               : 4;
             if (b == 1 && ::GetFocus() != hwnd_) ::SetFocus(hwnd_);
@@ -342,8 +342,7 @@ bool XPButtonWindow::CaptureParentPixels(std::int32_t w, std::int32_t h, std::ve
         WindowDc parentDc(parent_);
         UniqueHdc memory(::CreateCompatibleDC(parentDc.get()));
         void* bits = nullptr;
-        UniqueHbitmap copy(memory ? CreateDib(memory.get(), w, h, 24, &bits)
-                                  : nullptr);
+        UniqueHbitmap copy(memory ? CreateDib(memory.get(), w, h, 24, &bits) : nullptr);
         if (parentDc.get() && copy) {
             SelectGuard select(memory.get(), copy.get());
             if (::BitBlt(memory.get(), 0, 0, w, h, parentDc.get(), at.x, at.y, SRCCOPY)) {

@@ -41,7 +41,8 @@ bool SendRequest(int fd, const Request& request) {
     sockaddr_nl kernel{};
     kernel.nl_family = AF_NETLINK;
     for (;;) {
-        ssize_t sent = ::sendto(fd, &request, sizeof request, 0, reinterpret_cast<const sockaddr*>(&kernel), sizeof kernel);
+        ssize_t sent =
+            ::sendto(fd, &request, sizeof request, 0, reinterpret_cast<const sockaddr*>(&kernel), sizeof kernel);
         if (sent == static_cast<ssize_t>(sizeof request)) return true;
         if (sent < 0 && errno == EINTR) continue;
         return false;
@@ -99,8 +100,7 @@ bool LinuxConnectionTable::Dump() {
             if (header->nlmsg_seq != sequence) continue;  // an answer to an earlier request
             if (header->nlmsg_type == NLMSG_DONE) return true;
             if (header->nlmsg_type == NLMSG_ERROR) return false;
-            if (header->nlmsg_type != SOCK_DIAG_BY_FAMILY ||
-                header->nlmsg_len < NLMSG_LENGTH(sizeof(inet_diag_msg)))
+            if (header->nlmsg_type != SOCK_DIAG_BY_FAMILY || header->nlmsg_len < NLMSG_LENGTH(sizeof(inet_diag_msg)))
                 continue;
             const auto* message = static_cast<const inet_diag_msg*>(NLMSG_DATA(header));
             if (message->idiag_family != AF_INET) continue;

@@ -42,9 +42,9 @@ private:
     int fd_ = -1;
     std::uint32_t sequence_ = 0;
     std::vector<char> receive_;
-    std::vector<platform::TcpRow> rows_;   // the last dump
-    std::vector<inet_diag_sockid> ids_;    // the sockets of those rows
-    std::vector<std::uint32_t> order_;     // scratch for a sorted table
+    std::vector<platform::TcpRow> rows_;  // the last dump
+    std::vector<inet_diag_sockid> ids_;   // the sockets of those rows
+    std::vector<std::uint32_t> order_;    // scratch for a sorted table
 };
 
 }  // namespace vantorel::linux_platform

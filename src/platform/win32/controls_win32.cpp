@@ -18,8 +18,8 @@ enum class Kind : LONG_PTR { kButton = 1, kCheckBox = 2 };
 const char* const kWrapperProp = "VantorelWrapper";
 const char* const kKindPropName = "VantorelKind";
 
-HWND CreateControl(HWND parent, const char* className, DWORD style, const std::string& caption,
-                   const TwipsRect& rect, UINT dpi, HFONT font) {
+HWND CreateControl(HWND parent, const char* className, DWORD style, const std::string& caption, const TwipsRect& rect,
+                   UINT dpi, HFONT font) {
     RECT r = ToPixels(rect, dpi);
     HWND hwnd = ::CreateWindowExA(0, className, caption.c_str(), WS_CHILD | WS_VISIBLE | style, r.left, r.top,
                                   r.right - r.left, r.bottom - r.top, parent, nullptr,
@@ -89,20 +89,14 @@ LRESULT CALLBACK FrameProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam
             }
             return 0;
         }
-        case WM_SETFONT:
-            ::SetPropA(hwnd, "VantorelFont", reinterpret_cast<HANDLE>(wParam));
-            return 0;
-        case WM_GETFONT:
-            return reinterpret_cast<LRESULT>(::GetPropA(hwnd, "VantorelFont"));
-        case WM_NCDESTROY:
-            ::RemovePropA(hwnd, "VantorelFont");
-            break;
+        case WM_SETFONT: ::SetPropA(hwnd, "VantorelFont", reinterpret_cast<HANDLE>(wParam)); return 0;
+        case WM_GETFONT: return reinterpret_cast<LRESULT>(::GetPropA(hwnd, "VantorelFont"));
+        case WM_NCDESTROY: ::RemovePropA(hwnd, "VantorelFont"); break;
         case WM_CTLCOLORSTATIC:
         case WM_CTLCOLORBTN:
             // Labels and check boxes on a frame take the parent window's colours.
             return ::SendMessageA(::GetParent(hwnd), message, wParam, lParam);
-        default:
-            break;
+        default: break;
     }
     return ::DefWindowProcA(hwnd, message, wParam, lParam);
 }
@@ -151,8 +145,7 @@ HFONT CreateDesignFont(UINT dpi) {
 
 void PlaceControl(HWND control, const TwipsRect& rect, UINT dpi, HFONT font) {
     RECT r = ToPixels(rect, dpi);
-    ::SetWindowPos(control, nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
-                   SWP_NOZORDER | SWP_NOACTIVATE);
+    ::SetWindowPos(control, nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top, SWP_NOZORDER | SWP_NOACTIVATE);
     ::SendMessageA(control, WM_SETFONT, reinterpret_cast<WPARAM>(font), TRUE);
     ::InvalidateRect(control, nullptr, TRUE);
 }
@@ -234,8 +227,8 @@ Win32Frame::Win32Frame(HWND parent, const std::string& caption, const TwipsRect&
     RegisterWindowClass(instance, kFrameClass, FrameProc);
     RECT r = ToPixels(rect, dpi);
     hwnd_ = ::CreateWindowExA(WS_EX_CONTROLPARENT, kFrameClass, caption.c_str(),
-                              WS_CHILD | WS_CLIPCHILDREN | (visible ? WS_VISIBLE : 0), r.left, r.top,
-                              r.right - r.left, r.bottom - r.top, parent, nullptr, instance, nullptr);
+                              WS_CHILD | WS_CLIPCHILDREN | (visible ? WS_VISIBLE : 0), r.left, r.top, r.right - r.left,
+                              r.bottom - r.top, parent, nullptr, instance, nullptr);
     if (hwnd_ != nullptr && font != nullptr) ::SendMessageA(hwnd_, WM_SETFONT, reinterpret_cast<WPARAM>(font), FALSE);
 }
 Win32Frame::~Win32Frame() = default;

@@ -15,7 +15,8 @@ platform::FileError LastError() {
 
 // "C:\dir\" names the folder "C:\dir"; a drive root keeps its backslash.
 std::string FolderName(std::string path) {
-    while (path.size() > 1 && path.back() == '\\' && !(path.size() == 3 && path[1] == ':')) path.pop_back();
+    while (path.size() > 1 && path.back() == '\\' && !(path.size() == 3 && path[1] == ':'))
+        path.pop_back();
     return path;
 }
 
@@ -99,7 +100,7 @@ bool Win32FileSystem::Replace(const std::string& from, const std::string& to, pl
 bool Win32FileSystem::Delete(const std::string& path) { return ::DeleteFileA(path.c_str()) != FALSE; }
 
 bool Win32FileSystem::QueryDiskFreeSpace(const std::string& root, std::uint32_t& bytesPerSector,
-                                       std::uint32_t& sectorsPerCluster, std::uint32_t& freeClusters) {
+                                         std::uint32_t& sectorsPerCluster, std::uint32_t& freeClusters) {
     DWORD spc = 0, bps = 0, free = 0, total = 0;
     BOOL ok = ::GetDiskFreeSpaceA(root.c_str(), &spc, &bps, &free, &total);
     bytesPerSector = ok ? bps : 0;

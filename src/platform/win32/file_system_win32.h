@@ -16,7 +16,7 @@ public:
     bool Replace(const std::string& from, const std::string& to, platform::FileError& error) override;
     bool Delete(const std::string& path) override;
     bool QueryDiskFreeSpace(const std::string& root, std::uint32_t& bytesPerSector, std::uint32_t& sectorsPerCluster,
-                          std::uint32_t& freeClusters) override;
+                            std::uint32_t& freeClusters) override;
 };
 
 }  // namespace vantorel::win32

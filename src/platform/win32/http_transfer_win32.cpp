@@ -43,7 +43,7 @@ struct WinInetTransfer::Shared {
     // the wine server; a window thread busy with the blocks it has does not need it.)
     UniqueKernelHandle wake{::CreateEventA(nullptr, FALSE, FALSE, nullptr)};
     std::mutex mutex;
-    bool waiting = false;  // the window thread waits, or is about to, for `wake`
+    bool waiting = false;          // the window thread waits, or is about to, for `wake`
     std::condition_variable room;  // the worker waits here for the window thread to take blocks
     Stage stage = Stage::Requesting;
     bool stop = false, bodyEnded = false, bodyFailed = false;
@@ -179,8 +179,7 @@ bool WinInetTransfer::ExecuteGet(const std::string& requestHeader, platform::Tra
 
 // The worker: the request, the response header, then the body in blocks. It touches nothing but
 // `shared`, which it keeps alive, so it may outlive the transfer that started it.
-void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize,
-                           unsigned silenceMs) {
+void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std::size_t blockSize, unsigned silenceMs) {
     auto fail = [&shared](DWORD code) {
         platform::TransferError error = InternetError(code);
         shared->Publish([&] {
@@ -193,8 +192,8 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
     if (session) {
         // WinINet's own time-outs end an abandoned worker that a silent server would hold forever.
         DWORD ms = silenceMs;
-        for (DWORD option : {INTERNET_OPTION_CONNECT_TIMEOUT, INTERNET_OPTION_SEND_TIMEOUT,
-                             INTERNET_OPTION_RECEIVE_TIMEOUT})
+        for (DWORD option :
+             {INTERNET_OPTION_CONNECT_TIMEOUT, INTERNET_OPTION_SEND_TIMEOUT, INTERNET_OPTION_RECEIVE_TIMEOUT})
             ::InternetSetOptionA(session.get(), option, &ms, sizeof ms);
         connection.reset(::InternetConnectA(session.get(), request.host.c_str(), request.port,
                                             request.userName.empty() ? nullptr : request.userName.c_str(),
@@ -217,8 +216,8 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
         fail(::GetLastError());
     } else if (stopped) {
         // Cancelled before the request went out.
-    } else if (!::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()),
-                                   nullptr, 0)) {
+    } else if (!::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()), nullptr,
+                                   0)) {
         fail(::GetLastError());
     } else {
         std::string header(4096, '\0');
@@ -254,9 +253,7 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
             for (;;) {
                 {
                     std::unique_lock<std::mutex> lock(shared->mutex);
-                    shared->room.wait(lock, [&] {
-                        return shared->stop || shared->queued < kBlocksAhead * blockSize;
-                    });
+                    shared->room.wait(lock, [&] { return shared->stop || shared->queued < kBlocksAhead * blockSize; });
                     if (shared->stop) break;
                 }
                 DWORD ask = static_cast<DWORD>(blockSize), available = 0, read = 0, failure = 0;

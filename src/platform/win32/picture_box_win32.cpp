@@ -18,8 +18,7 @@ COLORREF GdiPictureBox::Resolve(std::uint32_t colour) {
     return static_cast<COLORREF>(colour & 0xFFFFFFu);
 }
 
-GdiPictureBox::GdiPictureBox(int width, int height, HWND window)
-    : width_(width), height_(height), window_(window) {
+GdiPictureBox::GdiPictureBox(int width, int height, HWND window) : width_(width), height_(height), window_(window) {
     twipsX_ = 1440 / ScreenDpi(LOGPIXELSX);
     twipsY_ = 1440 / ScreenDpi(LOGPIXELSY);
     dc_ = ::CreateCompatibleDC(nullptr);
@@ -80,7 +79,9 @@ void GdiPictureBox::FillBox(double x1, double y1, double x2, double y2, std::uin
     Changed();
 }
 
-void GdiPictureBox::Show(HDC target, int x, int y) const { ::BitBlt(target, x, y, width_, height_, dc_, 0, 0, SRCCOPY); }
+void GdiPictureBox::Show(HDC target, int x, int y) const {
+    ::BitBlt(target, x, y, width_, height_, dc_, 0, 0, SRCCOPY);
+}
 
 void GdiPictureBox::Changed() const {
     if (window_ != nullptr) ::InvalidateRect(window_, nullptr, FALSE);

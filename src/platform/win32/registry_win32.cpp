@@ -24,8 +24,8 @@ std::int32_t Win32Registry::CreateKey(platform::RegKey parent, const std::string
     HKEY created = nullptr;
     SECURITY_ATTRIBUTES security{};  // all zero: default security, not inherited
     char emptyClass[] = "";
-    LONG status = ::RegCreateKeyExA(H(parent), path.c_str(), 0, emptyClass, 0, static_cast<REGSAM>(access),
-                                    &security, &created, nullptr);
+    LONG status = ::RegCreateKeyExA(H(parent), path.c_str(), 0, emptyClass, 0, static_cast<REGSAM>(access), &security,
+                                    &created, nullptr);
     if (status == ERROR_SUCCESS) key = K(created);
     return status;
 }
@@ -73,16 +73,14 @@ std::int32_t Win32Registry::EnumValue(platform::RegKey key, std::uint32_t index,
     DWORD length = nameCapacity;
     DWORD valueType = 0;
     DWORD size = count <= data.size() ? count : static_cast<DWORD>(data.size());
-    LONG status =
-        ::RegEnumValueA(H(key), index, buffer.data(), &length, nullptr, &valueType, data.data(), &size);
+    LONG status = ::RegEnumValueA(H(key), index, buffer.data(), &length, nullptr, &valueType, data.data(), &size);
     if (status == ERROR_SUCCESS) name = buffer.substr(0, length);
     type = static_cast<std::int32_t>(valueType);
     count = size;
     return status;
 }
 
-std::int32_t Win32Registry::ConnectRegistry(const std::string& computer, platform::RegKey root,
-                                            platform::RegKey& key) {
+std::int32_t Win32Registry::ConnectRegistry(const std::string& computer, platform::RegKey root, platform::RegKey& key) {
     HKEY connected = nullptr;
     LONG status = ::RegConnectRegistryA(computer.c_str(), H(root), &connected);
     if (status == ERROR_SUCCESS) key = K(connected);
@@ -90,7 +88,7 @@ std::int32_t Win32Registry::ConnectRegistry(const std::string& computer, platfor
 }
 
 std::uint32_t Win32Registry::ExpandEnvironment(const std::string& source, std::uint32_t capacity,
-                                                      std::string& expanded) {
+                                               std::string& expanded) {
     std::string buffer(capacity + 1, '\0');  // one spare byte so a zero capacity still has a pointer
     DWORD needed = ::ExpandEnvironmentStringsA(source.c_str(), buffer.data(), capacity);
     if (needed != 0 && needed <= capacity) expanded = buffer.substr(0, buffer.find('\0'));

@@ -37,9 +37,8 @@ bool Win32WindowManager::DeleteSystemMenuCommand(platform::WindowHandle window, 
     return menu != nullptr && ::DeleteMenu(menu, command, MF_BYCOMMAND) != FALSE;
 }
 
-std::intptr_t Win32Shell::Execute(platform::WindowHandle owner, const std::string& operation,
-                                       const std::string& file, const std::string& parameters,
-                                       const std::string& directory, std::int32_t show) {
+std::intptr_t Win32Shell::Execute(platform::WindowHandle owner, const std::string& operation, const std::string& file,
+                                  const std::string& parameters, const std::string& directory, std::int32_t show) {
     HINSTANCE result = ::ShellExecuteA(reinterpret_cast<HWND>(owner), operation.c_str(), file.c_str(),
                                        parameters.empty() ? nullptr : parameters.c_str(),
                                        directory.empty() ? nullptr : directory.c_str(), show);
@@ -47,7 +46,7 @@ std::intptr_t Win32Shell::Execute(platform::WindowHandle owner, const std::strin
 }
 
 void Win32Shell::ShowMessage(platform::WindowHandle owner, const std::string& text, const std::string& title,
-                            std::uint32_t style) {
+                             std::uint32_t style) {
     ::MessageBoxA(reinterpret_cast<HWND>(owner), text.c_str(), title.c_str(), style);
 }
 

@@ -29,10 +29,9 @@ public:
 class Win32Shell : public platform::Shell {
 public:
     std::intptr_t Execute(platform::WindowHandle owner, const std::string& operation, const std::string& file,
-                               const std::string& parameters, const std::string& directory,
-                               std::int32_t show) override;
+                          const std::string& parameters, const std::string& directory, std::int32_t show) override;
     void ShowMessage(platform::WindowHandle owner, const std::string& text, const std::string& title,
-                    std::uint32_t style) override;
+                     std::uint32_t style) override;
 };
 
 // Handles one message taken from the queue, the same way in every loop of the program (the main
@@ -60,7 +59,7 @@ public:
 private:
     bool quitting_ = false;
     const MSG* dispatching_ = nullptr;  // the message this pump is handling now (innermost call)
-    long long yieldTicks_ = 0;  // performance-counter ticks between two looks at the queue
+    long long yieldTicks_ = 0;          // performance-counter ticks between two looks at the queue
     long long lastLook_ = 0;
 };
 

@@ -25,23 +25,14 @@ std::string FrmMain::HelpAddress() const { return ServerAddress(platform_.guard.
 void FrmMain::BtnOClick(int index) {
     platform::Window& frm = controls_.frmMain;
     switch (index) {
-        case kBtnTray:
-            frm.SetVisible(false);
-            break;
-        case kBtnExit:
-            Unload();
-            break;
+        case kBtnTray: frm.SetVisible(false); break;
+        case kBtnExit: Unload(); break;
         case kBtnHelp:
             platform_.shell.Execute(frm.Handle(), "open", HelpAddress(), "", "", platform::kSwShowNormal);
             break;
-        case kBtnUpdates:
-            platform_.application.ShowOptionsModal(frm.Handle(), 1);
-            break;
-        case kBtnOptions:
-            platform_.application.ShowOptionsModal(frm.Handle(), 0);
-            break;
-        default:
-            break;
+        case kBtnUpdates: platform_.application.ShowOptionsModal(frm.Handle(), 1); break;
+        case kBtnOptions: platform_.application.ShowOptionsModal(frm.Handle(), 0); break;
+        default: break;
     }
 }
 
@@ -111,8 +102,8 @@ void FrmMain::DefinitionsMissing() {
     platform_.application.ShowOptionsModal(owner, 1);
     if (!DefinitionsUsable(path, platform_.guard.files)) {
         platform_.shell.ShowMessage(owner,
-                                   platform_.guard.files.Exists(path) ? kStillUnreadableText : kNoDefinitionsText,
-                                   kDefinitionsErrorTitle, platform::kMbOk | platform::kMbIconExclamation);
+                                    platform_.guard.files.Exists(path) ? kStillUnreadableText : kNoDefinitionsText,
+                                    kDefinitionsErrorTitle, platform::kMbOk | platform::kMbIconExclamation);
     }
 }
 

@@ -73,9 +73,7 @@ void FrmOptions::Box_Click(int index) {
     if (loading_ || index < 0 || index > 2) return;
     bool checked = controls_.Box[index]->Value();
     switch (index) {
-        case 0:
-            StartWithWindows(checked);
-            break;
+        case 0: StartWithWindows(checked); break;
         case 1: {
             RegistryRoutines reg(registry_);
             reg.hkey(kHkeyLocalMachine);
@@ -89,8 +87,7 @@ void FrmOptions::Box_Click(int index) {
             reg.SetRegistryValue(kScriptDebuggerValue, std::string(checked ? "yes" : "no"), platform::kRegSz);
             break;
         }
-        default:
-            break;
+        default: break;
     }
 }
 

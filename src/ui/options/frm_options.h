@@ -46,11 +46,11 @@ struct OptionsPlatform {
 
 // The options window's controls, as the window declares them.
 struct OptionsControls {
-    std::array<platform::Frame*, 2> F{};        // 0 "Options", 1 "Updates"
-    std::array<platform::CheckBox*, 3> Box{};   // start with Windows, start in the tray, script debugger
-    platform::Button* BtnCancel = nullptr;      // "&Close"
-    platform::Button* BtnUpdate = nullptr;      // "&Check for Updates"
-    std::array<platform::Label*, 2> L{};        // definitions and program status lines
+    std::array<platform::Frame*, 2> F{};       // 0 "Options", 1 "Updates"
+    std::array<platform::CheckBox*, 3> Box{};  // start with Windows, start in the tray, script debugger
+    platform::Button* BtnCancel = nullptr;     // "&Close"
+    platform::Button* BtnUpdate = nullptr;     // "&Check for Updates"
+    std::array<platform::Label*, 2> L{};       // definitions and program status lines
 };
 
 class FrmOptions {

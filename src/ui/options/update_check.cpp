@@ -87,9 +87,9 @@ bool UpdateCheck::RemoteVersion(const std::string& path, double& version) {
     platform::TransferError error;
     if (!OpenURL(transfer_, pump_, server_ + path, text, error)) {
         if (cancelled_) return false;
-        frame_.MsgBoxExclamation("Cannot check for updates: the update server " + server_ +
-                                     " could not be reached.\r\r" + error.description,
-                                 kTitle);
+        frame_.MsgBoxExclamation(
+            "Cannot check for updates: the update server " + server_ + " could not be reached.\r\r" + error.description,
+            kTitle);
         return false;
     }
     version = LeadingNumber(text);
@@ -121,16 +121,15 @@ void UpdateCheck::BtnUpdate_Click() {
         if (FD1_.DownloadFile(server_ + "/vt/sw2.def", folder_ + "\\sw2.def") && !cancelled_) {
             std::optional<std::size_t> inUse = ReloadDefinitions ? ReloadDefinitions() : std::nullopt;
             if (inUse && !cancelled_) {
-                frame_.SetLCaption(0, "Definitions Updates: Complete, " + std::to_string(*inUse) +
-                                          " definitions in use");
+                frame_.SetLCaption(0,
+                                   "Definitions Updates: Complete, " + std::to_string(*inUse) + " definitions in use");
             }
             FD3_.DownloadFile(server_ + "/vt/defver", folder_ + "\\defver");
         }
         if (cancelled_) return;
     }
 
-    const double localProgram =
-        LeadingNumber(std::to_string(version_.major) + "." + std::to_string(version_.minor));
+    const double localProgram = LeadingNumber(std::to_string(version_.major) + "." + std::to_string(version_.minor));
     if (!RemoteVersion("/vt/mainver", remote)) {
         if (!cancelled_) frame_.SetBtnUpdateEnabled(true);
         return;

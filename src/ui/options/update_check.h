@@ -50,9 +50,9 @@ public:
     // `transfer` fetches the version texts; `FD1` the definitions, `FD2` the setup program, `FD3` the
     // definitions version file. `programFolder` has no trailing backslash; `server` is the web
     // server's address without a trailing slash.
-    UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& transfer, platform::MessagePump& pump, platform::Files& files,
-                FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3, std::string programFolder,
-                ProgramVersion version, std::string server);
+    UpdateCheck(UpdatesFrame& frame, platform::HttpTransfer& transfer, platform::MessagePump& pump,
+                platform::Files& files, FileDownloader& FD1, FileDownloader& FD2, FileDownloader& FD3,
+                std::string programFolder, ProgramVersion version, std::string server);
     ~UpdateCheck() { transfer_.StopWaitingWhen(nullptr); }
 
     // Sets the downloaders' event handlers: messages and captions for FD1 and FD2, progress for all.
