@@ -333,22 +333,7 @@ void KirelXPButton::DrawFace(Face face) {
             }
             break;
         case 4:
-            if (face == Face::Up) {
-                c.FillBox(1, 1, W - 2, H - 2, p.LightColor);
-                DrawCaption(h);
-                c.FrameBox(0, 0, W, H, p.DarkShadowColor);
-                Corners(p.DarkShadowColor);
-                c.DrawLine(1, 2, 2, 0, p.FaceColor);
-                c.DrawLine(3, 2, W - 3, 2, p.HighlightColor);
-                c.DrawLine(2, 2, 2, H - 3, p.HighlightColor);
-                c.PutPixel(3, 3, p.HighlightColor);
-                c.DrawLine(W - 3, 1, W - 3, H - 3, p.FaceColor);
-                c.DrawLine(1, H - 3, W - 3, H - 3, p.FaceColor);
-                c.PutPixel(W - 4, H - 4, p.FaceColor);
-                c.DrawLine(W - 2, 2, W - 2, H - 2, p.ShadowColor);
-                c.DrawLine(2, H - 2, W - 2, H - 2, p.ShadowColor);
-                c.PutPixel(W - 3, H - 3, p.ShadowColor);
-            } else if (face == Face::Pressed) {
+            if (face == Face::Pressed) {
                 const Rgb f = S(p.ShadowColor, -16);
                 c.FillBox(1, 1, W - 2, H - 2, f);
                 palette_.BaseColor = f;
@@ -368,10 +353,9 @@ void KirelXPButton::DrawFace(Face face) {
                 c.DrawLine(W - 2, H - 3, W - 4, H - 1, S(p.ShadowColor, -32));
                 c.PutPixel(2, H - 2, S(p.ShadowColor, -32));
                 c.PutPixel(W - 2, 2, S(p.ShadowColor, -32));
-            } else {
-                // As up, with the engraved caption.
+            } else {  // disabled: as up, with the engraved caption
                 c.FillBox(1, 1, W - 2, H - 2, p.LightColor);
-                DrawCaption(3);
+                DrawCaption(face == Face::Up ? h : 3);
                 c.FrameBox(0, 0, W, H, p.DarkShadowColor);
                 Corners(p.DarkShadowColor);
                 c.DrawLine(1, 2, 2, 0, p.FaceColor);
