@@ -137,6 +137,14 @@ inline std::string TextsCut(HWND top, UINT dpi) {
     return walk.cut;
 }
 
+// Where `child` lies in `relativeTo`'s client coordinates.
+inline RECT ChildRect(HWND child, HWND relativeTo) {
+    RECT r;
+    ::GetWindowRect(child, &r);
+    ::MapWindowPoints(nullptr, relativeTo, reinterpret_cast<POINT*>(&r), 2);
+    return r;
+}
+
 // The height of the font `control` draws with (negative: character height).
 inline LONG FontHeight(HWND control) {
     LOGFONTA font{};
