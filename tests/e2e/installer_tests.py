@@ -1,24 +1,16 @@
 #!/usr/bin/python3
-"""The setup program VTSetup.exe under Wine, in a fresh prefix, and publishing a release with
-deploy/publish-release.
-
-Usage: installer_tests.py BUILD_DIR [unittest options]
-
-The steps run in order on one prefix: a silent install; the program started from the installed
-folder, then installs over it while it runs (it is asked to close and started again; newer
-definitions and the settings are kept, older definitions replaced); a silent uninstall with the
-program running and start-with-Windows entries in place leaves nothing of ours.
-"""
+"""VTSetup.exe under Wine in a fresh prefix, in order: a silent install, an upgrade over the running program,
+a silent uninstall that leaves nothing of ours; then publishing a release. Usage: installer_tests.py BUILD_DIR"""
 import os
 import re
 import shutil
 import subprocess
 import sys
 import tempfile
-import time
 import unittest
 
 import harness
+from harness import is_main, wait_for
 
 BUILD = None
 SESSION = None
@@ -46,17 +38,6 @@ def setup_exe():
 def version():
     text = read(os.path.join(BUILD, "generated", "version.h")).decode()
     return ".".join(re.search(rf"kVersion{part} = (\d+)", text).group(1) for part in ("Major", "Minor"))
-
-
-def wait_for(condition, timeout=30):
-    deadline = time.time() + timeout
-    while not condition() and time.time() < deadline:
-        time.sleep(0.3)
-    return condition()
-
-
-def is_main(w):
-    return w.cls == "VantorelFrmMain"
 
 
 def read(path):
@@ -110,8 +91,8 @@ class Setup(unittest.TestCase):
 
     def test_2_upgrade_over_the_running_program(self):
         SESSION.start(PROGRAM_FILES + r"\vantorel.exe")
-        self.assertTrue(wait_for(lambda: "Started" in SESSION.program_output(), 60), SESSION.program_output())
-        self.assertIn(f"definitions from {PROGRAM_FILES}\\sw2.def", SESSION.program_output())
+        self.assertTrue(wait_for(lambda: "Started" in SESSION.said(), 60), SESSION.said())
+        self.assertIn(f"definitions from {PROGRAM_FILES}\\sw2.def", SESSION.said())
         SESSION.reg_add(HKCU_KEY, "Attempts", "42")
         SESSION.reg_add(HKLM_KEY, "Tray", "0")
         newer = b"16777343\r\n"
@@ -123,7 +104,7 @@ class Setup(unittest.TestCase):
                 first = SESSION.find(is_main, timeout=30)
                 self.assertIsNotNone(first, "the program runs")
                 if updates_open:
-                    button = next(c for c in SESSION.controls(first) if c.caption == "&Updates")
+                    button = next(c for c in SESSION.windows(first) if c.caption == "&Updates")
                     SESSION.post(button, 0xF5)  # BM_CLICK
                     self.assertIsNotNone(SESSION.find(lambda w: w.caption == "Updates" and w.visible))
                 self.assertEqual(SESSION.run_in_desktop(setup_exe() + " /S"), 0)
@@ -132,7 +113,7 @@ class Setup(unittest.TestCase):
                 self.assertEqual(read(os.path.join(self.folder, "defver")),
                                  defver if kept else read(os.path.join(ROOT, "data", "defver")))
                 self.assertEqual(read(os.path.join(self.folder, "sw2.def")) == newer, kept)
-        self.assertIn("Unloaded", SESSION.program_output(), "the first one ended by its own exit path")
+        self.assertIn("Unloaded", SESSION.said(), "the first one ended by its own exit path")
         self.assertEqual((SESSION.reg_query(HKCU_KEY, "Attempts"), SESSION.reg_query(HKLM_KEY, "Tray")), ("42", "0"))
 
     def test_3_silent_uninstall_leaves_nothing_of_ours(self):

@@ -3,7 +3,7 @@
 // cannot read them). The desktop is the one named by VTPROBE_DESKTOP, "vt" by default.
 //
 //   vtprobe windows                 every top-level window of other processes:
-//                                   hwnd \t class \t caption \t visible \t iconic \t left top right bottom
+//                                   hwnd \t class \t caption \t visible \t enabled \t left top right bottom
 //   vtprobe controls HWND           the child windows of HWND, same columns, screen coordinates
 //   vtprobe post HWND MSG WPARAM LPARAM
 //                                   posts a message (numbers in decimal or 0x hex)
@@ -25,8 +25,8 @@ void Print(HWND hwnd) {
     RECT r{};
     ::GetWindowRect(hwnd, &r);
     std::printf("%lld\t%s\t%s\t%d\t%d\t%ld %ld %ld %ld\n", static_cast<long long>(reinterpret_cast<INT_PTR>(hwnd)),
-                className, caption, ::IsWindowVisible(hwnd) ? 1 : 0, ::IsIconic(hwnd) ? 1 : 0, r.left, r.top, r.right,
-                r.bottom);
+                className, caption, ::IsWindowVisible(hwnd) ? 1 : 0, ::IsWindowEnabled(hwnd) ? 1 : 0, r.left, r.top,
+                r.right, r.bottom);
 }
 
 BOOL CALLBACK EachTopLevel(HWND hwnd, LPARAM) {
