@@ -18,6 +18,7 @@ HKCU_KEY = r"HKEY_CURRENT_USER\SOFTWARE\Vantorel"
 HKLM_KEY = r"HKEY_LOCAL_MACHINE\SOFTWARE\Vantorel"
 DESKTOP_KEY = r"HKEY_CURRENT_USER\Control Panel\Desktop"
 WM_CLOSE, WM_SYSCOMMAND, SC_MINIMIZE, BM_CLICK = 0x10, 0x112, 0xF020, 0xF5
+WM_MOUSEMOVE, WM_LBUTTONUP, WM_RBUTTONUP = 0x200, 0x202, 0x205  # the tray icon reports through WM_MOUSEMOVE
 
 
 def scripted():
@@ -177,7 +178,7 @@ class Journeys(unittest.TestCase):
         self.assertEqual(len([w for w in SESSION.windows() if is_main(w)]), 1, "no second window")
         self.assertEqual(SESSION.reg_query(HKCU_KEY, "State"), "1")
 
-    def test_hidden_in_the_tray_by_setting_by_minimising_and_by_alt_t(self):
+    def test_hidden_in_the_tray_by_setting_by_minimising_and_by_alt_t_and_back_by_the_icon(self):
         SESSION.reg_add(HKLM_KEY, "Tray", "1")
         self.start()
         hidden = self.main_window(visible=False)
@@ -196,8 +197,13 @@ class Journeys(unittest.TestCase):
                 SESSION.click(window.rect[0] + 100, window.rect[1] + 10)  # activate it by its title bar
                 time.sleep(0.5)
                 SESSION.xdotool("key", "alt+t")  # presses "&Tray"
-            self.assertIsNotNone(self.main_window(visible=False), hide)
+            hidden = self.main_window(visible=False)
+            self.assertIsNotNone(hidden, hide)
+            SESSION.post(hidden, WM_MOUSEMOVE, 0, WM_MOUSEMOVE)  # a plain move over the icon does nothing
             self.assertIsNone(self.main_window(timeout=2), hide)
+            SESSION.post(hidden, WM_MOUSEMOVE, 0, WM_RBUTTONUP if hide == "minimise" else WM_LBUTTONUP)
+            back = self.main_window()
+            self.assertEqual((back.size(), back.topmost), (window.size(), False), "a click on the icon brings it back")
             SESSION.close_program()
 
     def test_closing_during_a_stalled_update_takes_effect_within_a_second(self):

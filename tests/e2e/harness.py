@@ -12,8 +12,8 @@ QUIET = dict(stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subproc
 
 class Window:
     def __init__(self, line):
-        hwnd, self.cls, self.caption, visible, enabled, rect = line.split("\t")
-        self.hwnd, self.visible, self.enabled = int(hwnd), visible == "1", enabled == "1"
+        hwnd, self.cls, self.caption, visible, enabled, topmost, rect = line.split("\t")
+        self.hwnd, self.visible, self.enabled, self.topmost = int(hwnd), visible == "1", enabled == "1", topmost == "1"
         self.rect = tuple(int(v) for v in rect.split())
 
     def centre(self):
@@ -81,7 +81,7 @@ class Session:
 
     def windows(self, parent=None):
         out = self.probe("windows") if parent is None else self.probe("controls", parent.hwnd)
-        return [Window(line) for line in out.splitlines() if line.count("\t") == 5]
+        return [Window(line) for line in out.splitlines() if line.count("\t") == 6]
 
     def find(self, predicate, timeout=30):
         """The first top-level window for which predicate(window) holds, waiting up to `timeout`."""

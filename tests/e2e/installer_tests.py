@@ -153,7 +153,8 @@ class Publish(unittest.TestCase):
             self.assertEqual(publish(), 0)
             names = ["VTSetup.exe", "defver", "mainver", "sw2.def"]
             self.assertEqual(sorted(os.listdir(vt)), names)
-            self.assertEqual([read(os.path.join(vt, n)) for n in names], [read(os.path.join(release, n)) for n in names])
+            for n in names:
+                self.assertEqual(read(os.path.join(vt, n)), read(os.path.join(release, n)), n)
             self.assertEqual(read(os.path.join(vt, "mainver")).strip().decode(), version())
             write(os.path.join(vt, "defver"), b"25")  # definitions updated on the server since
             write(os.path.join(vt, "sw2.def"), b"newer")

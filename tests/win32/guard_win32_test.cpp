@@ -1,6 +1,6 @@
-// The guard's window side under Wine on a virtual display: the tray routines against Wine's shell,
-// BringToFront and the icon's mouse notifications on a real window, and the sweep's yield. Start-up
-// and clicks on the switch of the real program are proved end to end (tests/e2e/).
+// The guard's window side under Wine on a virtual display: the tray routines against Wine's shell and
+// the sweep's yield. Start-up, the switch, hiding in the tray and the icon's clicks bringing the window
+// back are proved on the real program end to end (tests/e2e/).
 #include <windows.h>
 
 #include <gtest/gtest.h>
@@ -34,8 +34,6 @@ public:
     std::vector<Call> calls;
 };
 
-bool Topmost(HWND hwnd) { return (::GetWindowLongPtrA(hwnd, GWL_EXSTYLE) & WS_EX_TOPMOST) != 0; }
-
 TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     win32::MainWindow window;
     NotingNotifyArea tray;
@@ -59,35 +57,6 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     EXPECT_EQ(tray.calls[4].message, platform::kNimAdd);
     EXPECT_TRUE(tray.calls[4].ok);
     RemoveTrayIcon(tray, window);
-}
-
-TEST(TrayWin32, IconClicksBringTheHiddenWindowBackRaisedNotTopmost) {
-    win32::MainWindow window;
-    win32::Win32WindowManager windows;
-    win32::Win32MessagePump pump;
-    win32::MainWindowHandlers handlers;
-    handlers.mouseMove = [&](std::uint32_t code) { TrayMouseNotification(window, windows, pump, code); };
-    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers));
-    HWND hwnd = window.hwnd();
-
-    // As the icon reports a left click: the mouse-move message with the code in the low word.
-    ASSERT_FALSE(window.Visible());
-    ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(WM_LBUTTONUP, 0));
-    EXPECT_TRUE(window.Visible());
-    EXPECT_EQ(window.State(), platform::WindowState::Normal);
-    EXPECT_FALSE(Topmost(hwnd)) << "raised without staying on top";
-
-    // Minimised and hidden (as the tray button leaves it): a right click brings it back normal.
-    ::ShowWindow(hwnd, SW_MINIMIZE);
-    ::ShowWindow(hwnd, SW_HIDE);
-    ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(WM_RBUTTONUP, 0));
-    EXPECT_TRUE(window.Visible());
-    EXPECT_EQ(window.State(), platform::WindowState::Normal);
-
-    // A plain move over the icon does nothing.
-    ::ShowWindow(hwnd, SW_HIDE);
-    ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(512, 0));
-    EXPECT_FALSE(window.Visible());
 }
 
 TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {

@@ -116,11 +116,12 @@ TEST(MainWindowWin32, LightsAltOAndTheSessionsEndOnTheRealWindow) {
     EXPECT_NE(::GetMenuState(menu, SC_CLOSE, MF_BYCOMMAND), static_cast<UINT>(-1));
 
     // The status light is the window's real icon, big and small.
+    auto icon = [&](WPARAM size) { return reinterpret_cast<HICON>(::SendMessageA(hwnd, WM_GETICON, size, 0)); };
     form.TimerTick();
-    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), reinterpret_cast<LRESULT>(window.ShownLight(kLightBright)));
-    EXPECT_NE(::SendMessageA(hwnd, WM_GETICON, ICON_SMALL, 0), 0);
+    EXPECT_EQ(icon(ICON_BIG), window.ShownLight(kLightBright));
+    EXPECT_NE(icon(ICON_SMALL), nullptr);
     form.TimerTick();
-    EXPECT_EQ(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0), reinterpret_cast<LRESULT>(window.ShownLight(kLightDark)));
+    EXPECT_EQ(icon(ICON_BIG), window.ShownLight(kLightDark));
 
     // Alt+O that the yield of a sweep lets through is handled as the main loop handles it.
     ::PostMessageA(window.BtnO(kBtnTray).hwnd(), WM_SYSCHAR, 'o', 1 << 29);

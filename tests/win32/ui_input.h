@@ -79,7 +79,8 @@ namespace vantorel::win32 {
 inline RECT SendDpiChange(HWND top, UINT dpi, SIZE clientTwips) {
     RECT now;
     ::GetWindowRect(top, &now);
-    RECT r{0, 0, ::MulDiv(clientTwips.cx, static_cast<int>(dpi), 1440), ::MulDiv(clientTwips.cy, static_cast<int>(dpi), 1440)};
+    const int d = static_cast<int>(dpi);
+    RECT r{0, 0, ::MulDiv(clientTwips.cx, d, 1440), ::MulDiv(clientTwips.cy, d, 1440)};
     ::AdjustWindowRectEx(&r, static_cast<DWORD>(::GetWindowLongPtrA(top, GWL_STYLE)), FALSE,
                          static_cast<DWORD>(::GetWindowLongPtrA(top, GWL_EXSTYLE)));
     ::OffsetRect(&r, now.left - r.left, now.top - r.top);
