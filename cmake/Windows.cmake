@@ -72,7 +72,6 @@ function(vantorel_wine_test name)
 endfunction()
 
 vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
-vantorel_wine_test(controls_win32_tests tests/win32/controls_win32_test.cpp)
 vantorel_wine_test(options_window_tests tests/win32/options_window_test.cpp)
 
 vantorel_wine_test(registry_win32_tests
@@ -98,10 +97,6 @@ add_test(NAME xpbutton_gallery COMMAND sh -c
     ". '${CMAKE_BINARY_DIR}/xvfb.env' && export ${WINE_ENV} && '${CMAKE_SOURCE_DIR}/scripts/xpbutton-gallery-shot' '$<TARGET_FILE:xpbutton-gallery>' '${VANTOREL_ARTIFACTS}'")
 set_tests_properties(xpbutton_gallery PROPERTIES FIXTURES_REQUIRED wine TIMEOUT 300)
 
-# End-to-end: the real vantorel.exe driven under Wine on a virtual display of its own.
-add_test(NAME e2e COMMAND /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/e2e/e2e_tests.py ${CMAKE_BINARY_DIR})
-set_tests_properties(e2e PROPERTIES TIMEOUT 900)
-
 # The downloader with the real WinINet transfer against the scriptable HTTP server on 127.0.0.1, which
 # a fixture starts in the background (its port chosen by the system) and stops by its PID.
 set(VANTOREL_HTTP_DIR ${CMAKE_BINARY_DIR}/http-server)
@@ -110,6 +105,11 @@ add_test(NAME http_server_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server
 set_tests_properties(http_server_start PROPERTIES FIXTURES_SETUP http_server)
 add_test(NAME http_server_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh stop ${VANTOREL_HTTP_DIR})
 set_tests_properties(http_server_stop PROPERTIES FIXTURES_CLEANUP http_server)
+
+# End-to-end: the real vantorel.exe driven under Wine on a virtual display of its own.
+add_test(NAME e2e COMMAND /usr/bin/python3 ${CMAKE_SOURCE_DIR}/tests/e2e/e2e_tests.py ${CMAKE_BINARY_DIR})
+set_tests_properties(e2e PROPERTIES TIMEOUT 1200 FIXTURES_REQUIRED http_server
+    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1")
 
 # Two https servers: one with a certificate from a test authority, one self-signed.
 set(VANTOREL_HTTPS_DIR ${CMAKE_BINARY_DIR}/https-servers)
@@ -161,13 +161,6 @@ add_executable(pump_bench bench/win32/pump_bench.cpp)
 target_link_libraries(pump_bench PRIVATE vantorel_win32)
 
 vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
-
-# Black-box tests of vantorel.exe itself.
-vantorel_wine_test(program_e2e_tests tests/e2e/program_test.cpp)
-add_dependencies(program_e2e_tests vantorel)
-target_link_libraries(program_e2e_tests PRIVATE ws2_32)
-set_tests_properties(program_e2e_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server"
-    ENVIRONMENT "VANTOREL_HTTP_PORT_FILE=${VANTOREL_HTTP_DIR}/server.port;http_proxy=;https_proxy=;no_proxy=127.0.0.1")
 
 # The main window with the program's own resources (icons, manifest, version) linked in.
 vantorel_wine_test(main_window_win32_tests tests/win32/main_window_win32_test.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)

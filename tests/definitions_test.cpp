@@ -19,7 +19,8 @@ std::vector<std::string> Split(const std::string& text, const std::string& delim
 
 std::vector<std::string> Elements(const DefinitionList& list) {
     std::vector<std::string> out;
-    for (std::size_t i = 0; i < list.size(); ++i) out.push_back(list.at(i));
+    for (std::size_t i = 0; i < list.size(); ++i)
+        out.push_back(list.at(i));
     return out;
 }
 
@@ -29,22 +30,34 @@ TEST(FastSplit, SplitsAtTheChosenSeparatorAndNormalisesTheLastPiece) {
     const std::tuple<std::string, std::string, Pieces> cases[] = {
         {"-5\n10\n7", "\n", {"-5", "10", "7"}},
         {"1\r2\r\n3\n4\r\n5", "\r\n", {"1\r2", "3\n4", "5"}},  // a lone CR or LF stays inside its line
-        {"12\r34\r", "\r\n", {"12\r34\r"}},  // without a separator: one element, not normalised
+        {"12\r34\r", "\r\n", {"12\r34\r"}},                    // without a separator: one element, not normalised
         {"", "\n", {""}},
         {"abc", "", {"abc"}},
-        {"1\n\n2", "\n", {"1", "", "2"}},  // inner empty lines stay
-        {"1\r\n2\r\n", "\r\n", {"1", "2"}},  // a final line break adds no key "0"
+        {"1\n\n2", "\n", {"1", "", "2"}},     // inner empty lines stay
+        {"1\r\n2\r\n", "\r\n", {"1", "2"}},   // a final line break adds no key "0"
         {"A\r\nB\r\nZ", "\r\n", {"A", "B"}},  // nor does a last piece without a number
         {"1\n-", "\n", {"1"}},
         {"1\n\x1a", "\n", {"1"}},
         {"aaa", "aa", {"", ""}},  // overlapping finds never cut a negative length
         {"xaaa7", "aa", {"x", "", "7"}},
     };
-    for (const auto& [text, delimiter, pieces] : cases) EXPECT_EQ(Split(text, delimiter), pieces) << text;
-    const std::pair<const char*, const char*> last[] = {
-        {"-77", "-77"}, {"0042", "42"}, {"00", "0"}, {"-0", "0"}, {"+5", "5"}, {"123\x1a", "123"}, {"1.5", "1.5"},
-        {"1e3", "1000"}, {"2e", "2"}, {".5", "0.5"}, {"&HFF", "255"}, {"&o17", "15"}, {"1 2\t3", "123"},
-        {"99999999999999999999999", "99999999999999999999999"}, {"1e999999999999", "0"}};
+    for (const auto& [text, delimiter, pieces] : cases)
+        EXPECT_EQ(Split(text, delimiter), pieces) << text;
+    const std::pair<const char*, const char*> last[] = {{"-77", "-77"},
+                                                        {"0042", "42"},
+                                                        {"00", "0"},
+                                                        {"-0", "0"},
+                                                        {"+5", "5"},
+                                                        {"123\x1a", "123"},
+                                                        {"1.5", "1.5"},
+                                                        {"1e3", "1000"},
+                                                        {"2e", "2"},
+                                                        {".5", "0.5"},
+                                                        {"&HFF", "255"},
+                                                        {"&o17", "15"},
+                                                        {"1 2\t3", "123"},
+                                                        {"99999999999999999999999", "99999999999999999999999"},
+                                                        {"1e999999999999", "0"}};
     for (auto [piece, normalised] : last)
         EXPECT_EQ(Split(std::string("1\n") + piece, "\n").back(), normalised) << piece;
 }
@@ -58,8 +71,8 @@ TEST(CanonicalKeys, ParseAndFormatRoundTrip) {
         ASSERT_TRUE(ParseCanonicalKey(text, key));
         EXPECT_EQ(key, value);
     }
-    for (const char* odd : {"", "-", "-0", "007", "+5", " 5", "5 ", "2147483648", "-2147483649", "12345678901",
-                            "1.0", "5\r", "abc"})
+    for (const char* odd :
+         {"", "-", "-0", "007", "+5", " 5", "5 ", "2147483648", "-2147483649", "12345678901", "1.0", "5\r", "abc"})
         EXPECT_FALSE(ParseCanonicalKey(odd, key)) << odd;
 }
 
@@ -67,12 +80,13 @@ TEST(DefinitionList, EveryLineCountsUnsortedFilesStillMatchAndATrailingLineBreak
     const std::tuple<std::string, std::vector<std::int32_t>, std::vector<std::int32_t>> cases[] = {
         {"-9\n12\n5", {-9, 5, 12, 7, 0}, {0, 2, 1, kNoDefinition, kNoDefinition}},
         {"9\n10\n-1\n9\n3", {9, 10, -1, 3, 4}, {0, 1, 2, 4, kNoDefinition}},  // out of order
-        {"-100\r\n-200\r\n-300\r\n", {-300, 0}, {2, kNoDefinition}},  // no stray "0" sorting last
+        {"-100\r\n-200\r\n-300\r\n", {-300, 0}, {2, kNoDefinition}},          // no stray "0" sorting last
     };
     for (const auto& [text, keys, found] : cases) {
         DefinitionList list = DefinitionList::FromText(text);
         std::vector<std::int32_t> got;
-        for (std::int32_t key : keys) got.push_back(FindDefinition(list, key));
+        for (std::int32_t key : keys)
+            got.push_back(FindDefinition(list, key));
         EXPECT_EQ(got, found) << text;
     }
     EXPECT_EQ(FindDefinition(DefinitionList::FromText("-9\n12\n5"), "-9"), 0);

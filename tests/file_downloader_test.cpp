@@ -91,14 +91,23 @@ TEST(FileDownloader, FreeSpaceIsCheckedOnDriveLetterPathsOnly) {
 
 TEST(FileDownloader, FileErrorsAreReportedAndLeaveOnlyTheInstalledFile) {
     const std::pair<std::function<void(Rig&)>, std::string> cases[] = {
-        {[](Rig& r) { r.disk.createFails = platform::FileError{5, "Access is denied."}; }, "5: Access is denied."},
+        {[](Rig& r) {
+             r.disk.createFails = platform::FileError{5, "Access is denied."};
+         },
+         "5: Access is denied."},
         {[](Rig& r) {
              r.disk.writeFails = platform::FileError{112, "There is not enough space on the disk."};
              r.disk.writeFailsAt = 2048;
          },
          "112: There is not enough space on the disk."},
-        {[](Rig& r) { r.disk.closeFails = platform::FileError{112, "Flush failed."}; }, "112: Flush failed."},
-        {[](Rig& r) { r.disk.replaceFails = platform::FileError{32, "In use."}; }, "32: In use."},
+        {[](Rig& r) {
+             r.disk.closeFails = platform::FileError{112, "Flush failed."};
+         },
+         "112: Flush failed."},
+        {[](Rig& r) {
+             r.disk.replaceFails = platform::FileError{32, "In use."};
+         },
+         "32: In use."},
         {[](Rig& r) {
              r.inet.chunkFails = platform::TransferError{12030, "The connection was aborted."};
              r.inet.chunkFailsAt = 2048;

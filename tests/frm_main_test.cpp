@@ -73,11 +73,17 @@ struct MainRig {
     FakeButton btnO[5];
     FakeFrame uf[2];
     FakeLabel l[2];
-    FrmMain form{FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, desktop,
-                                 desktop},
-                 FrmMainControls{frm, btnOnOff, tmr, timer, {&btnO[0], &btnO[1], &btnO[2], &btnO[3], &btnO[4]},
-                                 {&uf[0], &uf[1]}, {&l[0], &l[1]}, {kDark, kBright, kPadlock}},
-                 kFolder};
+    FrmMain form{
+        FrmMainPlatform{GuardPlatform{registry, files, table, windows, pump, instance}, tray, desktop, desktop},
+        FrmMainControls{frm,
+                        btnOnOff,
+                        tmr,
+                        timer,
+                        {&btnO[0], &btnO[1], &btnO[2], &btnO[3], &btnO[4]},
+                        {&uf[0], &uf[1]},
+                        {&l[0], &l[1]},
+                        {kDark, kBright, kPadlock}},
+        kFolder};
 
     MainRig() {
         files.files[kDefinitionsPath] = "-939524086\r\n67305985";
@@ -106,7 +112,8 @@ struct MainRig {
     }
     Icons Ticks(int n) {
         frm.icons.clear();
-        for (int i = 0; i < n; ++i) form.TimerTick();
+        for (int i = 0; i < n; ++i)
+            form.TimerTick();
         return frm.icons;
     }
 };
@@ -136,9 +143,9 @@ TEST(FrmMain, FirstStartCentresAndAddsTheIconHelpExitAndMinimising) {
     rig.form.QueryUnload();  // the window's destruction, which the end brings, unloads nothing again
     rig.form.Unload();
     const std::string owner = " " + std::to_string(rig.frm.handle);
-    EXPECT_EQ(rig.events, (std::vector<std::string>{"open http://www.vantorel.com/vt/help.php 1" + owner,
-                                                    "open http://127.0.0.1:8080/vt/help.php 1" + owner, "Tray 2",
-                                                    "End", "off"}));
+    EXPECT_EQ(rig.events,
+              (std::vector<std::string>{"open http://www.vantorel.com/vt/help.php 1" + owner,
+                                        "open http://127.0.0.1:8080/vt/help.php 1" + owner, "Tray 2", "End", "off"}));
     EXPECT_EQ(record(2), std::make_tuple(rig.frm.handle, 1u, 7u, 1u, platform::IconHandle{1}, std::string()));
 }
 
@@ -228,7 +235,8 @@ TEST(StartUp, MissingDefinitionsAreReportedAndTheUpdatesWindowOpensBeforeTheTray
     unreadable.Start();
     EXPECT_EQ(unreadable.desktop.texts,
               (std::vector<std::string>{std::string("Reading definitions, installation corrupted re-install at "
-                                                    "http://www.vantorel.com/\n\n") + kUnreadableDefinitionsText,
+                                                    "http://www.vantorel.com/\n\n") +
+                                            kUnreadableDefinitionsText,
                                         kStillUnreadableText}));
     EXPECT_EQ(Definitions.size(), 0u);
 }
@@ -242,7 +250,8 @@ TEST(StatusDisplay, TheLightBlinksFromBrightHoldsThePadlockWhileOnAndTheTipFollo
     rig.ClickSwitch();  // off again: the stored bright phase is followed by dark
     EXPECT_EQ(rig.Ticks(2), (Icons{kDark, kBright}));
     EXPECT_EQ(std::make_pair(rig.tray.calls.back().message, rig.tray.calls.back().data.icon),
-              std::make_pair(platform::kNimModify, kBright)) << "the tray icon follows the light";
+              std::make_pair(platform::kNimModify, kBright))
+        << "the tray icon follows the light";
 
     // A teardown writes the count without the blank; the next tick puts it back.
     rig.ClickSwitch();

@@ -33,10 +33,11 @@ struct SilentFrame final : UpdatesFrame {
 
 struct OptionsRig {
     explicit OptionsRig(FakeRegistry& registry)
-        : form(OptionsPlatform{registry, scheduler, pump, disk, disk, inet, fd1, fd2, fd3},
-               OptionsControls{{&f[0], &f[1]}, {&box[0], &box[1], &box[2]}, &close, &update, {&l[0], &l[1]}}, frame,
-               UpdateTarget{"C:\\Vantorel", {1, 0}}, "C:\\vantorel.exe", [] {},
-               [this](const std::string& m) { messages.push_back(m); }) {}
+        : form(
+              OptionsPlatform{registry, scheduler, pump, disk, disk, inet, fd1, fd2, fd3},
+              OptionsControls{{&f[0], &f[1]}, {&box[0], &box[1], &box[2]}, &close, &update, {&l[0], &l[1]}}, frame,
+              UpdateTarget{"C:\\Vantorel", {1, 0}}, "C:\\vantorel.exe", [] {},
+              [this](const std::string& m) { messages.push_back(m); }) {}
     FakeFrame f[2];
     FakeCheckBox box[3];
     FakeButton close, update;
@@ -76,7 +77,8 @@ TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
         OptionsRig rig(registry);
         rig.form.Form_Load();
         std::string got;
-        for (const FakeCheckBox& box : rig.box) got += box.Value() ? '1' : '0';
+        for (const FakeCheckBox& box : rig.box)
+            got += box.Value() ? '1' : '0';
         EXPECT_EQ(got, boxes) << tray << " " << debugger;
     }
 }

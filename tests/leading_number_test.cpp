@@ -9,11 +9,24 @@ namespace vantorel {
 namespace {
 
 TEST(LeadingNumber, ReadsTheNumberAtTheStartAndStopsWhereItCannotGoOn) {
-    const std::pair<const char*, double> cases[] = {
-        {"21", 21}, {"21\r\nsecond line 99", 21}, {"  \t 1.10", 1.1}, {"1.9beta", 1.9}, {"-5", -5}, {"+7x", 7},
-        {".5", 0.5}, {"5.", 5}, {"1e3", 1000}, {"1e", 1} /* an exponent without digits is not taken */, {"2E-1", 0.2},
-        {"0x10", 0} /* no hexadecimal form */, {"<html>404</html>", 0}, {"", 0}, {"-", 0}, {".", 0}};
-    for (auto [text, number] : cases) EXPECT_EQ(LeadingNumber(text), number) << text;
+    const std::pair<const char*, double> cases[] = {{"21", 21},
+                                                    {"21\r\nsecond line 99", 21},
+                                                    {"  \t 1.10", 1.1},
+                                                    {"1.9beta", 1.9},
+                                                    {"-5", -5},
+                                                    {"+7x", 7},
+                                                    {".5", 0.5},
+                                                    {"5.", 5},
+                                                    {"1e3", 1000},
+                                                    {"1e", 1} /* an exponent without digits is not taken */,
+                                                    {"2E-1", 0.2},
+                                                    {"0x10", 0} /* no hexadecimal form */,
+                                                    {"<html>404</html>", 0},
+                                                    {"", 0},
+                                                    {"-", 0},
+                                                    {".", 0}};
+    for (auto [text, number] : cases)
+        EXPECT_EQ(LeadingNumber(text), number) << text;
     EXPECT_TRUE(std::isinf(LeadingNumber("1e999")));
 }
 

@@ -9,8 +9,8 @@
 namespace vantorel {
 namespace {
 
-using testing::FakeRegistry;
 using platform::kHkeyCurrentUser;
+using testing::FakeRegistry;
 
 RegistryRoutines Vantorel(FakeRegistry& registry) {
     RegistryRoutines reg(registry);

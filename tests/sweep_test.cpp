@@ -47,19 +47,19 @@ TEST(SweepConnections, WhichRowsAreListedAndWhatOneTeardownLeaves) {
     ASSERT_EQ(Key(Ipv4(10, 0, 0, 200)), "-939524086");
     platform::TcpRow listed = Row(platform::kTcpStateSynSent, Ipv4(8, 8, 4, 4), 0xBB01);
     rig.table.rows = {
-        Row(kTcpStateDeleteTcb, Ipv4(1, 2, 3, 4)),        // already being torn down: skipped
-        Row(kTcpStateEstablished, Ipv4(10, 0, 0, 200)),   // negative key, first line
-        Row(platform::kTcpStateListen, 0, 0),             // listening: key 0, not listed
-        Row(kTcpStateEstablished, Ipv4(4, 3, 2, 1)),      // not listed
+        Row(kTcpStateDeleteTcb, Ipv4(1, 2, 3, 4)),       // already being torn down: skipped
+        Row(kTcpStateEstablished, Ipv4(10, 0, 0, 200)),  // negative key, first line
+        Row(platform::kTcpStateListen, 0, 0),            // listening: key 0, not listed
+        Row(kTcpStateEstablished, Ipv4(4, 3, 2, 1)),     // not listed
         listed,
     };
     rig.sweep.SweepConnections();
     ASSERT_EQ(rig.table.entries.size(), 2u);
     EXPECT_EQ(rig.table.entries[0].remoteAddr, Ipv4(10, 0, 0, 200));
     const platform::TcpRow& sent = rig.table.entries[1];
-    EXPECT_EQ(std::make_tuple(sent.state, sent.localAddr, sent.localPort, sent.remoteAddr, sent.remotePort),
-              std::make_tuple(kTcpStateDeleteTcb, listed.localAddr, listed.localPort, listed.remoteAddr,
-                              listed.remotePort));
+    EXPECT_EQ(
+        std::make_tuple(sent.state, sent.localAddr, sent.localPort, sent.remoteAddr, sent.remotePort),
+        std::make_tuple(kTcpStateDeleteTcb, listed.localAddr, listed.localPort, listed.remoteAddr, listed.remotePort));
     EXPECT_EQ(rig.count, 2);
     EXPECT_EQ(rig.view.shown, (std::vector<std::int32_t>{1, 2})) << "each teardown is shown at once";
     EXPECT_EQ(StoredAttempts(rig.registry), "2") << "the key is created when missing";
@@ -95,7 +95,8 @@ TEST(SweepConnections, TheGrownBufferIsKeptAndFailedOrOverstatedFetchesReadNothi
     EXPECT_EQ(rig.sweep.BufferBytes(), 20'024u);
     rig.sweep.SweepConnections();
     const std::size_t grown = rig.sweep.BufferBytes();
-    for (int i = 0; i < 100; ++i) rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 2, 1) + i));
+    for (int i = 0; i < 100; ++i)
+        rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 2, 1) + i));
     rig.sweep.SweepConnections();
     EXPECT_EQ(std::make_pair(rig.sweep.BufferBytes(), rig.sweep.LastSweep().rows), std::make_pair(grown, 5100u));
 

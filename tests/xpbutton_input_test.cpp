@@ -45,9 +45,9 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     fresh.InitNewControl();
     EXPECT_EQ(fresh.Caption() + " " + fresh.FontName() + " " + n.host.windowFont.name + " " + fresh.Version(),
               "KirelXPButton1 Verdana Verdana 2.0.6");
-    EXPECT_EQ((std::vector<Rgb>{fresh.BackColor(), fresh.BackOver(), fresh.ForeColor(), fresh.ForeOver(),
-                                fresh.MaskColor()}),
-              (std::vector<Rgb>{0xFFFFFF, 0xFFFFFF, 0x123456, 0xFF0000, 0xC0C0C0}));
+    EXPECT_EQ(
+        (std::vector<Rgb>{fresh.BackColor(), fresh.BackOver(), fresh.ForeColor(), fresh.ForeOver(), fresh.MaskColor()}),
+        (std::vector<Rgb>{0xFFFFFF, 0xFFFFFF, 0x123456, 0xFF0000, 0xC0C0C0}));
     EXPECT_EQ(std::make_tuple(fresh.ButtonType(), fresh.ColorScheme(), fresh.Enabled(), fresh.ShowFocusRect(),
                               fresh.UseMaskColor(), fresh.SoftBevel()),
               std::make_tuple(3, 1, true, true, true, false));
@@ -62,21 +62,28 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
     PicturePtr over = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1));
     PicturePtr cursor = std::make_shared<MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>(1));
     const FontDesc font{"Tahoma", 11.5, true, true, false, true};
-    const std::pair<const char*, PropertyValue> stored[] = {
-        {"BTYPE", 9},           {"TX", std::string("&Go now")}, {"ENAB", false},   {"FONT", font},
-        {"COLTYPE", 2},         {"FOCUSR", false},              {"BCOL", 0x00FF00}, {"BCOLO", 0x0000FF},
-        {"FCOL", 0x111111},     {"FCOLO", 0x222222},            {"MCOL", 0xFF00FF}, {"MPTR", std::int16_t{11}},
-        {"MICON", cursor},      {"PICN", picture},              {"PICH", over},     {"UMCOL", false},
-        {"SOFT", true},         {"PICPOS", 3},                  {"NGREY", true},    {"FX", 2},
-        {"HAND", false},        {"CHECK", true},                {"VALUE", true},    {"ImageIndex", std::int16_t{7}}};
+    const std::pair<const char*, PropertyValue> stored[] = {{"BTYPE", 9},       {"TX", std::string("&Go now")},
+                                                            {"ENAB", false},    {"FONT", font},
+                                                            {"COLTYPE", 2},     {"FOCUSR", false},
+                                                            {"BCOL", 0x00FF00}, {"BCOLO", 0x0000FF},
+                                                            {"FCOL", 0x111111}, {"FCOLO", 0x222222},
+                                                            {"MCOL", 0xFF00FF}, {"MPTR", std::int16_t{11}},
+                                                            {"MICON", cursor},  {"PICN", picture},
+                                                            {"PICH", over},     {"UMCOL", false},
+                                                            {"SOFT", true},     {"PICPOS", 3},
+                                                            {"NGREY", true},    {"FX", 2},
+                                                            {"HAND", false},    {"CHECK", true},
+                                                            {"VALUE", true},    {"ImageIndex", std::int16_t{7}}};
     PropertyBag bag;
-    for (const auto& [key, value] : stored) bag.Write(key, value);
+    for (const auto& [key, value] : stored)
+        bag.Write(key, value);
     Fixture r(false);
     r.button.ReadProperties(bag);
     PropertyBag again;  // what was read writes back the same
     r.button.WriteProperties(again);
     EXPECT_EQ(again.Keys(), bag.Keys());
-    for (const std::string& key : bag.Keys()) EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
+    for (const std::string& key : bag.Keys())
+        EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
     EXPECT_EQ(std::make_tuple(r.button.accessKey(), r.host.windowEnabled, r.host.windowFont, r.host.pointer,
                               r.host.mouseIcon, r.button.pictureRect().width),
               std::make_tuple('g', false, font, 11, cursor, 2))
@@ -89,7 +96,8 @@ TEST(XPButtonProperties, ReadDefaultsFromAStore) {
     KirelXPButton& b = f.button;
     b.ReadProperties(PropertyBag{});
     EXPECT_EQ(std::make_tuple(b.ButtonType(), b.Caption(), b.Enabled(), b.ColorScheme(), b.MaskColor(), b.ImageIndex()),
-              std::make_tuple(2, std::string(), true, 1, 0xC0C0C0u, 0)) << "a fresh control gets type 3, a read one 2";
+              std::make_tuple(2, std::string(), true, 1, 0xC0C0C0u, 0))
+        << "a fresh control gets type 3, a read one 2";
     EXPECT_EQ(b.PictureNormal(), nullptr);
     EXPECT_EQ((std::vector<Rgb>{b.BackColor(), b.BackOver(), b.ForeColor(), b.ForeOver()}),
               (std::vector<Rgb>{0x80000000u | platform::kColorBtnFace, 0x80000000u | platform::kColorBtnFace,
@@ -111,7 +119,7 @@ TEST(XPButtonProperties, SettersNotifyAndRepaintAsStated) {
     EXPECT_EQ(b.BackOver(), 0x0000FFu);
     auto pic = std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 1, 1, std::vector<Rgb>{0});
     f.Mark();
-    b.SetValue(true);  // without CheckBoxBehaviour: stored and notified, not painted
+    b.SetValue(true);       // without CheckBoxBehaviour: stored and notified, not painted
     b.SetPictureOver(pic);  // away from the pointer: no paint
     EXPECT_FALSE(f.Painted());
     EXPECT_EQ(f.host.notified, (Log{"BCOL", "BCOL", "VALUE", "PICO"}));
@@ -213,9 +221,10 @@ TEST(XPButtonInput, FocusHidingBatchingAmbientChangesAndTheEnd) {
 
 TEST(XPButtonInput, AccessKeyParsing) {
     // Only the first doubled "&&" is skipped (proved with Alt keys under Wine); the edges here.
-    const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"Go&", 0},
-                                                  {"&", 0},       {"x", 0},           {"E&xit", 'x'}};
-    for (auto [caption, key] : cases) EXPECT_EQ(AccessKeyOf(caption), key) << caption;
+    const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"Go&", 0}, {"&", 0},
+                                                  {"x", 0},       {"E&xit", 'x'}};
+    for (auto [caption, key] : cases)
+        EXPECT_EQ(AccessKeyOf(caption), key) << caption;
 }
 
 }  // namespace

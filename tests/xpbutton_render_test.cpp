@@ -60,20 +60,22 @@ struct Look {
 
 TEST(XPButtonColour, ShiftBlendAndRounding) {
     const std::tuple<Rgb, int, bool, bool, Rgb> shifts[] = {
-        {0xC0C0C0, 48, true, false, 0xF0F0F0},   // blue scaling: 192 + 48 in every channel
-        {0xFFC0C0, 48, true, false, 0xFFF0F0},   // a full blue clamps at 255
-        {0x804020, -64, false, false, 0x400000},  // clamps at 0
+        {0xC0C0C0, 48, true, false, 0xF0F0F0},                // blue scaling: 192 + 48 in every channel
+        {0xFFC0C0, 48, true, false, 0xFFF0F0},                // a full blue clamps at 255
+        {0x804020, -64, false, false, 0x400000},              // clamps at 0
         {0xF0F0F0, -2, true, false, MakeRgb(238, 238, 238)},  // blue: 240 × −2 / 192 = −2.5 → −2
-        {0x808080, -3, false, true, 0x7F7F7F},    // SoftBevel halves toward zero: −3 → −1
-        {0x808080, 47, false, true, 0x979797},    // 47 → 23
+        {0x808080, -3, false, true, 0x7F7F7F},                // SoftBevel halves toward zero: −3 → −1
+        {0x808080, 47, false, true, 0x979797},                // 47 → 23
     };
-    for (auto [from, amount, blue, soft, to] : shifts) EXPECT_EQ(ShiftColor(from, amount, blue, soft), to) << from;
+    for (auto [from, amount, blue, soft, to] : shifts)
+        EXPECT_EQ(ShiftColor(from, amount, blue, soft), to) << from;
     EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176),  // c × (255 − a) / 255 + a, truncating
               MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
     EXPECT_EQ(BlendToWhite(0xFFFFFF, 128), 0xFFFFFFu);
     const std::pair<double, int> halves[] = {{0.5, 0},   {1.5, 2},   {-0.5, 0}, {-1.5, -2},
                                              {-2.5, -2}, {76.5, 76}, {2.6, 3}};
-    for (auto [value, rounded] : halves) EXPECT_EQ(RoundHalfEven(value), rounded) << value;
+    for (auto [value, rounded] : halves)
+        EXPECT_EQ(RoundHalfEven(value), rounded) << value;
 }
 
 TEST(XPButtonColour, PaletteBySchemes) {
@@ -130,7 +132,7 @@ constexpr int T = -1;
 
 // Pixels of every look on a 40 × 20 button, in the states played by Look::Play.
 TEST(XPButtonLooks, EveryLookInEveryState) {
-    const Rgb b = 0xF0F0F0;  // BaseColor of scheme 3, shifted with blue scaling by the gradient look
+    const Rgb b = 0xF0F0F0;    // BaseColor of scheme 3, shifted with blue scaling by the gradient look
     const Rgb q = SB(b, -32);  // the pressed gradient's base
     const std::tuple<int, int, const char*, std::vector<Pixel>> cases[] = {
         {1, 1, "", {{0, 0, {D}}, {1, 1, {H}}, {38, 1, {Sh}}, {1, 18, {Sh}}, {2, 2, {H}}, {37, 17, {Sh}}}},
@@ -143,7 +145,7 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         {3, 3, "", {{0, 5, C(0x733C00)}, {1, 1, C(0x7B4D10)}, {1, 5, C(SB(b, -5))}, {2, 5, C(SB(b, -10))}}},
         // Row 10 of the gradient: 25 / 20 × 10 = 12.5, rounded to even.
         {3, 3, "", {{38, 5, C(SB(b, -36))}, {5, 18, C(SB(b, -48))}, {5, 1, C(SB(b, 16))}, {20, 10, C(SB(b, -12))}}},
-        {3, 3, "f", {{1, 5, C(0xE7AE8C)}, {5, 18, C(0xEF826B)}}},  // the blue trim
+        {3, 3, "f", {{1, 5, C(0xE7AE8C)}, {5, 18, C(0xEF826B)}}},                       // the blue trim
         {3, 3, "fh", {{1, 5, C(0x31B2FF)}, {5, 2, C(0x8CDBFF)}, {2, 5, C(0x6BCBFF)}}},  // orange wins
         {3, 3, "fhp", {{0, 5, C(0x733C00)}, {37, 5, C(b)}, {1, 5, C(SB(q, -32))}, {5, 1, C(SB(q, -32))}}},
         {3, 3, "fhpd", {{5, 5, C(SB(b, -24))}, {0, 5, C(SB(b, -84))}, {1, 1, C(SB(b, -72))}, {0, T, C(SB(b, -104))}}},
@@ -168,7 +170,7 @@ TEST(XPButtonLooks, EveryLookInEveryState) {
         {8, 1, "hpd", {{0, 0, {F}}}},
         {9, 1, "h", {{0, 0, {A}}, {20, 10, {AL}}}},
         {9, 1, "hp", {{0, 0, {A}}, {20, 10, C(BlendToWhite(0x6A240A, 128))}}},  // the fake's highlight colour
-        {10, 1, "hp", {{0, 0, {F}}, {39, 19, {F}}}},  // the face alone
+        {10, 1, "hp", {{0, 0, {F}}, {39, 19, {F}}}},                            // the face alone
         // The gradient of ButtonType 14 reaches H − 29 (58 / 20 × 10) at row 10.
         {14, 1, "", {{0, 10, {Sh, -50}}, {1, 10, {F, -9}}, {2, 2, {H}}, {3, 10, {H}}, {20, 10, {H, -29}}}},
         {14, 1, "Dh", {{20, 10, {L}}}},
@@ -321,7 +323,8 @@ TEST(XPButtonPictures, BlitPictureRules) {
     MemoryPicture picture(platform::PictureKind::kBitmap, 4, 1, px);
     auto row = [&](int y, int n = 4) {
         std::vector<Rgb> out;
-        for (int x = 0; x < n; ++x) out.push_back(l.At(x, y));
+        for (int x = 0; x < n; ++x)
+            out.push_back(l.At(x, y));
         return out;
     };
     l.button.BlitPicture(0, 0, 4, 1, picture, kKey, -1, false, false, false);
@@ -355,8 +358,8 @@ TEST(XPButtonPictures, PictureByStateAndEffects) {
     l.button.SetBackColor(kFace);
     l.button.SetBackOver(kFace);
     l.button.SetCaption("");
-    l.button.SetPictureNormal(std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2,
-                                                              std::vector<Rgb>{kKey, 0, 0, 0}));
+    l.button.SetPictureNormal(
+        std::make_shared<MemoryPicture>(platform::PictureKind::kBitmap, 2, 2, std::vector<Rgb>{kKey, 0, 0, 0}));
     const auto r = l.button.pictureRect();
     const Palette p = l.p();
     auto at = [&](int dx, int dy) { return l.At(r.x + dx, r.y + dy); };

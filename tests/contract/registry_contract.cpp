@@ -31,9 +31,11 @@ void RegistryContract::DeleteTree(const std::string& path) {
     if (registry_->OpenKey(platform::RootKey(kHkeyCurrentUser), path, platform::kKeyAllAccess, key) != 0) return;
     std::vector<std::string> children;
     std::string name;
-    for (std::uint32_t i = 0; registry_->EnumKey(key, i, 260, name) == 0; ++i) children.push_back(name);
+    for (std::uint32_t i = 0; registry_->EnumKey(key, i, 260, name) == 0; ++i)
+        children.push_back(name);
     registry_->CloseKey(key);
-    for (const auto& child : children) DeleteTree(path + "\\" + child);
+    for (const auto& child : children)
+        DeleteTree(path + "\\" + child);
     registry_->DeleteKey(platform::RootKey(kHkeyCurrentUser), path);
 }
 
@@ -110,7 +112,7 @@ TEST_P(RegistryContract, WritesReadBackByType) {
         {"DwordBad", std::string("abc"), 4, false, Variant()},  // not a number: nothing written
         {"Binary", Bytes{0x00, 0xA5, 0xFF}, 3, true, Bytes{0x00, 0xA5, 0xFF}},
         {"EmptyBinary", Bytes{}, 3, true, Bytes{}},
-        {"BinaryText", std::string("ab"), 3, false, Variant()},  // binary needs bytes
+        {"BinaryText", std::string("ab"), 3, false, Variant()},                  // binary needs bytes
         {"Multi", std::string("a\0b\0\0", 5), 7, true, std::string("a\0b", 3)},  // separators and terminator
         {"MultiFirstEmpty", std::string("\0b\0\0", 4), 7, true, Variant()},
         {"Ignored", std::string("1"), 5, true, Variant()},  // a type not converted writes nothing
@@ -195,8 +197,8 @@ TEST_P(RegistryContract, RemoteAccessReachesOnlyReachableComputers) {
 
     EXPECT_EQ(reg.ReadRemoteRegistryValue("\\\\vantorel-unreachable-host", kHkeyCurrentUser, "State"),
               Variant(std::string("Error!")));
-    EXPECT_FALSE(reg.WriteRemoteRegistryValue("\\\\vantorel-unreachable-host", kHkeyCurrentUser, "State",
-                                              std::string("0"), 1));
+    EXPECT_FALSE(
+        reg.WriteRemoteRegistryValue("\\\\vantorel-unreachable-host", kHkeyCurrentUser, "State", std::string("0"), 1));
     EXPECT_EQ(reg.GetRegistryValue("State"), Variant(std::string("1"))) << "a failed write changes nothing";
 
     // The local computer through the remote path.

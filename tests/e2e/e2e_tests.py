@@ -1,12 +1,6 @@
 #!/usr/bin/python3
-"""End-to-end journeys of vantorel.exe under Wine on a virtual display.
-
-Usage: e2e_tests.py BUILD_DIR [unittest options]
-
-Each test copies the program into a folder of its own (it reads sw2.def from its folder), starts it
-inside a Wine desktop on an empty (or prepared) registry, reads its windows with vtprobe.exe,
-clicks with xdotool and reads settings with `wine reg`. One Wine prefix and display serve the run.
-"""
+"""End-to-end journeys of vantorel.exe under Wine, each on a copy of the program in a folder of its own.
+Usage: e2e_tests.py BUILD_DIR [unittest options]"""
 import os
 import re
 import shutil
@@ -17,13 +11,20 @@ import time
 import unittest
 
 import harness
-from harness import wait_for
+from harness import is_main, wait_for
 
 BUILD = ARTIFACTS = SESSION = None
 HKCU_KEY = r"HKEY_CURRENT_USER\SOFTWARE\Vantorel"
 HKLM_KEY = r"HKEY_LOCAL_MACHINE\SOFTWARE\Vantorel"
 DESKTOP_KEY = r"HKEY_CURRENT_USER\Control Panel\Desktop"
-WM_CLOSE, WM_SYSCOMMAND, SC_MINIMIZE = 0x10, 0x112, 0xF020
+WM_CLOSE, WM_SYSCOMMAND, SC_MINIMIZE, BM_CLICK = 0x10, 0x112, 0xF020, 0xF5
+WM_MOUSEMOVE, WM_LBUTTONUP, WM_RBUTTONUP = 0x200, 0x202, 0x205  # the tray icon reports through WM_MOUSEMOVE
+
+
+def scripted():
+    """The scriptable loopback server (tests/servers/http_test_server.py) started by the CTest fixture."""
+    with open(os.environ["VANTOREL_HTTP_PORT_FILE"]) as f:
+        return "http://127.0.0.1:" + f.read().strip()
 
 
 def setUpModule():
@@ -34,10 +35,6 @@ def setUpModule():
 def tearDownModule():
     if SESSION is not None:
         SESSION.close()
-
-
-def is_main(w):
-    return w.cls == "VantorelFrmMain"
 
 
 class Journeys(unittest.TestCase):
@@ -74,6 +71,25 @@ class Journeys(unittest.TestCase):
 
     def switch(self, window):
         return self.control(window, lambda c: c.cls == "KirelXPButton")
+
+    def connect(self, *hosts):
+        """Opens (host, count) loopback connections to listeners of our own, closed after the test."""
+        sockets = []
+        for host, n in hosts:
+            listener = socket.socket()
+            listener.bind((host, 0))
+            listener.listen(n + 8)
+            sockets += [listener] + [socket.create_connection(listener.getsockname()) for _ in range(n)]
+        self.addCleanup(lambda: [s.close() for s in sockets])
+
+    def open_updates(self, check=True):
+        """Opens the updates window with "&Updates" and starts the check: (main window, updates window)."""
+        main = self.main_window()
+        SESSION.post(self.control(main, lambda c: c.caption == "&Updates"), BM_CLICK)
+        updates = SESSION.find(lambda w: w.cls == "VantorelOptions" and w.visible, timeout=10)
+        if check:
+            SESSION.post(self.control(updates, lambda c: c.caption == "&Check for Updates"), BM_CLICK)
+        return main, updates
 
     def ended(self):
         """The program has gone: it said it unloaded and its window no longer exists."""
@@ -125,19 +141,11 @@ class Journeys(unittest.TestCase):
         self.assertIn("with 0 definitions", SESSION.said())
 
     def test_a_listed_loopback_connection_is_counted_also_while_the_options_window_is_open(self):
-        """127.0.0.2 is listed (key 33554559). Under Wine SetTcpEntry is a stub that answers success
-        and closes nothing, so every sweep counts the connection again. 1,500 more connections to
-        127.0.0.1 make a sweep longer than the 55 ms between ticks, so a click on "&Options" is
-        nearly always handled in the middle of one."""
+        # 127.0.0.2 is listed; Wine's SetTcpEntry closes nothing, so every sweep counts it again. 1,500
+        # more connections make a sweep longer than a tick: "&Options" is nearly always clicked during one.
         self.definitions(b"-939524086\r\n33554559")
-        SESSION.reg("add", HKCU_KEY, "/v", "State", "/t", "REG_SZ", "/d", "1")
-        sockets = []
-        for host, n in (("127.0.0.2", 1), ("127.0.0.1", 1500)):
-            listener = socket.socket()
-            listener.bind((host, 0))
-            listener.listen(n + 8)
-            sockets += [listener] + [socket.create_connection(listener.getsockname()) for _ in range(n)]
-        self.addCleanup(lambda: [s.close() for s in sockets])
+        SESSION.reg_add(HKCU_KEY, "State", "1")
+        self.connect(("127.0.0.2", 1), ("127.0.0.1", 1500))
         self.start()
         window = self.main_window()
         self.assertEqual(self.switch(window).caption, "ON")
@@ -164,14 +172,14 @@ class Journeys(unittest.TestCase):
 
     def test_a_second_instance_exits_silently(self):
         self.start()
-        SESSION.reg("add", HKCU_KEY, "/v", "State", "/t", "REG_SZ", "/d", "1")  # a second start would rewrite it
+        SESSION.reg_add(HKCU_KEY, "State", "1")  # a second start would rewrite it
         self.assertEqual(harness.run(["wine", self.exe], SESSION.env), (0, ""), "ends at once, saying nothing")
         time.sleep(1)
         self.assertEqual(len([w for w in SESSION.windows() if is_main(w)]), 1, "no second window")
         self.assertEqual(SESSION.reg_query(HKCU_KEY, "State"), "1")
 
-    def test_hidden_in_the_tray_by_setting_by_minimising_and_by_alt_t(self):
-        SESSION.reg("add", HKLM_KEY, "/v", "Tray", "/t", "REG_SZ", "/d", "1")
+    def test_hidden_in_the_tray_by_setting_by_minimising_and_by_alt_t_and_back_by_the_icon(self):
+        SESSION.reg_add(HKLM_KEY, "Tray", "1")
         self.start()
         hidden = self.main_window(visible=False)
         self.assertIsNotNone(hidden, "\"Tray\" = \"1\" starts hidden")
@@ -189,9 +197,56 @@ class Journeys(unittest.TestCase):
                 SESSION.click(window.rect[0] + 100, window.rect[1] + 10)  # activate it by its title bar
                 time.sleep(0.5)
                 SESSION.xdotool("key", "alt+t")  # presses "&Tray"
-            self.assertIsNotNone(self.main_window(visible=False), hide)
+            hidden = self.main_window(visible=False)
+            self.assertIsNotNone(hidden, hide)
+            SESSION.post(hidden, WM_MOUSEMOVE, 0, WM_MOUSEMOVE)  # a plain move over the icon does nothing
             self.assertIsNone(self.main_window(timeout=2), hide)
+            SESSION.post(hidden, WM_MOUSEMOVE, 0, WM_RBUTTONUP if hide == "minimise" else WM_LBUTTONUP)
+            back = self.main_window()
+            self.assertEqual((back.size(), back.topmost), (window.size(), False), "a click on the icon brings it back")
             SESSION.close_program()
+
+    def test_closing_during_a_stalled_update_takes_effect_within_a_second(self):
+        """Under Wine each top-level window destroyed and the tray icon's removal cost about 2 s (its shell
+        does not answer): the first run, with no check started, gives the time the same steps take."""
+        idle = None
+        for server, leave in ((None, "close"), ("/do/noanswer/defver", "close"), ("/do/noanswer/sw2.def", "close"),
+                              ("/do/trickle/sw2.def", "&Close"), ("/do/endless/sw2.def", "main")):
+            SESSION.reg_add(HKLM_KEY, "Server", scripted() + (server or ""))
+            self.start()
+            main, updates = self.open_updates(check=server is not None)
+            time.sleep(1.5)  # the request or the body is under way
+            self.assertFalse(SESSION.find(is_main).enabled, "the options window is modal")
+            left = time.time()
+            if leave == "&Close":
+                SESSION.post(self.control(updates, lambda c: c.caption == leave), BM_CLICK)
+            else:
+                SESSION.post(main if leave == "main" else updates, WM_CLOSE)
+            if leave != "main":
+                self.assertTrue(wait_for(lambda: SESSION.find(is_main).enabled, 10), "the main window answers again")
+                SESSION.post(self.control(main, lambda c: c.caption == "&Exit"), BM_CLICK)
+            self.assertTrue(self.ended(), (server, leave))
+            idle = idle or time.time() - left
+            self.assertLess(time.time() - left, idle + 1, (server, leave))
+            with open(os.path.join(self.folder, "sw2.def"), "rb") as f:
+                self.assertEqual(f.read(), b"-939524086\r\n67305985")
+            self.assertEqual(sorted(os.listdir(self.folder)), ["sw2.def", "vantorel.exe"], "no .part, defver, setup")
+            SESSION.close_program()
+
+    def test_a_new_definitions_list_is_in_force_at_once(self):
+        """The server's sw2.def lists 127.0.0.2 (key 33554559), the installed one does not."""
+        SESSION.reg_add(HKCU_KEY, "State", "1")
+        SESSION.reg_add(HKLM_KEY, "Server", scripted())
+        self.connect(("127.0.0.2", 1))
+        self.start()
+        self.assertTrue(wait_for(lambda: "Swept the connection table" in SESSION.said(), 30))
+        self.assertNotRegex(SESSION.said(), "Caption: Vantorel - [1-9]", "nothing listed yet")
+        main, updates = self.open_updates()
+        updated = "Definitions updated: 2 definitions from .* in use"
+        self.assertTrue(wait_for(lambda: re.search(updated, SESSION.said())), SESSION.said())
+        SESSION.post(updates, WM_CLOSE)
+        self.assertTrue(wait_for(lambda: re.search("Caption: Vantorel - [1-9][0-9]* attempts", SESSION.said()), 30),
+                        "the guard sweeps with the new list without a restart\n" + SESSION.said())
 
     def test_the_layout_scales_with_the_screen_density(self):
         """At 144 DPI (150 %) the declared DPI awareness gives the design's twips at 10 per pixel."""

@@ -1,11 +1,5 @@
-"""Drives vantorel.exe under Wine for the end-to-end tests.
-
-A Session has its own virtual display (started by tests/win32/xvfb-fixture, the launcher the
-Windows tests use), its own Wine prefix and a Wine desktop in which the program runs, so windows
-have title bars and a notification area as on Windows. Windows are read with vtprobe.exe from
-inside the desktop; clicks are real pointer clicks sent with xdotool; settings go through
-`wine reg`. Everything a session starts is ended by its PID (and the prefix's own wineserver).
-"""
+"""Drives vantorel.exe under Wine for the end-to-end tests: a virtual display, a Wine prefix and a Wine
+desktop of its own; windows read with vtprobe.exe, pointer clicks by xdotool, settings by `wine reg`."""
 import os
 import signal
 import subprocess
@@ -18,8 +12,8 @@ QUIET = dict(stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=subproc
 
 class Window:
     def __init__(self, line):
-        hwnd, self.cls, self.caption, visible, iconic, rect = line.split("\t")
-        self.hwnd, self.visible, self.iconic = int(hwnd), visible == "1", iconic == "1"
+        hwnd, self.cls, self.caption, visible, enabled, topmost, rect = line.split("\t")
+        self.hwnd, self.visible, self.enabled, self.topmost = int(hwnd), visible == "1", enabled == "1", topmost == "1"
         self.rect = tuple(int(v) for v in rect.split())
 
     def centre(self):
@@ -31,13 +25,16 @@ class Window:
 
 
 def run(args, env, timeout=60):
-    """Runs a Wine command with its output in a file (Wine's services inherit pipes and hold them
-    open, so reading a pipe to its end would wait for them): (exit code, output)."""
+    """(exit code, output) of a Wine command, its output in a file: Wine's services hold pipes open."""
     with tempfile.TemporaryFile() as out:
         code = subprocess.run(args, env=env, stdin=subprocess.DEVNULL, stdout=out, stderr=subprocess.DEVNULL,
                               timeout=timeout).returncode
         out.seek(0)
         return code, out.read().decode("latin-1").replace("\r\n", "\n")
+
+
+def is_main(w):
+    return w.cls == "VantorelFrmMain"
 
 
 def wait_for(condition, timeout=15):
@@ -75,10 +72,6 @@ class Session:
         self.output.seek(0)
         return self.output.read().decode("latin-1").replace("\r\n", "\n")
 
-    def run(self, exe, timeout=60):
-        """Runs a second program in the same prefix and waits for it: (exit code, output)."""
-        return run(["wine", exe], self.env, timeout)
-
     def run_in_desktop(self, command_line, timeout=120):
         """Runs a Windows command line inside the program's Wine desktop and waits for it: its exit code."""
         return run(["wine", os.path.join(self.build, "vtprobe.exe"), "run", command_line], self.env, timeout)[0]
@@ -88,7 +81,7 @@ class Session:
 
     def windows(self, parent=None):
         out = self.probe("windows") if parent is None else self.probe("controls", parent.hwnd)
-        return [Window(line) for line in out.splitlines() if line.count("\t") == 5]
+        return [Window(line) for line in out.splitlines() if line.count("\t") == 6]
 
     def find(self, predicate, timeout=30):
         """The first top-level window for which predicate(window) holds, waiting up to `timeout`."""
@@ -107,17 +100,11 @@ class Session:
         subprocess.run(["import", "-window", "root", path], env=self.env, check=False, **QUIET)
 
     def reg_query(self, key, value):
-        """The data of a REG_SZ value, or None when it is missing."""
-        code, out = run(["wine", "reg", "query", key, "/v", value], self.env)
-        for line in out.splitlines() if code == 0 else []:
-            parts = line.strip().split(None, 2)
-            if len(parts) >= 2 and parts[0].lower() == value.lower() and parts[1].startswith("REG_"):
-                return parts[2] if len(parts) == 3 else ""
-        return None
+        """The data of a value (names without blanks), or None when it is missing."""
+        return (self.reg_values(key) or {}).get(value)
 
     def reg_values(self, key):
-        """Every value (names without blanks) of a key as {name: data}, REG_DWORD data as an int; None
-        when the key is missing."""
+        """{name: data} of a key's values (names without blanks; REG_DWORD as int), None when it is missing."""
         code, out = run(["wine", "reg", "query", key], self.env)
         if code != 0:
             return None

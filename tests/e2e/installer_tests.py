@@ -1,24 +1,16 @@
 #!/usr/bin/python3
-"""The setup program VTSetup.exe under Wine, in a fresh prefix, and publishing a release with
-deploy/publish-release.
-
-Usage: installer_tests.py BUILD_DIR [unittest options]
-
-The steps run in order on one prefix: a silent install; the program started from the installed
-folder, then installs over it while it runs (it is asked to close and started again; newer
-definitions and the settings are kept, older definitions replaced); a silent uninstall with the
-program running and start-with-Windows entries in place leaves nothing of ours.
-"""
+"""VTSetup.exe under Wine in a fresh prefix, in order: a silent install, an upgrade over the running program,
+a silent uninstall that leaves nothing of ours; then publishing a release. Usage: installer_tests.py BUILD_DIR"""
 import os
 import re
 import shutil
 import subprocess
 import sys
 import tempfile
-import time
 import unittest
 
 import harness
+from harness import is_main, wait_for
 
 BUILD = None
 SESSION = None
@@ -46,17 +38,6 @@ def setup_exe():
 def version():
     text = read(os.path.join(BUILD, "generated", "version.h")).decode()
     return ".".join(re.search(rf"kVersion{part} = (\d+)", text).group(1) for part in ("Major", "Minor"))
-
-
-def wait_for(condition, timeout=30):
-    deadline = time.time() + timeout
-    while not condition() and time.time() < deadline:
-        time.sleep(0.3)
-    return condition()
-
-
-def is_main(w):
-    return w.cls == "VantorelFrmMain"
 
 
 def read(path):
@@ -172,7 +153,8 @@ class Publish(unittest.TestCase):
             self.assertEqual(publish(), 0)
             names = ["VTSetup.exe", "defver", "mainver", "sw2.def"]
             self.assertEqual(sorted(os.listdir(vt)), names)
-            self.assertEqual([read(os.path.join(vt, n)) for n in names], [read(os.path.join(release, n)) for n in names])
+            for n in names:
+                self.assertEqual(read(os.path.join(vt, n)), read(os.path.join(release, n)), n)
             self.assertEqual(read(os.path.join(vt, "mainver")).strip().decode(), version())
             write(os.path.join(vt, "defver"), b"25")  # definitions updated on the server since
             write(os.path.join(vt, "sw2.def"), b"newer")

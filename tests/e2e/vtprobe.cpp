@@ -3,7 +3,7 @@
 // cannot read them). The desktop is the one named by VTPROBE_DESKTOP, "vt" by default.
 //
 //   vtprobe windows                 every top-level window of other processes:
-//                                   hwnd \t class \t caption \t visible \t iconic \t left top right bottom
+//                                   hwnd \t class \t caption \t visible \t enabled \t topmost \t left top right bottom
 //   vtprobe controls HWND           the child windows of HWND, same columns, screen coordinates
 //   vtprobe post HWND MSG WPARAM LPARAM
 //                                   posts a message (numbers in decimal or 0x hex)
@@ -24,9 +24,10 @@ void Print(HWND hwnd) {
     ::GetClassNameA(hwnd, className, sizeof className);
     RECT r{};
     ::GetWindowRect(hwnd, &r);
-    std::printf("%lld\t%s\t%s\t%d\t%d\t%ld %ld %ld %ld\n", static_cast<long long>(reinterpret_cast<INT_PTR>(hwnd)),
-                className, caption, ::IsWindowVisible(hwnd) ? 1 : 0, ::IsIconic(hwnd) ? 1 : 0, r.left, r.top, r.right,
-                r.bottom);
+    const bool topmost = (::GetWindowLongPtrA(hwnd, GWL_EXSTYLE) & WS_EX_TOPMOST) != 0;
+    std::printf("%lld\t%s\t%s\t%d\t%d\t%d\t%ld %ld %ld %ld\n", static_cast<long long>(reinterpret_cast<INT_PTR>(hwnd)),
+                className, caption, ::IsWindowVisible(hwnd) ? 1 : 0, ::IsWindowEnabled(hwnd) ? 1 : 0, topmost ? 1 : 0,
+                r.left, r.top, r.right, r.bottom);
 }
 
 BOOL CALLBACK EachTopLevel(HWND hwnd, LPARAM) {
@@ -85,7 +86,9 @@ int main(int argc, char** argv) {
         ::Sleep(static_cast<DWORD>(std::strtoul(argv[3], nullptr, 10)));
         ::CloseHandle(mutex);
     } else {
-        std::fprintf(stderr, "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | run \"COMMAND LINE\" | hold NAME MS\n");
+        std::fprintf(stderr,
+                     "usage: vtprobe windows | controls HWND | post HWND MSG WPARAM LPARAM | "
+                     "run \"COMMAND LINE\" | hold NAME MS\n");
         return 2;
     }
     std::fflush(stdout);

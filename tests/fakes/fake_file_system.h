@@ -78,7 +78,7 @@ public:
     }
     bool Delete(const std::string& path) override { return files.erase(path) != 0; }
     bool QueryDiskFreeSpace(const std::string& root, std::uint32_t& bps, std::uint32_t& spc,
-                          std::uint32_t& free) override {
+                            std::uint32_t& free) override {
         lastFreeSpaceRoot = root;
         bps = bytesPerSector;
         spc = sectorsPerCluster;
@@ -88,7 +88,8 @@ public:
 
 private:
     static std::string Trim(std::string path) {
-        while (!path.empty() && path.back() == '\\') path.pop_back();
+        while (!path.empty() && path.back() == '\\')
+            path.pop_back();
         return path;
     }
 

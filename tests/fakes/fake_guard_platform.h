@@ -29,10 +29,12 @@ constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std
 // A sorted definitions list holding the given address fields.
 inline DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
     std::vector<std::string> keys;
-    for (auto a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
+    for (auto a : addresses)
+        keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
     std::sort(keys.begin(), keys.end());
     std::string text;
-    for (const auto& k : keys) text += k + "\r\n";
+    for (const auto& k : keys)
+        text += k + "\r\n";
     return DefinitionList::FromText(text);
 }
 
@@ -147,7 +149,9 @@ public:
 class FakeWindowManager final : public platform::WindowManager {
 public:
     bool SetWindowPos(platform::WindowHandle, platform::WindowHandle, std::int32_t, std::int32_t, std::int32_t,
-                      std::int32_t, std::uint32_t) override { return true; }
+                      std::int32_t, std::uint32_t) override {
+        return true;
+    }
     std::int32_t ScreenWidth() const override { return 1024; }
     std::int32_t ScreenHeight() const override { return 768; }
     bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t) override { return true; }

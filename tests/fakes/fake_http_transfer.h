@@ -17,9 +17,9 @@ public:
     std::string header = "HTTP/1.1 200 OK\r\n\r\n";
     std::string body;
     std::optional<platform::TransferError> executeFails, headerFails, lengthFails, chunkFails;
-    std::size_t chunkFailsAt = 0;                    // GetChunk fails once this many bytes were handed out
-    std::vector<std::size_t> chunkScript;            // at most these sizes from the first chunks on
-    std::size_t deliverOnly = std::string::npos;     // the connection ends after this many body bytes
+    std::size_t chunkFailsAt = 0;                 // GetChunk fails once this many bytes were handed out
+    std::vector<std::size_t> chunkScript;         // at most these sizes from the first chunks on
+    std::size_t deliverOnly = std::string::npos;  // the connection ends after this many body bytes
 
     // What happened.
     std::string url, userName, password, requestHeader;
@@ -31,7 +31,8 @@ public:
     }
     static std::string Body(std::size_t size) {
         std::string data(size, '\0');
-        for (std::size_t i = 0; i < size; ++i) data[i] = static_cast<char>((i * 7 + i / 251) & 0xFF);
+        for (std::size_t i = 0; i < size; ++i)
+            data[i] = static_cast<char>((i * 7 + i / 251) & 0xFF);
         return data;
     }
 

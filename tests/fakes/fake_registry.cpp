@@ -14,7 +14,8 @@ FakeRegistry::FakeRegistry() {
 
 std::string FakeRegistry::Lower(const std::string& text) {
     std::string lower = text;
-    for (char& c : lower) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    for (char& c : lower)
+        c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
     return lower;
 }
 
@@ -34,7 +35,8 @@ FakeRegistry::Node* FakeRegistry::Walk(Node* from, const std::string& path, bool
         if (c == '\\') parts.emplace_back();
         else parts.back().push_back(c);
     }
-    while (!parts.empty() && parts.back().empty()) parts.pop_back();  // trailing separators name the same key
+    while (!parts.empty() && parts.back().empty())
+        parts.pop_back();  // trailing separators name the same key
     Node* node = from;
     for (const std::string& name : parts) {
         if (name.empty()) {
@@ -64,8 +66,7 @@ RegKey FakeRegistry::NewHandle(Node* node, std::int32_t access) {
     return key;
 }
 
-std::int32_t FakeRegistry::Open(RegKey parent, const std::string& path, std::int32_t access, RegKey& key,
-                                bool create) {
+std::int32_t FakeRegistry::Open(RegKey parent, const std::string& path, std::int32_t access, RegKey& key, bool create) {
     Node* from = NodeOf(parent);
     if (from == nullptr) return 6;  // ERROR_INVALID_HANDLE
     std::int32_t status = kErrorSuccess;
@@ -91,7 +92,8 @@ std::int32_t FakeRegistry::DeleteKey(RegKey parent, const std::string& path) {
     Node* from = NodeOf(parent);
     if (from == nullptr) return 6;
     std::string trimmed = path;
-    while (!trimmed.empty() && trimmed.back() == '\\') trimmed.pop_back();
+    while (!trimmed.empty() && trimmed.back() == '\\')
+        trimmed.pop_back();
     std::size_t cut = trimmed.rfind('\\');
     std::string parentPath = cut == std::string::npos ? std::string() : trimmed.substr(0, cut);
     std::string leaf = cut == std::string::npos ? trimmed : trimmed.substr(cut + 1);
@@ -176,7 +178,7 @@ std::int32_t FakeRegistry::ConnectRegistry(const std::string& computer, RegKey r
 }
 
 std::uint32_t FakeRegistry::ExpandEnvironment(const std::string& source, std::uint32_t capacity,
-                                                     std::string& expanded) {
+                                              std::string& expanded) {
     std::string result;
     for (std::size_t i = 0; i < source.size();) {
         std::size_t close = source[i] == '%' ? source.find('%', i + 1) : std::string::npos;

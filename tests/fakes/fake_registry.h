@@ -32,8 +32,7 @@ public:
     std::int32_t EnumValue(platform::RegKey key, std::uint32_t index, std::uint32_t nameCapacity, std::string& name,
                            std::int32_t& type, std::vector<std::uint8_t>& data, std::uint32_t& count) override;
     std::int32_t ConnectRegistry(const std::string& computer, platform::RegKey root, platform::RegKey& key) override;
-    std::uint32_t ExpandEnvironment(const std::string& source, std::uint32_t capacity,
-                                           std::string& expanded) override;
+    std::uint32_t ExpandEnvironment(const std::string& source, std::uint32_t capacity, std::string& expanded) override;
 
     // Scripting: environment variables for expansion, a raw value stored as it stands (no
     // terminator added), and a count of handles still open.

@@ -22,7 +22,8 @@ void RasterCanvas::Clear() {
 
 void RasterCanvas::FillBox(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h, Rgb c) {
     for (std::int32_t j = std::max(y, 0); j < std::min(y + h, h_); ++j)
-        for (std::int32_t i = std::max(x, 0); i < std::min(x + w, w_); ++i) Set(i, j, c);
+        for (std::int32_t i = std::max(x, 0); i < std::min(x + w, w_); ++i)
+            Set(i, j, c);
 }
 
 void RasterCanvas::FrameBox(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h, Rgb c) {
@@ -56,8 +57,7 @@ void RasterCanvas::DrawLine(std::int32_t x1, std::int32_t y1, std::int32_t x2, s
     }
 }
 
-platform::Box RasterCanvas::MeasureText(const std::string& text, const platform::Box& box,
-                                        const platform::FontDesc&) {
+platform::Box RasterCanvas::MeasureText(const std::string& text, const platform::Box& box, const platform::FontDesc&) {
     std::int32_t n = 0;
     for (std::size_t i = 0; i < text.size(); ++i) {
         if (text[i] != '&') {

@@ -37,17 +37,23 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const std::string dest = in.PickValueInArray(destinations);
     if (in.ConsumeBool()) disk.files[dest] = in.ConsumeRandomLengthString(64);
     if (in.ConsumeBool()) disk.files[FileDownloader::PartialPath(dest)] = "stale";
-    const auto before = disk.files.find(dest) == disk.files.end() ? std::nullopt
-                                                                   : std::optional<std::string>(disk.files[dest]);
+    const auto before =
+        disk.files.find(dest) == disk.files.end() ? std::nullopt : std::optional<std::string>(disk.files[dest]);
 
     // The answer: a status line, maybe a size, any other fields, a body made from a short pattern.
-    const char* const statuses[] = {"HTTP/1.1 200 OK", "HTTP/1.1 206 Partial Content", "HTTP/1.1 204 No Content",
-                                    "HTTP/1.1 401 Unauthorized", "HTTP/1.1 404 Not Found", "HTTP/1.0 500 Oops",
-                                    "", "HTTP/1.1 \r\n"};
+    const char* const statuses[] = {"HTTP/1.1 200 OK",
+                                    "HTTP/1.1 206 Partial Content",
+                                    "HTTP/1.1 204 No Content",
+                                    "HTTP/1.1 401 Unauthorized",
+                                    "HTTP/1.1 404 Not Found",
+                                    "HTTP/1.0 500 Oops",
+                                    "",
+                                    "HTTP/1.1 \r\n"};
     std::string header = in.ConsumeBool() ? in.PickValueInArray(statuses) : in.ConsumeRandomLengthString(24);
     const std::string pattern = in.ConsumeRandomLengthString(16);
     const std::size_t bodySize = pattern.empty() ? 0 : in.ConsumeIntegralInRange<std::size_t>(0, 20000);
-    for (std::size_t i = 0; i < bodySize; ++i) inet.body.push_back(pattern[i % pattern.size()]);
+    for (std::size_t i = 0; i < bodySize; ++i)
+        inet.body.push_back(pattern[i % pattern.size()]);
     std::optional<std::int64_t> announced;  // the size when it is sent as a plain number
     switch (in.ConsumeIntegralInRange(0, 3)) {
         case 0: announced = static_cast<std::int64_t>(bodySize); break;
@@ -87,8 +93,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     fd.DownloadErrors = [&](const std::string&) { ++errors; };
     const bool result = fd.DownloadFile("http://127.0.0.1/vt/sw2.def", dest);
 
-    const auto after = disk.files.find(dest) == disk.files.end() ? std::nullopt
-                                                                  : std::optional<std::string>(disk.files[dest]);
+    const auto after =
+        disk.files.find(dest) == disk.files.end() ? std::nullopt : std::optional<std::string>(disk.files[dest]);
     if (disk.files.count(FileDownloader::PartialPath(dest)) != 0) std::abort();
     if (completes != (result ? 1 : 0)) std::abort();
     if (result && errors != 0) std::abort();

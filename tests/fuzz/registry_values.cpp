@@ -19,7 +19,8 @@ Bytes SomeBytes(FuzzedDataProvider& in) {
     Bytes pattern = in.ConsumeBytes<std::uint8_t>(in.ConsumeIntegralInRange<std::size_t>(0, 16));
     std::size_t size = in.ConsumeBool() ? in.ConsumeIntegralInRange<std::size_t>(0, 9000) : pattern.size();
     Bytes bytes(size, 0);
-    for (std::size_t i = 0; i < size && !pattern.empty(); ++i) bytes[i] = pattern[i % pattern.size()];
+    for (std::size_t i = 0; i < size && !pattern.empty(); ++i)
+        bytes[i] = pattern[i % pattern.size()];
     return bytes;
 }
 
@@ -35,7 +36,9 @@ Variant SomeVariant(FuzzedDataProvider& in) {
 bool HasKindOf(const Variant& value, std::int32_t type, const Variant& fallback) {
     if (value == fallback) return true;
     switch (type) {
-        case 1: case 2: case 7: return std::holds_alternative<std::string>(value);
+        case 1:
+        case 2:
+        case 7: return std::holds_alternative<std::string>(value);
         case 3: return std::holds_alternative<Bytes>(value);
         case 4: return std::holds_alternative<std::int32_t>(value);
         default: return false;
@@ -56,8 +59,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         const std::string name = in.ConsumeRandomLengthString(300);
         const Variant fallback = SomeVariant(in);
         if (in.ConsumeBool()) {  // a value as some other program may have stored it
-            const auto type = in.ConsumeBool() ? in.ConsumeIntegralInRange<std::int32_t>(0, 11)
-                                               : in.ConsumeIntegral<std::int32_t>();
+            const auto type =
+                in.ConsumeBool() ? in.ConsumeIntegralInRange<std::int32_t>(0, 11) : in.ConsumeIntegral<std::int32_t>();
             registry.PutRaw(platform::kHkeyCurrentUser, kPath, name, type, SomeBytes(in));
             const Variant value = reg.GetRegistryValue(name, fallback);
             if (!HasKindOf(value, type, fallback)) std::abort();

@@ -16,8 +16,8 @@ using namespace vantorel;
 using namespace vantorel::xpbutton;
 
 namespace {
-const char* const kKeys[] = {"BTYPE", "TX",   "ENAB",  "FONT",   "COLTYPE", "FOCUSR", "BCOL",  "BCOLO",
-                             "FCOL",  "FCOLO", "MCOL", "MPTR",   "MICON",   "PICN",   "PICH",  "UMCOL",
+const char* const kKeys[] = {"BTYPE", "TX",     "ENAB",  "FONT", "COLTYPE", "FOCUSR", "BCOL",       "BCOLO",
+                             "FCOL",  "FCOLO",  "MCOL",  "MPTR", "MICON",   "PICN",   "PICH",       "UMCOL",
                              "SOFT",  "PICPOS", "NGREY", "FX",   "CHECK",   "VALUE",  "ImageIndex", "HAND"};
 
 PropertyValue SomeValue(FuzzedDataProvider& in) {

@@ -28,8 +28,9 @@ FileDescriptor::~FileDescriptor() {
 }
 
 std::string TeardownUnavailableReason() {
-    return ::geteuid() == 0 ? "" : "not run as root: tearing connections down (SOCK_DESTROY) and a private network "
-                                   "namespace need root, so the real-teardown tests are skipped";
+    return ::geteuid() == 0 ? ""
+                            : "not run as root: tearing connections down (SOCK_DESTROY) and a private network "
+                              "namespace need root, so the real-teardown tests are skipped";
 }
 
 std::string EnterPrivateNetwork() {
@@ -38,9 +39,11 @@ std::string EnterPrivateNetwork() {
     if (!control) return std::string("socket failed: ") + std::strerror(errno);
     ifreq request{};
     std::strncpy(request.ifr_name, "lo", IFNAMSIZ - 1);
-    if (::ioctl(control.get(), SIOCGIFFLAGS, &request) != 0) return std::string("SIOCGIFFLAGS: ") + std::strerror(errno);
+    if (::ioctl(control.get(), SIOCGIFFLAGS, &request) != 0)
+        return std::string("SIOCGIFFLAGS: ") + std::strerror(errno);
     request.ifr_flags = static_cast<short>(request.ifr_flags | IFF_UP);
-    if (::ioctl(control.get(), SIOCSIFFLAGS, &request) != 0) return std::string("SIOCSIFFLAGS: ") + std::strerror(errno);
+    if (::ioctl(control.get(), SIOCSIFFLAGS, &request) != 0)
+        return std::string("SIOCSIFFLAGS: ") + std::strerror(errno);
     return std::string();
 }
 

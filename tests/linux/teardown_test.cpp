@@ -70,9 +70,9 @@ TEST_F(RealTeardown, RowsAreLaidOutLikeTheWindowsTable) {
               std::make_tuple(0u, AddressField("127.0.0.3"), std::uint32_t{htons(listener.port)}))
         << "a listening row's key is 0";
     auto client = find([&](const platform::TcpRow& r) { return r.localPort == htons(connection.clientPort); });
-    EXPECT_EQ(std::make_tuple(client.state, client.localAddr, client.remoteAddr, client.remotePort),
-              std::make_tuple(platform::kTcpStateEstablished, 0x0100007Fu, 0x0300007Fu,
-                              std::uint32_t{htons(listener.port)}))
+    EXPECT_EQ(
+        std::make_tuple(client.state, client.localAddr, client.remoteAddr, client.remotePort),
+        std::make_tuple(platform::kTcpStateEstablished, 0x0100007Fu, 0x0300007Fu, std::uint32_t{htons(listener.port)}))
         << "127.0.0.3 in network order, read little-endian";
 
     // Too small a buffer: the size needed, nothing written.
@@ -185,7 +185,8 @@ TEST_F(RealTeardown, WithoutTheRightToTearDownNothingIsCounted) {
         FakeGuardView view;
         std::int32_t count = 5;
         ConnectionSweep sweep(SweepServices{table, pump, registry, view}, list, count);
-        for (int i = 0; i < 3; ++i) sweep.SweepConnections();
+        for (int i = 0; i < 3; ++i)
+            sweep.SweepConnections();
         ::_exit(sweep.LastSweep().requested != 1 ? 11 : count != 5 ? 12 : !view.shown.empty() ? 13 : 0);
     }
     int status = 0;

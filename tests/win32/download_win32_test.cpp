@@ -35,7 +35,8 @@ const auto Pattern = testing::FakeHttpTransfer::Body;
 // The loopback server whose port the fixture wrote to `file`.
 std::string Server(const std::string& scheme, const std::string& file) {
     std::string port = ReadFile("Z:" + file);
-    while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back()))) port.pop_back();
+    while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back())))
+        port.pop_back();
     return scheme + "://127.0.0.1:" + port;
 }
 
@@ -53,7 +54,8 @@ UINT_PTR CancelAfter(FileDownloader& fd, UINT ms) {
 
 std::string Progress(std::initializer_list<int> steps) {
     std::string out;
-    for (int p : steps) out += "progress:" + std::to_string(p) + " ";
+    for (int p : steps)
+        out += "progress:" + std::to_string(p) + " ";
     return out + "complete ";
 }
 
@@ -75,7 +77,8 @@ protected:
         fd_.DownloadProgress = [this](const std::string& s) { events_ += "progress:" + s + " "; };
     }
     void TearDown() override {
-        for (const char* name : {"\\sw2.def", "\\new\\sw2.def"}) ::DeleteFileA((folder_ + name).c_str());
+        for (const char* name : {"\\sw2.def", "\\new\\sw2.def"})
+            ::DeleteFileA((folder_ + name).c_str());
         ::RemoveDirectoryA((folder_ + "\\new").c_str());
         EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
     }
@@ -100,10 +103,13 @@ protected:
 
 TEST_F(WinInetDownload, BodiesOfEverySizeArriveWholeWithProgressPerChunk) {
     // /range answers 206 only when "Range: bytes=0-" reached the server, 400 otherwise.
-    const std::pair<std::string, std::string> cases[] = {
-        {"/body/5000", Progress({20, 41, 61, 82, 100, 100})}, {"/range/5000", Progress({20, 41, 61, 82, 100, 100})},
-        {"/body/1", Progress({100})},  {"/body/1024", Progress({100, 100})}, {"/body/1025", Progress({100, 100})},
-        {"/body/2047", Progress({50, 100, 100})}, {"/body/0", Progress({})}};
+    const std::pair<std::string, std::string> cases[] = {{"/body/5000", Progress({20, 41, 61, 82, 100, 100})},
+                                                         {"/range/5000", Progress({20, 41, 61, 82, 100, 100})},
+                                                         {"/body/1", Progress({100})},
+                                                         {"/body/1024", Progress({100, 100})},
+                                                         {"/body/1025", Progress({100, 100})},
+                                                         {"/body/2047", Progress({50, 100, 100})},
+                                                         {"/body/0", Progress({})}};
     for (const auto& [path, events] : cases) {
         WriteFile(dest_, kOld);
         EXPECT_TRUE(Get(path)) << path;
@@ -137,10 +143,11 @@ TEST_F(WinInetDownload, RefusalsCutsAndUnusableSizesLeaveTheInstalledFile) {
     EXPECT_EQ(events_,
               "progress:20 progress:41 progress:61 progress:61 error:The connection with the server was reset. ");
     // Sizes beyond a signed 32-bit integer, negative ones and two different ones: refused, named.
-    const std::pair<std::string, std::string> sizes[] = {
-        {"/length/99999999999/3000", "99999999999"}, {"/length/-5/3000", "-5"},
-        {"/length/2147483648/3000", "2147483648"}, {"/length/1e999/3000", "1e999"},
-        {"/twolengths/3000/5000", "both 3000 and 5000"}};
+    const std::pair<std::string, std::string> sizes[] = {{"/length/99999999999/3000", "99999999999"},
+                                                         {"/length/-5/3000", "-5"},
+                                                         {"/length/2147483648/3000", "2147483648"},
+                                                         {"/length/1e999/3000", "1e999"},
+                                                         {"/twolengths/3000/5000", "both 3000 and 5000"}};
     for (const auto& [path, named] : sizes) {
         EXPECT_FALSE(Get(path));
         EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;
@@ -189,7 +196,7 @@ TEST_F(WinInetDownload, FailedConnectionsAndSilenceAreRequestErrors) {
     ::closesocket(probe);
     ::WSACleanup();
     for (const std::string& url : {"http://127.0.0.1:" + std::to_string(ntohs(address.sin_port)) + "/body/10",
-                                  std::string("ftp://127.0.0.1/sw2.def")}) {
+                                   std::string("ftp://127.0.0.1/sw2.def")}) {
         EXPECT_FALSE(Get(url));
         EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;
         EXPECT_EQ(events_.substr(events_.size() - 11), " occurred. ") << events_;
@@ -244,8 +251,7 @@ TEST_F(WinInetDownload, TrustedCertificateDeliversAndUntrustedIsRefused) {
     std::string der = ReadFile(std::string("Z:") + dir + "/certs/ca.der");
     HCERTSTORE root = ::CertOpenStore(CERT_STORE_PROV_SYSTEM_A, 0, 0, CERT_SYSTEM_STORE_LOCAL_MACHINE, "ROOT");
     ASSERT_NE(root, nullptr);
-    ASSERT_TRUE(::CertAddEncodedCertificateToStore(root, X509_ASN_ENCODING,
-                                                   reinterpret_cast<const BYTE*>(der.data()),
+    ASSERT_TRUE(::CertAddEncodedCertificateToStore(root, X509_ASN_ENCODING, reinterpret_cast<const BYTE*>(der.data()),
                                                    static_cast<DWORD>(der.size()), CERT_STORE_ADD_REPLACE_EXISTING,
                                                    nullptr));
     ::CertCloseStore(root, 0);

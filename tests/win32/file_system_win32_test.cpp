@@ -18,8 +18,8 @@ FileSystemUnderTest MakeWin32FileSystem() {
     char temp[MAX_PATH];
     ::GetTempPathA(MAX_PATH, temp);
     static int counter = 0;
-    std::string folder = std::string(temp) + "vtfs-" + std::to_string(::GetCurrentProcessId()) + "-" +
-                         std::to_string(++counter);
+    std::string folder =
+        std::string(temp) + "vtfs-" + std::to_string(::GetCurrentProcessId()) + "-" + std::to_string(++counter);
     ::CreateDirectoryA(folder.c_str(), nullptr);
     FileSystemUnderTest fs;
     fs.disk = &real->disk;

@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <string>
 
 #include "guard/read_definitions.h"
@@ -12,41 +13,19 @@
 namespace vantorel {
 namespace {
 
-class ScratchFolder {
-public:
-    ScratchFolder() {
-        char temp[MAX_PATH];
-        ::GetTempPathA(MAX_PATH, temp);
-        path_ = std::string(temp) + "vantorel-test-" + std::to_string(::GetCurrentProcessId());
-        ::CreateDirectoryA(path_.c_str(), nullptr);
-    }
-    ~ScratchFolder() {
-        ::DeleteFileA(DefinitionsPath(path_).c_str());
-        ::RemoveDirectoryA(path_.c_str());
-    }
-    const std::string& path() const { return path_; }
-
-private:
-    std::string path_;
-};
-
-void WriteFile(const std::string& path, const std::string& content) {
-    HANDLE file = ::CreateFileA(path.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr);
-    ASSERT_NE(file, INVALID_HANDLE_VALUE);
-    DWORD written = 0;
-    ::WriteFile(file, content.data(), static_cast<DWORD>(content.size()), &written, nullptr);
-    ::CloseHandle(file);
-    ASSERT_EQ(written, content.size());
-}
-
 TEST(Win32Files, ADefinitionsFileThatCannotBeUsedIsAskedForLikeAMissingOne) {
-    ScratchFolder folder;
+    char temp[MAX_PATH];
+    ::GetTempPathA(MAX_PATH, temp);
+    const std::string folder = std::string(temp) + "vantorel-test-" + std::to_string(::GetCurrentProcessId());
+    ::CreateDirectoryA(folder.c_str(), nullptr);
     win32::Win32Files files;
-    const std::string path = DefinitionsPath(folder.path());
+    const std::string path = DefinitionsPath(folder);
     auto attempt = [&](const char* what) {
         int missing = 0;
         DefinitionList list = DefinitionList::FromText("67305985");
-        EXPECT_FALSE(LoadDefinitions(path, files, [&] { ++missing; }, list)) << what;
+        EXPECT_FALSE(LoadDefinitions(
+            path, files, [&] { ++missing; }, list))
+            << what;
         EXPECT_EQ(missing, 1) << what;
         EXPECT_EQ(list.size(), 0u) << what;
     };
@@ -54,7 +33,7 @@ TEST(Win32Files, ADefinitionsFileThatCannotBeUsedIsAskedForLikeAMissingOne) {
     attempt("a folder");
     ::RemoveDirectoryA(path.c_str());
 
-    WriteFile(path, "67305985");  // held open by another program that shares no reading
+    std::ofstream(path, std::ios::binary) << "67305985";  // held open by another program that shares no reading
     HANDLE locked = ::CreateFileA(path.c_str(), GENERIC_READ, 0, nullptr, OPEN_EXISTING, 0, nullptr);
     ASSERT_NE(locked, INVALID_HANDLE_VALUE);
     attempt("a locked file");
@@ -69,6 +48,8 @@ TEST(Win32Files, ADefinitionsFileThatCannotBeUsedIsAskedForLikeAMissingOne) {
     attempt("a file over 256 MB");
     EXPECT_EQ(files.ReadableSize(path), kMaxDefinitionsBytes + 1);
     EXPECT_FALSE(DefinitionsUsable(path, files));
+    ::DeleteFileA(path.c_str());
+    ::RemoveDirectoryA(folder.c_str());
 }
 
 }  // namespace

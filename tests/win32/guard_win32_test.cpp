@@ -1,10 +1,9 @@
-// The guard's window side under Wine on a virtual display: the tray routines against Wine's shell,
-// BringToFront and the icon's mouse notifications on a real window, and the sweep's yield. Start-up
-// and clicks on the switch of the real program are proved end to end (tests/e2e/).
+// The guard's window side under Wine on a virtual display: the tray routines against Wine's shell and
+// the sweep's yield. Start-up, the switch, hiding in the tray and the icon's clicks bringing the window
+// back are proved on the real program end to end (tests/e2e/).
 #include <windows.h>
 
 #include <gtest/gtest.h>
-
 
 #include <string>
 #include <vector>
@@ -34,22 +33,19 @@ public:
     std::vector<Call> calls;
 };
 
-bool Topmost(HWND hwnd) { return (::GetWindowLongPtrA(hwnd, GWL_EXSTYLE) & WS_EX_TOPMOST) != 0; }
-
 TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     win32::MainWindow window;
     NotingNotifyArea tray;
     win32::MainWindowHandlers handlers;
-    handlers.taskbarCreated = [&] {
-        AddTrayIcon(tray, window, window.Icon(), window.Caption(), kTrayCallbackMessage);
-    };
+    handlers.taskbarCreated = [&] { AddTrayIcon(tray, window, window.Icon(), window.Caption(), kTrayCallbackMessage); };
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers)) << "no display? error " << ::GetLastError();
     AddTrayIcon(tray, window, window.Icon(), StatusText(0, CountForm::BlankBeforeSign), kTrayCallbackMessage);
     ModifyTrayIcon(tray, window, StatusText(1, CountForm::Plain), kTrayCallbackMessage);
     ModifyTrayIcon(tray, window, std::string(100, 'x'), kTrayCallbackMessage);  // cut to the field
     RemoveTrayIcon(tray, window);
     ASSERT_EQ(tray.calls.size(), 4u);
-    for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
+    for (const auto& call : tray.calls)
+        EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
     EXPECT_EQ(tray.calls[2].tip, std::string(63, 'x')) << "the tip handed to the shell fits its 64-byte field";
 
     // A restarted taskbar announces itself with the registered message: the icon is added again.
@@ -61,35 +57,6 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     RemoveTrayIcon(tray, window);
 }
 
-TEST(TrayWin32, IconClicksBringTheHiddenWindowBackRaisedNotTopmost) {
-    win32::MainWindow window;
-    win32::Win32WindowManager windows;
-    win32::Win32MessagePump pump;
-    win32::MainWindowHandlers handlers;
-    handlers.mouseMove = [&](std::uint32_t code) { TrayMouseNotification(window, windows, pump, code); };
-    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers));
-    HWND hwnd = window.hwnd();
-
-    // As the icon reports a left click: the mouse-move message with the code in the low word.
-    ASSERT_FALSE(window.Visible());
-    ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(WM_LBUTTONUP, 0));
-    EXPECT_TRUE(window.Visible());
-    EXPECT_EQ(window.State(), platform::WindowState::Normal);
-    EXPECT_FALSE(Topmost(hwnd)) << "raised without staying on top";
-
-    // Minimised and hidden (as the tray button leaves it): a right click brings it back normal.
-    ::ShowWindow(hwnd, SW_MINIMIZE);
-    ::ShowWindow(hwnd, SW_HIDE);
-    ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(WM_RBUTTONUP, 0));
-    EXPECT_TRUE(window.Visible());
-    EXPECT_EQ(window.State(), platform::WindowState::Normal);
-
-    // A plain move over the icon does nothing.
-    ::ShowWindow(hwnd, SW_HIDE);
-    ::SendMessageA(hwnd, WM_MOUSEMOVE, 0, MAKELPARAM(512, 0));
-    EXPECT_FALSE(window.Visible());
-}
-
 TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     int ticks = 0;
     win32::MainWindow window;
@@ -97,14 +64,14 @@ TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     handlers.timerTick = [&] { ++ticks; };
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers));
     MSG stale;
-    while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {
-    }
+    while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {}
     window.Timer().SetInterval(20);
     window.Timer().SetEnabled(true);
     // A loop that only yields, as a long sweep does: the timer's ticks still arrive.
     win32::Win32MessagePump pump;
     DWORD until = ::GetTickCount() + 3000;
-    while (ticks < 3 && ::GetTickCount() < until) ASSERT_TRUE(pump.YieldToMessages());
+    while (ticks < 3 && ::GetTickCount() < until)
+        ASSERT_TRUE(pump.YieldToMessages());
     EXPECT_GE(ticks, 3);
     window.Timer().SetEnabled(false);
 
@@ -112,7 +79,8 @@ TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     ::PostQuitMessage(7);
     until = ::GetTickCount() + 3000;
     bool going = true;
-    while (going && ::GetTickCount() < until) going = pump.YieldToMessages();
+    while (going && ::GetTickCount() < until)
+        going = pump.YieldToMessages();
     EXPECT_FALSE(going);
     EXPECT_FALSE(pump.PumpMessages()) << "stays quitting";
     MSG quit;

@@ -1,10 +1,9 @@
 // The options window on the real registry and Wine's Task Scheduler: its load step on an empty
-// registry, its boxes writing the settings Windows and Internet Explorer read, and the modal loop
-// ending on "&Close"; once with queued BM_CLICKs, once with the real pointer (SendInput, hit-tested
-// by the system, pressed and released on the control); checking "Boot when Windows boots" registers
-// the logon task "Vantorel" with Wine's scheduler, unchecking removes it. Then the window at other
-// DPIs and on the keyboard. Runs on the virtual display; the values and the task it touches
-// are removed afterwards.
+// registry, its boxes clicked with the real pointer (SendInput, hit-tested by the system) writing the
+// settings Windows and Internet Explorer read, and the modal loop ending on "&Close"; checking "Boot
+// when Windows boots" registers the logon task "Vantorel" with Wine's scheduler, unchecking removes
+// it. Then the window at other DPIs and on the keyboard. The values and the task it touches are
+// removed afterwards.
 #include <windows.h>
 #include <taskschd.h>
 
@@ -76,10 +75,9 @@ protected:
     Win32Registry registry_;
 };
 
-TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
+TEST_F(OptionsWindowTest, PointerClicksStoreTheBoxesAndBootWhenWindowsBootsRegistersTheLogonTask) {
     const std::string exe = AutostartPath();
     EXPECT_NE(exe.find("options_window_tests.exe"), std::string::npos) << exe;
-
     OptionsWindow window(nullptr, 0, registry_, exe);
     ASSERT_NE(window.hwnd(), nullptr) << "no display?";
     char caption[64];
@@ -87,44 +85,19 @@ TEST_F(OptionsWindowTest, BoxesShowWhatIsInEffectAndStoreTheirState) {
     EXPECT_STREQ(caption, "Options");
     EXPECT_TRUE(window.controls().F[0]->Visible());
     EXPECT_FALSE(window.controls().F[1]->Visible());
-    EXPECT_FALSE(window.box(0).Value());
-    EXPECT_FALSE(window.box(1).Value());
-    EXPECT_TRUE(window.box(2).Value());
+    EXPECT_EQ(std::vector<bool>({window.box(0).Value(), window.box(1).Value(), window.box(2).Value()}),
+              std::vector<bool>({false, false, true}));
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kSettingsKey, "Start"))) << "loading writes nothing";
     EXPECT_TRUE(IsEmpty(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger")));
 
-    // The user toggles the other two boxes, then closes the window; the clicks are queued and
-    // handled by the modal loop.
-    ::PostMessageA(window.box(1).hwnd(), BM_CLICK, 0, 0);
-    ::PostMessageA(window.box(2).hwnd(), BM_CLICK, 0, 0);
-    ::PostMessageA(window.closeButton().hwnd(), BM_CLICK, 0, 0);
-    window.ShowModal();
-    EXPECT_EQ(window.hwnd(), nullptr) << "closed";
-    EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("1")));
-    EXPECT_EQ(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"), Variant(std::string("no")));
-
-    OptionsWindow again(nullptr, 1, registry_, exe);
-    ::GetWindowTextA(again.hwnd(), caption, sizeof caption);
-    EXPECT_STREQ(caption, "Updates");
-    EXPECT_TRUE(again.controls().F[1]->Visible());
-    EXPECT_FALSE(again.controls().F[0]->Visible());
-    EXPECT_TRUE(again.box(1).Value());
-    EXPECT_FALSE(again.box(2).Value());
-    ::PostMessageA(again.hwnd(), WM_CLOSE, 0, 0);
-    again.ShowModal();
-}
-
-TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsRegisterAndRemoveTheLogonTask) {
-    const std::string exe = AutostartPath();
-    OptionsWindow window(nullptr, 0, registry_, exe);
-    ASSERT_NE(window.hwnd(), nullptr) << "no display?";
-    ASSERT_FALSE(window.box(0).Value()) << "an empty registry: the program does not start with Windows";
-
-    // The user checks the box (what it stored is read while it shows checked), unchecks it, closes the window.
+    // The user checks "Boot when Windows boots" (what it stored is read while it shows checked), unchecks
+    // it, toggles the other two boxes and closes the window: each click waits for the last one's change.
+    const int order[] = {0, 0, 1, 2};
     std::string refusal;
     std::wstring task;
     Variant run, start;
-    int step = 0;
+    std::size_t step = 0;
+    bool before = false, clicked = false;
     Ticker user(30, [&] {
         if (!::IsWindowVisible(window.hwnd())) return false;
         if (HWND box = ::FindWindowA("#32770", "Options")) {  // refused: say why and stop
@@ -135,21 +108,20 @@ TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsRegisterAndRemoveTh
             ::PostMessageA(window.hwnd(), WM_CLOSE, 0, 0);
             return true;
         }
-        const bool checked = window.box(0).Value();
-        if (step == 0 && checked) {
+        if (clicked && window.box(order[step]).Value() == before) return false;
+        if (clicked && step++ == 0) {
             task = StoredTask();
             run = Read(kHkeyLocalMachine, kRunKey, "Vantorel");
             start = Read(kHkeyLocalMachine, kSettingsKey, "Start");
-            step = 1;
-        } else if (step == 1 && !checked) {
-            step = 2;
         }
-        PointerClick(step == 2 ? window.closeButton().hwnd() : window.box(0).hwnd());
-        return step == 2;
+        clicked = step < 4;
+        if (clicked) before = window.box(order[step]).Value();
+        PointerClick(clicked ? window.box(order[step]).hwnd() : window.closeButton().hwnd());
+        return !clicked;
     });
     window.ShowModal();
     ASSERT_EQ(refusal, "") << "the scheduler took the task";
-    ASSERT_EQ(step, 2);
+    ASSERT_EQ(step, 4u);
     // Wine 8 keeps only the settings of a task registered as XML: its stored task has an empty <Triggers/>, an empty
     // <Principal> and an <Exec/> without <Command>, and its definition answers E_NOTIMPL for the trigger and action
     // collections and the principal; the logon trigger, the run level and the command line stay unproven here, and
@@ -164,14 +136,17 @@ TEST_F(OptionsWindowTest, PointerClicksOnBootWhenWindowsBootsRegisterAndRemoveTh
     EXPECT_EQ(StoredTask(), L"") << "unchecking removes the task";
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kRunKey, "Vantorel"))) << "unchecking removes the Run value";
     EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
-    EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kSettingsKey, "Tray"))) << "the other boxes wrote nothing";
-}
+    EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("1")));
+    EXPECT_EQ(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"), Variant(std::string("no")));
 
-RECT ChildRect(HWND child, HWND relativeTo) {
-    RECT r;
-    ::GetWindowRect(child, &r);
-    ::MapWindowPoints(nullptr, relativeTo, reinterpret_cast<POINT*>(&r), 2);
-    return r;
+    // Opened again, on the updates frame: the boxes show what is now in effect.
+    OptionsWindow again(nullptr, 1, registry_, exe);
+    ::GetWindowTextA(again.hwnd(), caption, sizeof caption);
+    EXPECT_STREQ(caption, "Updates");
+    EXPECT_TRUE(again.controls().F[1]->Visible());
+    EXPECT_FALSE(again.controls().F[0]->Visible());
+    EXPECT_EQ(std::vector<bool>({again.box(0).Value(), again.box(1).Value(), again.box(2).Value()}),
+              std::vector<bool>({false, true, false}));
 }
 
 TEST_F(OptionsWindowTest, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {

@@ -7,16 +7,16 @@
 
 namespace vantorel::testing {
 
-INSTANTIATE_TEST_SUITE_P(
-    RealAndFake, RegistryContract,
-    ::testing::Values(RegistryMaker{"Win32",
-                                    [] {
-                                        ::SetEnvironmentVariableA("VTX_SHORT", "s");
-                                        ::SetEnvironmentVariableA("VTX_LONG", "a rather long expansion");
-                                        return std::unique_ptr<platform::Registry>(
-                                            std::make_unique<win32::Win32Registry>());
-                                    }},
-                      RegistryMaker{"Fake", MakeContractFake}),
-    PrintMakerName);
+INSTANTIATE_TEST_SUITE_P(RealAndFake, RegistryContract,
+                         ::testing::Values(RegistryMaker{"Win32",
+                                                         [] {
+                                                             ::SetEnvironmentVariableA("VTX_SHORT", "s");
+                                                             ::SetEnvironmentVariableA("VTX_LONG",
+                                                                                       "a rather long expansion");
+                                                             return std::unique_ptr<platform::Registry>(
+                                                                 std::make_unique<win32::Win32Registry>());
+                                                         }},
+                                           RegistryMaker{"Fake", MakeContractFake}),
+                         PrintMakerName);
 
 }  // namespace vantorel::testing

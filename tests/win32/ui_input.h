@@ -79,7 +79,8 @@ namespace vantorel::win32 {
 inline RECT SendDpiChange(HWND top, UINT dpi, SIZE clientTwips) {
     RECT now;
     ::GetWindowRect(top, &now);
-    RECT r{0, 0, ::MulDiv(clientTwips.cx, static_cast<int>(dpi), 1440), ::MulDiv(clientTwips.cy, static_cast<int>(dpi), 1440)};
+    const int d = static_cast<int>(dpi);
+    RECT r{0, 0, ::MulDiv(clientTwips.cx, d, 1440), ::MulDiv(clientTwips.cy, d, 1440)};
     ::AdjustWindowRectEx(&r, static_cast<DWORD>(::GetWindowLongPtrA(top, GWL_STYLE)), FALSE,
                          static_cast<DWORD>(::GetWindowLongPtrA(top, GWL_EXSTYLE)));
     ::OffsetRect(&r, now.left - r.left, now.top - r.top);
@@ -135,6 +136,14 @@ inline std::string TextsCut(HWND top, UINT dpi) {
         },
         reinterpret_cast<LPARAM>(&walk));
     return walk.cut;
+}
+
+// Where `child` lies in `relativeTo`'s client coordinates.
+inline RECT ChildRect(HWND child, HWND relativeTo) {
+    RECT r;
+    ::GetWindowRect(child, &r);
+    ::MapWindowPoints(nullptr, relativeTo, reinterpret_cast<POINT*>(&r), 2);
+    return r;
 }
 
 // The height of the font `control` draws with (negative: character height).

@@ -146,7 +146,8 @@ struct Hosted {
         MSG msg;
         for (int i = 0; i < rounds; ++i) {
             if (i > 0) ::Sleep(5);
-            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) win32::DispatchQueuedMessage(msg);
+            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE))
+                win32::DispatchQueuedMessage(msg);
         }
     }
     void Send(UINT message, WPARAM wParam = 0, LPARAM lParam = MAKELPARAM(10, 10)) {
@@ -174,14 +175,28 @@ TEST(XPButtonWindow, PostedInputClicksOnlyAsTheControlSays) {
         Log log;
     } cases[] = {
         {"OFF", false, {{WM_LBUTTONDOWN, MK_LBUTTON, in}, {WM_LBUTTONUP, 0, out}}, {"MouseDown 1", "MouseUp 1"}},
-        {"OFF", false, {{WM_LBUTTONDOWN, MK_LBUTTON, in}, {WM_LBUTTONUP, 0, in}, {WM_LBUTTONDBLCLK, MK_LBUTTON, in},
-                        {WM_LBUTTONUP, 0, in}}, {"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}},
+        {"OFF",
+         false,
+         {{WM_LBUTTONDOWN, MK_LBUTTON, in},
+          {WM_LBUTTONUP, 0, in},
+          {WM_LBUTTONDBLCLK, MK_LBUTTON, in},
+          {WM_LBUTTONUP, 0, in}},
+         {"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}},
         {"OFF", false, {{WM_LBUTTONUP, 0, in}}, {"MouseUp 1"}},  // pressed on the form, released here
-        {"OFF", false, {{WM_RBUTTONDOWN, MK_RBUTTON, in}, {WM_RBUTTONUP, 0, in}, {WM_RBUTTONDBLCLK, MK_RBUTTON, in},
-                        {WM_RBUTTONUP, 0, in}}, {"MouseDown 2", "MouseUp 2", "MouseDown 2", "MouseUp 2"}},
-        {"OFF", false, {{WM_MBUTTONDOWN, MK_MBUTTON, in}, {WM_MBUTTONUP, 0, in}, {WM_MBUTTONDBLCLK, MK_MBUTTON, in}},
+        {"OFF",
+         false,
+         {{WM_RBUTTONDOWN, MK_RBUTTON, in},
+          {WM_RBUTTONUP, 0, in},
+          {WM_RBUTTONDBLCLK, MK_RBUTTON, in},
+          {WM_RBUTTONUP, 0, in}},
+         {"MouseDown 2", "MouseUp 2", "MouseDown 2", "MouseUp 2"}},
+        {"OFF",
+         false,
+         {{WM_MBUTTONDOWN, MK_MBUTTON, in}, {WM_MBUTTONUP, 0, in}, {WM_MBUTTONDBLCLK, MK_MBUTTON, in}},
          {"MouseDown 4", "MouseUp 4", "MouseDown 4"}},
-        {"OFF", false, {{WM_KEYDOWN, VK_SPACE, 0}, {WM_KEYDOWN, 'A', 0}, {WM_KEYUP, VK_SPACE, 0}},  // no click
+        {"OFF",
+         false,
+         {{WM_KEYDOWN, VK_SPACE, 0}, {WM_KEYDOWN, 'A', 0}, {WM_KEYUP, VK_SPACE, 0}},  // no click
          {"KeyDown 32 0", "KeyDown 65 0", "KeyUp 32 0"}},
         {"OFF", false, {{WM_SYSKEYDOWN, 'Q', alt}, {WM_SYSKEYUP, 'Q', alt}}, {"KeyDown 81 4", "KeyUp 81 4"}},
         {"A&&B &C", true, {{WM_SYSCHAR, 'c', alt}}, {"Click"}},
@@ -232,7 +247,8 @@ TEST(XPButtonWindow, HoverFollowsTheRealPointer) {
     EXPECT_TRUE(h.button.button().hovering());
     // Pointer elsewhere: the hover timer (3 ms) notices without any message from the platform.
     ::SetCursorPos(r.right + 200, r.bottom + 100);
-    for (int i = 0; i < 100 && h.button.button().hovering(); ++i) Hosted::Pump(2);
+    for (int i = 0; i < 100 && h.button.button().hovering(); ++i)
+        Hosted::Pump(2);
     EXPECT_FALSE(h.button.button().hovering());
     EXPECT_EQ(h.log, (Log{"MouseOver", "MOUSEOUT"}));
 }
@@ -293,7 +309,8 @@ TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
 
     // A 32 × 32 icon whose mask leaves the left half transparent: those pixels take the fill.
     std::vector<std::uint8_t> andMask(32 * 4, 0), xorMask(32 * 4, 0);
-    for (int row = 0; row < 32; ++row) andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
+    for (int row = 0; row < 32; ++row)
+        andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
     HICON icon = ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data());
     auto iconPicture = win32::GdiPicture::FromIcon(icon);
     ASSERT_NE(iconPicture, nullptr);
