@@ -30,20 +30,17 @@ const Data& TheData() {
         std::mt19937 random(2026);
         std::vector<std::int32_t> keys;
         keys.reserve(kKeys * 2);
-        while (keys.size() < kKeys * 2)
-            keys.push_back(static_cast<std::int32_t>(random()));
+        while (keys.size() < kKeys * 2) keys.push_back(static_cast<std::int32_t>(random()));
         std::sort(keys.begin(), keys.end());
         keys.erase(std::unique(keys.begin(), keys.end()), keys.end());
         std::shuffle(keys.begin(), keys.end(), random);
         d.present.assign(keys.begin(), keys.begin() + kKeys);
         d.absent.assign(keys.begin() + kKeys, keys.end());
-        for (std::int32_t k : d.present)
-            d.sortedLines.push_back(std::to_string(k));
+        for (std::int32_t k : d.present) d.sortedLines.push_back(std::to_string(k));
         std::sort(d.sortedLines.begin(), d.sortedLines.end());
         d.path = "/tmp/vantorel-bench-sw2.def";
         std::ofstream out(d.path, std::ios::binary);
-        for (const auto& line : d.sortedLines)
-            out << line << "\r\n";
+        for (const auto& line : d.sortedLines) out << line << "\r\n";
         return d;
     }();
     return data;
@@ -83,8 +80,7 @@ const std::string& JunkFile(int kind) {
         path = "/tmp/vantorel-bench-junk" + std::to_string(kind) + ".def";
         std::ofstream out(path, std::ios::binary);
         const std::string line = kind == 0 ? "\n" : "x\n";
-        for (std::size_t bytes = 0; bytes < (20u << 20); bytes += line.size())
-            out << line;
+        for (std::size_t bytes = 0; bytes < (20u << 20); bytes += line.size()) out << line;
     }
     return path;
 }

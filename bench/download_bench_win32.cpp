@@ -139,24 +139,20 @@ int main(int argc, char** argv) {
         const int n = 20000;
         MSG msg;
         Clock::time_point start = Clock::now();
-        for (int i = 0; i < n; ++i)
-            ::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE);
+        for (int i = 0; i < n; ++i) ::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE);
         double peek = Seconds(start) / n * 1e6;
         start = Clock::now();
-        for (int i = 0; i < n; ++i)
-            ::GetQueueStatus(QS_ALLINPUT);
+        for (int i = 0; i < n; ++i) ::GetQueueStatus(QS_ALLINPUT);
         double status = Seconds(start) / n * 1e6;
         HANDLE file = ::CreateFileA(dest.c_str(), GENERIC_WRITE, 0, nullptr, CREATE_ALWAYS, 0, nullptr);
         std::string chunk(1024, 'x');
         DWORD written = 0;
         start = Clock::now();
-        for (int i = 0; i < n; ++i)
-            ::WriteFile(file, chunk.data(), 1024, &written, nullptr);
+        for (int i = 0; i < n; ++i) ::WriteFile(file, chunk.data(), 1024, &written, nullptr);
         double write = Seconds(start) / n * 1e6;
         std::string block(64 * 1024, 'y');
         start = Clock::now();
-        for (int i = 0; i < 800; ++i)
-            ::WriteFile(file, block.data(), 64 * 1024, &written, nullptr);
+        for (int i = 0; i < 800; ++i) ::WriteFile(file, block.data(), 64 * 1024, &written, nullptr);
         double write50 = Seconds(start) * 1e3;
         start = Clock::now();
         ::FlushFileBuffers(file);

@@ -65,13 +65,11 @@ const DefinitionList& TheDefinitions() {
         }
         std::vector<std::string> lines;
         lines.reserve(keys.size());
-        for (auto k : keys)
-            lines.push_back(std::to_string(k));
+        for (auto k : keys) lines.push_back(std::to_string(k));
         std::sort(lines.begin(), lines.end());
         lines.erase(std::unique(lines.begin(), lines.end()), lines.end());
         std::string text;
-        for (const auto& l : lines)
-            text += l + "\r\n";
+        for (const auto& l : lines) text += l + "\r\n";
         return DefinitionList::FromText(text);
     }();
     return list;
@@ -132,8 +130,7 @@ struct World {
         if (child == 0) {
             ::close(stop[1]);
             std::vector<int> accepted;
-            for (int i = 0; i < connections; ++i)
-                accepted.push_back(::accept(listener.fd.get(), nullptr, nullptr));
+            for (int i = 0; i < connections; ++i) accepted.push_back(::accept(listener.fd.get(), nullptr, nullptr));
             char byte;
             while (::read(stop[0], &byte, 1) < 0) {}
             ::_exit(0);

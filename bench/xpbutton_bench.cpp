@@ -38,8 +38,7 @@ BENCHMARK(BM_FullPaint)->DenseRange(1, 14);
 void BM_UnforcedRepaint(benchmark::State& state) {
     Setup s(3);
     s.canvas.FillBox(0, 0, 160, 270, 0x123456);
-    for (auto _ : state)
-        s.button.Paint(0, false);
+    for (auto _ : state) s.button.Paint(0, false);
     if (s.canvas.At(80, 135) != 0x123456) state.SkipWithError("an unforced repaint touched the surface");
 }
 BENCHMARK(BM_UnforcedRepaint);

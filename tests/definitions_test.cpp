@@ -19,8 +19,7 @@ std::vector<std::string> Split(const std::string& text, const std::string& delim
 
 std::vector<std::string> Elements(const DefinitionList& list) {
     std::vector<std::string> out;
-    for (std::size_t i = 0; i < list.size(); ++i)
-        out.push_back(list.at(i));
+    for (std::size_t i = 0; i < list.size(); ++i) out.push_back(list.at(i));
     return out;
 }
 
@@ -41,8 +40,7 @@ TEST(FastSplit, SplitsAtTheChosenSeparatorAndNormalisesTheLastPiece) {
         {"aaa", "aa", {"", ""}},  // overlapping finds never cut a negative length
         {"xaaa7", "aa", {"x", "", "7"}},
     };
-    for (const auto& [text, delimiter, pieces] : cases)
-        EXPECT_EQ(Split(text, delimiter), pieces) << text;
+    for (const auto& [text, delimiter, pieces] : cases) EXPECT_EQ(Split(text, delimiter), pieces) << text;
     const std::pair<const char*, const char*> last[] = {{"-77", "-77"},
                                                         {"0042", "42"},
                                                         {"00", "0"},
@@ -85,8 +83,7 @@ TEST(DefinitionList, EveryLineCountsUnsortedFilesStillMatchAndATrailingLineBreak
     for (const auto& [text, keys, found] : cases) {
         DefinitionList list = DefinitionList::FromText(text);
         std::vector<std::int32_t> got;
-        for (std::int32_t key : keys)
-            got.push_back(FindDefinition(list, key));
+        for (std::int32_t key : keys) got.push_back(FindDefinition(list, key));
         EXPECT_EQ(got, found) << text;
     }
     EXPECT_EQ(FindDefinition(DefinitionList::FromText("-9\n12\n5"), "-9"), 0);

@@ -112,8 +112,7 @@ struct MainRig {
     }
     Icons Ticks(int n) {
         frm.icons.clear();
-        for (int i = 0; i < n; ++i)
-            form.TimerTick();
+        for (int i = 0; i < n; ++i) form.TimerTick();
         return frm.icons;
     }
 };

@@ -77,8 +77,7 @@ TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
         OptionsRig rig(registry);
         rig.form.Form_Load();
         std::string got;
-        for (const FakeCheckBox& box : rig.box)
-            got += box.Value() ? '1' : '0';
+        for (const FakeCheckBox& box : rig.box) got += box.Value() ? '1' : '0';
         EXPECT_EQ(got, boxes) << tray << " " << debugger;
     }
 }

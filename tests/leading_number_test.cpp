@@ -25,8 +25,7 @@ TEST(LeadingNumber, ReadsTheNumberAtTheStartAndStopsWhereItCannotGoOn) {
                                                     {"", 0},
                                                     {"-", 0},
                                                     {".", 0}};
-    for (auto [text, number] : cases)
-        EXPECT_EQ(LeadingNumber(text), number) << text;
+    for (auto [text, number] : cases) EXPECT_EQ(LeadingNumber(text), number) << text;
     EXPECT_TRUE(std::isinf(LeadingNumber("1e999")));
 }
 

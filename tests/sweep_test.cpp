@@ -95,8 +95,7 @@ TEST(SweepConnections, TheGrownBufferIsKeptAndFailedOrOverstatedFetchesReadNothi
     EXPECT_EQ(rig.sweep.BufferBytes(), 20'024u);
     rig.sweep.SweepConnections();
     const std::size_t grown = rig.sweep.BufferBytes();
-    for (int i = 0; i < 100; ++i)
-        rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 2, 1) + i));
+    for (int i = 0; i < 100; ++i) rig.table.rows.push_back(Row(kTcpStateEstablished, Ipv4(127, 0, 2, 1) + i));
     rig.sweep.SweepConnections();
     EXPECT_EQ(std::make_pair(rig.sweep.BufferBytes(), rig.sweep.LastSweep().rows), std::make_pair(grown, 5100u));
 

@@ -75,15 +75,13 @@ TEST(XPButtonProperties, NewControlDefaultsAndTheStoreRoundTrip) {
                                                             {"HAND", false},    {"CHECK", true},
                                                             {"VALUE", true},    {"ImageIndex", std::int16_t{7}}};
     PropertyBag bag;
-    for (const auto& [key, value] : stored)
-        bag.Write(key, value);
+    for (const auto& [key, value] : stored) bag.Write(key, value);
     Fixture r(false);
     r.button.ReadProperties(bag);
     PropertyBag again;  // what was read writes back the same
     r.button.WriteProperties(again);
     EXPECT_EQ(again.Keys(), bag.Keys());
-    for (const std::string& key : bag.Keys())
-        EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
+    for (const std::string& key : bag.Keys()) EXPECT_TRUE(*again.Find(key) == *bag.Find(key)) << key;
     EXPECT_EQ(std::make_tuple(r.button.accessKey(), r.host.windowEnabled, r.host.windowFont, r.host.pointer,
                               r.host.mouseIcon, r.button.pictureRect().width),
               std::make_tuple('g', false, font, 11, cursor, 2))
@@ -223,8 +221,7 @@ TEST(XPButtonInput, AccessKeyParsing) {
     // Only the first doubled "&&" is skipped (proved with Alt keys under Wine); the edges here.
     const std::pair<const char*, char> cases[] = {{"&Save", 's'}, {"Save && Exit", 0}, {"Go&", 0}, {"&", 0},
                                                   {"x", 0},       {"E&xit", 'x'}};
-    for (auto [caption, key] : cases)
-        EXPECT_EQ(AccessKeyOf(caption), key) << caption;
+    for (auto [caption, key] : cases) EXPECT_EQ(AccessKeyOf(caption), key) << caption;
 }
 
 }  // namespace

@@ -67,15 +67,13 @@ TEST(XPButtonColour, ShiftBlendAndRounding) {
         {0x808080, -3, false, true, 0x7F7F7F},                // SoftBevel halves toward zero: −3 → −1
         {0x808080, 47, false, true, 0x979797},                // 47 → 23
     };
-    for (auto [from, amount, blue, soft, to] : shifts)
-        EXPECT_EQ(ShiftColor(from, amount, blue, soft), to) << from;
+    for (auto [from, amount, blue, soft, to] : shifts) EXPECT_EQ(ShiftColor(from, amount, blue, soft), to) << from;
     EXPECT_EQ(BlendToWhite(MakeRgb(10, 36, 106), 176),  // c × (255 − a) / 255 + a, truncating
               MakeRgb(10 * 79 / 255 + 176, 36 * 79 / 255 + 176, 106 * 79 / 255 + 176));
     EXPECT_EQ(BlendToWhite(0xFFFFFF, 128), 0xFFFFFFu);
     const std::pair<double, int> halves[] = {{0.5, 0},   {1.5, 2},   {-0.5, 0}, {-1.5, -2},
                                              {-2.5, -2}, {76.5, 76}, {2.6, 3}};
-    for (auto [value, rounded] : halves)
-        EXPECT_EQ(RoundHalfEven(value), rounded) << value;
+    for (auto [value, rounded] : halves) EXPECT_EQ(RoundHalfEven(value), rounded) << value;
 }
 
 TEST(XPButtonColour, PaletteBySchemes) {
@@ -323,8 +321,7 @@ TEST(XPButtonPictures, BlitPictureRules) {
     MemoryPicture picture(platform::PictureKind::kBitmap, 4, 1, px);
     auto row = [&](int y, int n = 4) {
         std::vector<Rgb> out;
-        for (int x = 0; x < n; ++x)
-            out.push_back(l.At(x, y));
+        for (int x = 0; x < n; ++x) out.push_back(l.At(x, y));
         return out;
     };
     l.button.BlitPicture(0, 0, 4, 1, picture, kKey, -1, false, false, false);

@@ -109,8 +109,7 @@ void RunPaintBenchmark() {
         button.SetButtonType(type == 15 ? 3 : type);
         const int rounds = type == 15 ? 1000000 : 200;
         const auto start = now();
-        for (int i = 0; i < rounds; ++i)
-            button.Paint(0, type != 15);
+        for (int i = 0; i < rounds; ++i) button.Paint(0, type != 15);
         const double us = static_cast<double>(now() - start) * 1e6 / static_cast<double>(frequency.QuadPart) / rounds;
         if (type == 15) {
             std::printf("unforced repaint, nothing changed: %.4f us\n", us);
@@ -182,8 +181,7 @@ public:
 
     void Show() {
         ::ShowWindow(hwnd_, SW_SHOW);
-        for (auto& live : live_)
-            live->Show();
+        for (auto& live : live_) live->Show();
         ::UpdateWindow(hwnd_);
     }
 

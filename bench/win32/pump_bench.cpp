@@ -14,8 +14,7 @@ double MicrosecondsPerCall(bool (*call)(vantorel::win32::Win32MessagePump&), int
     LARGE_INTEGER frequency, start, end;
     ::QueryPerformanceFrequency(&frequency);
     ::QueryPerformanceCounter(&start);
-    for (int i = 0; i < calls; ++i)
-        call(pump);
+    for (int i = 0; i < calls; ++i) call(pump);
     ::QueryPerformanceCounter(&end);
     return static_cast<double>(end.QuadPart - start.QuadPart) * 1e6 / static_cast<double>(frequency.QuadPart) / calls;
 }
@@ -26,8 +25,7 @@ int main() {
     HWND window =
         ::CreateWindowExA(0, "STATIC", "pump", WS_OVERLAPPED, 0, 0, 10, 10, nullptr, nullptr, nullptr, nullptr);
     MSG message;
-    while (::PeekMessageA(&message, nullptr, 0, 0, PM_REMOVE))
-        ::DispatchMessageA(&message);
+    while (::PeekMessageA(&message, nullptr, 0, 0, PM_REMOVE)) ::DispatchMessageA(&message);
     double every = MicrosecondsPerCall([](vantorel::win32::Win32MessagePump& p) { return p.PumpMessages(); }, 20000);
     double yield =
         MicrosecondsPerCall([](vantorel::win32::Win32MessagePump& p) { return p.YieldToMessages(); }, 2000000);

@@ -166,7 +166,6 @@ int WINAPI WinMain(HINSTANCE instance, HINSTANCE, LPSTR, int) {
     report();
 
     MSG message;
-    while (::GetMessageA(&message, nullptr, 0, 0) > 0)
-        win32::DispatchQueuedMessage(message);
+    while (::GetMessageA(&message, nullptr, 0, 0) > 0) win32::DispatchQueuedMessage(message);
     return static_cast<int>(message.wParam);
 }

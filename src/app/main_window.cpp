@@ -169,12 +169,9 @@ void MainWindow::ApplyDpi(UINT dpi) {
     ::SetWindowPos(onOff_.hwnd(), nullptr, r.left, r.top, r.right - r.left, r.bottom - r.top,
                    SWP_NOZORDER | SWP_NOACTIVATE);
     onOff_.SetDpi(dpi);
-    for (auto& frame : uf_)
-        frame->Relayout(dpi, font_.get());
-    for (auto& label : l_)
-        label->Relayout(dpi, font_.get());
-    for (auto& button : btnO_)
-        button->Relayout(dpi, font_.get());
+    for (auto& frame : uf_) frame->Relayout(dpi, font_.get());
+    for (auto& label : l_) label->Relayout(dpi, font_.get());
+    for (auto& button : btnO_) button->Relayout(dpi, font_.get());
 
     HINSTANCE instance = reinterpret_cast<HINSTANCE>(::GetWindowLongPtrA(hwnd_, GWLP_HINSTANCE));
     const int ids[3] = {IDI_BULB_DARK, IDI_BULB_LIT, IDI_PADLOCK};

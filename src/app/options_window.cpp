@@ -120,12 +120,9 @@ void OptionsWindow::ApplyDpi(UINT dpi) {
     dpi_ = dpi;
     UniqueHfont old = std::move(font_);  // deleted once every control has the new one
     font_.reset(CreateDesignFont(dpi));
-    for (auto& frame : frames_)
-        frame->Relayout(dpi, font_.get());
-    for (auto& box : boxes_)
-        box->Relayout(dpi, font_.get());
-    for (auto& label : labels_)
-        label->Relayout(dpi, font_.get());
+    for (auto& frame : frames_) frame->Relayout(dpi, font_.get());
+    for (auto& box : boxes_) box->Relayout(dpi, font_.get());
+    for (auto& label : labels_) label->Relayout(dpi, font_.get());
     hint_->Relayout(dpi, font_.get());
     update_->Relayout(dpi, font_.get());
     close_->Relayout(dpi, font_.get());

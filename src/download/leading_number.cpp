@@ -9,13 +9,11 @@ namespace vantorel {
 double LeadingNumber(const std::string& text) {
     std::size_t i = 0;
     const std::size_t n = text.size();
-    while (i < n && (text[i] == ' ' || text[i] == '\t'))
-        ++i;
+    while (i < n && (text[i] == ' ' || text[i] == '\t')) ++i;
     const std::size_t start = i;
     auto digits = [&] {
         std::size_t from = i;
-        while (i < n && std::isdigit(static_cast<unsigned char>(text[i])))
-            ++i;
+        while (i < n && std::isdigit(static_cast<unsigned char>(text[i]))) ++i;
         return i - from;
     };
     if (i < n && (text[i] == '+' || text[i] == '-')) ++i;

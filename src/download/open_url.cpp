@@ -11,8 +11,7 @@ bool OpenURL(platform::HttpTransfer& Inet, platform::MessagePump& pump, const st
     std::string header, body, chunk;
     bool ok = Inet.ExecuteGet("", error);
     if (ok) {
-        while (Inet.StillExecuting())
-            pump.YieldToMessages();
+        while (Inet.StillExecuting()) pump.YieldToMessages();
         ok = Inet.GetHeader(header, error);
     }
     while (ok && body.size() < limit) {

@@ -47,8 +47,7 @@ std::string PlainDecimal(double value) {
     std::snprintf(buffer, sizeof buffer, std::fabs(value) >= 1 ? "%.0f" : "%.17f", value);
     std::string text = buffer;
     if (text.find('.') != std::string::npos) {
-        while (text.back() == '0')
-            text.pop_back();
+        while (text.back() == '0') text.pop_back();
         if (text.back() == '.') text.pop_back();
     }
     return text;
@@ -62,8 +61,7 @@ std::optional<std::string> ReadLeadingNumber(std::string_view text) {
     chars.reserve(std::min<std::size_t>(text.size(), 64));
     std::size_t i = 0;
     auto next = [&]() -> char {
-        while (i < text.size() && IsSkippedBlank(text[i]))
-            ++i;
+        while (i < text.size() && IsSkippedBlank(text[i])) ++i;
         return i < text.size() ? text[i] : '\0';
     };
 
@@ -93,15 +91,13 @@ std::optional<std::string> ReadLeadingNumber(std::string_view text) {
         c = next();
     }
     std::string whole;
-    for (; IsDigit(c); ++i, c = next())
-        whole.push_back(c);
+    for (; IsDigit(c); ++i, c = next()) whole.push_back(c);
     std::string fraction;
     bool point = false;
     if (c == '.') {
         point = true;
         ++i;
-        for (c = next(); IsDigit(c); ++i, c = next())
-            fraction.push_back(c);
+        for (c = next(); IsDigit(c); ++i, c = next()) fraction.push_back(c);
     }
     if (whole.empty() && fraction.empty()) return std::nullopt;
 
@@ -117,8 +113,7 @@ std::optional<std::string> ReadLeadingNumber(std::string_view text) {
             c = next();
         }
         std::size_t signLength = digits.size();
-        for (; IsDigit(c); ++i, c = next())
-            digits.push_back(c);
+        for (; IsDigit(c); ++i, c = next()) digits.push_back(c);
         if (digits.size() > signLength) exponent = digits;
         else i = save;
     }
@@ -197,8 +192,7 @@ std::string_view FormatKey(std::int32_t key, char* buffer) {
     } while (magnitude != 0);
     std::size_t length = 0;
     if (key < 0) buffer[length++] = '-';
-    while (n > 0)
-        buffer[length++] = digits[--n];
+    while (n > 0) buffer[length++] = digits[--n];
     return std::string_view(buffer, length);
 }
 
@@ -318,8 +312,7 @@ void DefinitionList::BuildIndex() {
     // counting the changes from one key to the next counts them (a file out of order only gets a
     // roomier index).
     std::size_t distinct = 0;
-    for (std::size_t k = 0; k < keys_.size(); ++k)
-        distinct += k == 0 || keys_[k] != keys_[k - 1] ? 1 : 0;
+    for (std::size_t k = 0; k < keys_.size(); ++k) distinct += k == 0 || keys_[k] != keys_[k - 1] ? 1 : 0;
     buckets_.assign(distinct / 6 + 1, Bucket{});  // at most 6 of 8 slots filled on average
     std::vector<std::int32_t> repeated;
     std::size_t k = 0;

@@ -27,8 +27,7 @@ std::string StringOf(const Bytes& data, std::uint32_t count) {
 // The first four bytes, little-endian; a shorter value reads as if the rest of the buffer were zero.
 std::int32_t DwordOf(const Bytes& data, std::uint32_t count) {
     std::uint32_t value = 0;
-    for (std::uint32_t i = 0; i < 4 && i < count && i < data.size(); ++i)
-        value |= std::uint32_t{data[i]} << (8 * i);
+    for (std::uint32_t i = 0; i < 4 && i < count && i < data.size(); ++i) value |= std::uint32_t{data[i]} << (8 * i);
     return static_cast<std::int32_t>(value);
 }
 

@@ -21,8 +21,7 @@ std::string ServerAddress(platform::Registry& registry) {
     reg.hkey(platform::kHkeyLocalMachine);
     reg.KeyRoot(kSettingsKey);
     std::string address = VariantText(reg.GetRegistryValue(kServerValue, std::string(kDefaultServerAddress)));
-    while (!address.empty() && (address.back() == '/' || address.back() == ' '))
-        address.pop_back();
+    while (!address.empty() && (address.back() == '/' || address.back() == ' ')) address.pop_back();
     return address.empty() ? std::string(kDefaultServerAddress) : address;
 }
 

@@ -31,11 +31,9 @@ void RegistryContract::DeleteTree(const std::string& path) {
     if (registry_->OpenKey(platform::RootKey(kHkeyCurrentUser), path, platform::kKeyAllAccess, key) != 0) return;
     std::vector<std::string> children;
     std::string name;
-    for (std::uint32_t i = 0; registry_->EnumKey(key, i, 260, name) == 0; ++i)
-        children.push_back(name);
+    for (std::uint32_t i = 0; registry_->EnumKey(key, i, 260, name) == 0; ++i) children.push_back(name);
     registry_->CloseKey(key);
-    for (const auto& child : children)
-        DeleteTree(path + "\\" + child);
+    for (const auto& child : children) DeleteTree(path + "\\" + child);
     registry_->DeleteKey(platform::RootKey(kHkeyCurrentUser), path);
 }
 

@@ -21,8 +21,7 @@ bool FakeButtonHost::CaptureParentPixels(std::int32_t w, std::int32_t h, std::ve
     const std::int32_t stride = platform::DibStride(w);
     pixels.assign(static_cast<std::size_t>(stride) * h, 0);
     for (std::int32_t row = 0; row < h; ++row)
-        for (std::int32_t col = 0; col < w; ++col)
-            PutDibPixel(pixels, stride, row, col, parentPixel);
+        for (std::int32_t col = 0; col < w; ++col) PutDibPixel(pixels, stride, row, col, parentPixel);
     return true;
 }
 

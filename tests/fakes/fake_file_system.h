@@ -88,8 +88,7 @@ public:
 
 private:
     static std::string Trim(std::string path) {
-        while (!path.empty() && path.back() == '\\')
-            path.pop_back();
+        while (!path.empty() && path.back() == '\\') path.pop_back();
         return path;
     }
 

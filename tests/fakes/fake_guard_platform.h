@@ -29,12 +29,10 @@ constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std
 // A sorted definitions list holding the given address fields.
 inline DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
     std::vector<std::string> keys;
-    for (auto a : addresses)
-        keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
+    for (auto a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
     std::sort(keys.begin(), keys.end());
     std::string text;
-    for (const auto& k : keys)
-        text += k + "\r\n";
+    for (const auto& k : keys) text += k + "\r\n";
     return DefinitionList::FromText(text);
 }
 

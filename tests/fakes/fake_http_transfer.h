@@ -31,8 +31,7 @@ public:
     }
     static std::string Body(std::size_t size) {
         std::string data(size, '\0');
-        for (std::size_t i = 0; i < size; ++i)
-            data[i] = static_cast<char>((i * 7 + i / 251) & 0xFF);
+        for (std::size_t i = 0; i < size; ++i) data[i] = static_cast<char>((i * 7 + i / 251) & 0xFF);
         return data;
     }
 

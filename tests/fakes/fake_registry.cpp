@@ -14,8 +14,7 @@ FakeRegistry::FakeRegistry() {
 
 std::string FakeRegistry::Lower(const std::string& text) {
     std::string lower = text;
-    for (char& c : lower)
-        c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
+    for (char& c : lower) c = static_cast<char>(std::tolower(static_cast<unsigned char>(c)));
     return lower;
 }
 
@@ -35,8 +34,7 @@ FakeRegistry::Node* FakeRegistry::Walk(Node* from, const std::string& path, bool
         if (c == '\\') parts.emplace_back();
         else parts.back().push_back(c);
     }
-    while (!parts.empty() && parts.back().empty())
-        parts.pop_back();  // trailing separators name the same key
+    while (!parts.empty() && parts.back().empty()) parts.pop_back();  // trailing separators name the same key
     Node* node = from;
     for (const std::string& name : parts) {
         if (name.empty()) {
@@ -92,8 +90,7 @@ std::int32_t FakeRegistry::DeleteKey(RegKey parent, const std::string& path) {
     Node* from = NodeOf(parent);
     if (from == nullptr) return 6;
     std::string trimmed = path;
-    while (!trimmed.empty() && trimmed.back() == '\\')
-        trimmed.pop_back();
+    while (!trimmed.empty() && trimmed.back() == '\\') trimmed.pop_back();
     std::size_t cut = trimmed.rfind('\\');
     std::string parentPath = cut == std::string::npos ? std::string() : trimmed.substr(0, cut);
     std::string leaf = cut == std::string::npos ? trimmed : trimmed.substr(cut + 1);

@@ -22,8 +22,7 @@ void RasterCanvas::Clear() {
 
 void RasterCanvas::FillBox(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h, Rgb c) {
     for (std::int32_t j = std::max(y, 0); j < std::min(y + h, h_); ++j)
-        for (std::int32_t i = std::max(x, 0); i < std::min(x + w, w_); ++i)
-            Set(i, j, c);
+        for (std::int32_t i = std::max(x, 0); i < std::min(x + w, w_); ++i) Set(i, j, c);
 }
 
 void RasterCanvas::FrameBox(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h, Rgb c) {

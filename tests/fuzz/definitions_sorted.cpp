@@ -44,8 +44,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     }
     std::sort(lines.begin(), lines.end());
     std::string text;
-    for (std::size_t i = 0; i < lines.size(); ++i)
-        text += (i == 0 ? "" : separator) + lines[i];
+    for (std::size_t i = 0; i < lines.size(); ++i) text += (i == 0 ? "" : separator) + lines[i];
     if (finalBreak) text += separator;
 
     std::vector<std::string> split;
@@ -60,8 +59,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
         if (key != INT32_MIN) keys.emplace_back(FormatKey(key - 1, buffer));
         if (key != INT32_MAX) keys.emplace_back(FormatKey(key + 1, buffer));
     }
-    for (const std::string& key : {"0", "-1", "", "-", "00", "-0", "2147483648", "-2147483648"})
-        keys.push_back(key);
+    for (const std::string& key : {"0", "-1", "", "-", "00", "-0", "2147483648", "-2147483648"}) keys.push_back(key);
     for (const std::string& key : keys) {
         const std::int32_t expected = HalvingSearch(split, key);
         if (FindDefinition(list, key) != expected) std::abort();

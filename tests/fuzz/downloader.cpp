@@ -52,8 +52,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     std::string header = in.ConsumeBool() ? in.PickValueInArray(statuses) : in.ConsumeRandomLengthString(24);
     const std::string pattern = in.ConsumeRandomLengthString(16);
     const std::size_t bodySize = pattern.empty() ? 0 : in.ConsumeIntegralInRange<std::size_t>(0, 20000);
-    for (std::size_t i = 0; i < bodySize; ++i)
-        inet.body.push_back(pattern[i % pattern.size()]);
+    for (std::size_t i = 0; i < bodySize; ++i) inet.body.push_back(pattern[i % pattern.size()]);
     std::optional<std::int64_t> announced;  // the size when it is sent as a plain number
     switch (in.ConsumeIntegralInRange(0, 3)) {
         case 0: announced = static_cast<std::int64_t>(bodySize); break;

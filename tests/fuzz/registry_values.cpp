@@ -19,8 +19,7 @@ Bytes SomeBytes(FuzzedDataProvider& in) {
     Bytes pattern = in.ConsumeBytes<std::uint8_t>(in.ConsumeIntegralInRange<std::size_t>(0, 16));
     std::size_t size = in.ConsumeBool() ? in.ConsumeIntegralInRange<std::size_t>(0, 9000) : pattern.size();
     Bytes bytes(size, 0);
-    for (std::size_t i = 0; i < size && !pattern.empty(); ++i)
-        bytes[i] = pattern[i % pattern.size()];
+    for (std::size_t i = 0; i < size && !pattern.empty(); ++i) bytes[i] = pattern[i % pattern.size()];
     return bytes;
 }
 

@@ -185,8 +185,7 @@ TEST_F(RealTeardown, WithoutTheRightToTearDownNothingIsCounted) {
         FakeGuardView view;
         std::int32_t count = 5;
         ConnectionSweep sweep(SweepServices{table, pump, registry, view}, list, count);
-        for (int i = 0; i < 3; ++i)
-            sweep.SweepConnections();
+        for (int i = 0; i < 3; ++i) sweep.SweepConnections();
         ::_exit(sweep.LastSweep().requested != 1 ? 11 : count != 5 ? 12 : !view.shown.empty() ? 13 : 0);
     }
     int status = 0;

@@ -35,8 +35,7 @@ const auto Pattern = testing::FakeHttpTransfer::Body;
 // The loopback server whose port the fixture wrote to `file`.
 std::string Server(const std::string& scheme, const std::string& file) {
     std::string port = ReadFile("Z:" + file);
-    while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back())))
-        port.pop_back();
+    while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back()))) port.pop_back();
     return scheme + "://127.0.0.1:" + port;
 }
 
@@ -54,8 +53,7 @@ UINT_PTR CancelAfter(FileDownloader& fd, UINT ms) {
 
 std::string Progress(std::initializer_list<int> steps) {
     std::string out;
-    for (int p : steps)
-        out += "progress:" + std::to_string(p) + " ";
+    for (int p : steps) out += "progress:" + std::to_string(p) + " ";
     return out + "complete ";
 }
 
@@ -77,8 +75,7 @@ protected:
         fd_.DownloadProgress = [this](const std::string& s) { events_ += "progress:" + s + " "; };
     }
     void TearDown() override {
-        for (const char* name : {"\\sw2.def", "\\new\\sw2.def"})
-            ::DeleteFileA((folder_ + name).c_str());
+        for (const char* name : {"\\sw2.def", "\\new\\sw2.def"}) ::DeleteFileA((folder_ + name).c_str());
         ::RemoveDirectoryA((folder_ + "\\new").c_str());
         EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
     }

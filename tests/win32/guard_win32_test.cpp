@@ -44,8 +44,7 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     ModifyTrayIcon(tray, window, std::string(100, 'x'), kTrayCallbackMessage);  // cut to the field
     RemoveTrayIcon(tray, window);
     ASSERT_EQ(tray.calls.size(), 4u);
-    for (const auto& call : tray.calls)
-        EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
+    for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
     EXPECT_EQ(tray.calls[2].tip, std::string(63, 'x')) << "the tip handed to the shell fits its 64-byte field";
 
     // A restarted taskbar announces itself with the registered message: the icon is added again.
@@ -70,8 +69,7 @@ TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     // A loop that only yields, as a long sweep does: the timer's ticks still arrive.
     win32::Win32MessagePump pump;
     DWORD until = ::GetTickCount() + 3000;
-    while (ticks < 3 && ::GetTickCount() < until)
-        ASSERT_TRUE(pump.YieldToMessages());
+    while (ticks < 3 && ::GetTickCount() < until) ASSERT_TRUE(pump.YieldToMessages());
     EXPECT_GE(ticks, 3);
     window.Timer().SetEnabled(false);
 
@@ -79,8 +77,7 @@ TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
     ::PostQuitMessage(7);
     until = ::GetTickCount() + 3000;
     bool going = true;
-    while (going && ::GetTickCount() < until)
-        going = pump.YieldToMessages();
+    while (going && ::GetTickCount() < until) going = pump.YieldToMessages();
     EXPECT_FALSE(going);
     EXPECT_FALSE(pump.PumpMessages()) << "stays quitting";
     MSG quit;

@@ -187,8 +187,7 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
     std::vector<HWND> focus;
     std::string pressed;
     const char keys[] = "TEHUO";
-    for (int i = 0; i < 5; ++i)
-        window.BtnO(i).Click = [&, i] { pressed += keys[i]; };
+    for (int i = 0; i < 5; ++i) window.BtnO(i).Click = [&, i] { pressed += keys[i]; };
     std::size_t step = 0;
     win32::Ticker user(60, [&] {
         if (step < 7) focus.push_back(::GetFocus());

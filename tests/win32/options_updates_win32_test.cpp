@@ -94,8 +94,7 @@ protected:
 
 TEST_F(OptionsUpdatesTest, FetchesNewerDefinitionsAndPaintsProgress) {
     std::string definitions;
-    for (int i = 0; i < 20000; ++i)
-        definitions += std::to_string(-2000000 + i * 11) + "\r\n";
+    for (int i = 0; i < 20000; ++i) definitions += std::to_string(-2000000 + i * 11) + "\r\n";
     Serve("defver", "21\n");
     Serve("sw2.def", definitions);
     Serve("mainver", "1.0\n");
@@ -156,8 +155,7 @@ TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndFailuresKeepTheInstalledVe
         else ::DeleteFileA((folder_ + "\\defver").c_str());
         WriteFile(folder_ + "\\sw2.def", installed);
         ::DeleteFileA((folder_ + "\\VTSetup.exe").c_str());
-        for (const char* name : {"sw2.def", "VTSetup.exe"})
-            ::DeleteFileA((www_ + name).c_str());
+        for (const char* name : {"sw2.def", "VTSetup.exe"}) ::DeleteFileA((www_ + name).c_str());
         Serve("defver", c.defver);
         Serve("mainver", c.mainver);
         if (c.sw2) Serve("sw2.def", c.sw2);

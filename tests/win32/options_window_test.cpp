@@ -41,8 +41,7 @@ std::wstring StoredTask(bool remove = false) {
     for (IUnknown* object :
          {static_cast<IUnknown*>(task), static_cast<IUnknown*>(folder), static_cast<IUnknown*>(service)})
         if (object != nullptr) object->Release();
-    for (BSTR b : {root, name, xml})
-        ::SysFreeString(b);
+    for (BSTR b : {root, name, xml}) ::SysFreeString(b);
     if (SUCCEEDED(com)) ::CoUninitialize();
     return text;
 }

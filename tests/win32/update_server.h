@@ -37,12 +37,10 @@ protected:
         const char* dir = std::getenv("VANTOREL_NGINX_DIR");
         ASSERT_NE(dir, nullptr) << "VANTOREL_NGINX_DIR is not set";
         port_ = ReadFile(std::string("Z:") + dir + "/server.port");
-        while (!port_.empty() && (port_.back() == '\n' || port_.back() == '\r'))
-            port_.pop_back();
+        while (!port_.empty() && (port_.back() == '\n' || port_.back() == '\r')) port_.pop_back();
         ASSERT_FALSE(port_.empty()) << "nginx is not running";
         www_ = std::string("Z:") + dir + "/www/vt/";
-        for (const char* name : {"defver", "sw2.def", "mainver", "VTSetup.exe"})
-            ::DeleteFileA((www_ + name).c_str());
+        for (const char* name : {"defver", "sw2.def", "mainver", "VTSetup.exe"}) ::DeleteFileA((www_ + name).c_str());
         // The address goes through the setting, as the program reads it.
         SetServer("http://127.0.0.1:" + port_ + "/");
 
@@ -55,8 +53,7 @@ protected:
     }
 
     void TearDown() override {
-        for (const char* name : {"\\defver", "\\sw2.def", "\\VTSetup.exe"})
-            ::DeleteFileA((folder_ + name).c_str());
+        for (const char* name : {"\\defver", "\\sw2.def", "\\VTSetup.exe"}) ::DeleteFileA((folder_ + name).c_str());
         EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
         RegistryRoutines reg(registry_);
         reg.hkey(platform::kHkeyLocalMachine);

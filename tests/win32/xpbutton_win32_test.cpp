@@ -146,8 +146,7 @@ struct Hosted {
         MSG msg;
         for (int i = 0; i < rounds; ++i) {
             if (i > 0) ::Sleep(5);
-            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE))
-                win32::DispatchQueuedMessage(msg);
+            while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) win32::DispatchQueuedMessage(msg);
         }
     }
     void Send(UINT message, WPARAM wParam = 0, LPARAM lParam = MAKELPARAM(10, 10)) {
@@ -247,8 +246,7 @@ TEST(XPButtonWindow, HoverFollowsTheRealPointer) {
     EXPECT_TRUE(h.button.button().hovering());
     // Pointer elsewhere: the hover timer (3 ms) notices without any message from the platform.
     ::SetCursorPos(r.right + 200, r.bottom + 100);
-    for (int i = 0; i < 100 && h.button.button().hovering(); ++i)
-        Hosted::Pump(2);
+    for (int i = 0; i < 100 && h.button.button().hovering(); ++i) Hosted::Pump(2);
     EXPECT_FALSE(h.button.button().hovering());
     EXPECT_EQ(h.log, (Log{"MouseOver", "MOUSEOUT"}));
 }
@@ -309,8 +307,7 @@ TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
 
     // A 32 × 32 icon whose mask leaves the left half transparent: those pixels take the fill.
     std::vector<std::uint8_t> andMask(32 * 4, 0), xorMask(32 * 4, 0);
-    for (int row = 0; row < 32; ++row)
-        andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
+    for (int row = 0; row < 32; ++row) andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
     HICON icon = ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data());
     auto iconPicture = win32::GdiPicture::FromIcon(icon);
     ASSERT_NE(iconPicture, nullptr);

@@ -94,8 +94,7 @@ void KirelXPButton::BlitPicture(std::int32_t x, std::int32_t y, std::int32_t w, 
                 const auto gb = static_cast<std::uint8_t>(std::clamp(g, 0, 255));
                 d[0] = d[1] = d[2] = gb;
             } else if (blend) {
-                for (int k = 0; k < 3; ++k)
-                    d[k] = static_cast<std::uint8_t>((2 * s[k] + d[k]) / 3);
+                for (int k = 0; k < 3; ++k) d[k] = static_cast<std::uint8_t>((2 * s[k] + d[k]) / 3);
             } else {
                 d[0] = s[0];
                 d[1] = s[1];

@@ -15,8 +15,7 @@ platform::FileError LastError() {
 
 // "C:\dir\" names the folder "C:\dir"; a drive root keeps its backslash.
 std::string FolderName(std::string path) {
-    while (path.size() > 1 && path.back() == '\\' && !(path.size() == 3 && path[1] == ':'))
-        path.pop_back();
+    while (path.size() > 1 && path.back() == '\\' && !(path.size() == 3 && path[1] == ':')) path.pop_back();
     return path;
 }
 
