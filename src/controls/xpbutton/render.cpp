@@ -287,20 +287,19 @@ void KirelXPButton::DrawFace(Face face) {
                 DrawCaption(h);
                 c.FrameBox(0, 0, W, H, kXpBorder);
                 Corners(kXpCorner);
+                // The coloured rim of a hovered (orange) or focused (blue) XP button.
+                auto rim = [&](Rgb frame, Rgb bottom, Rgb top, Rgb second, Rgb sides) {
+                    c.FrameBox(1, 2, W - 2, H - 4, frame);
+                    c.DrawLine(2, H - 2, W - 2, H - 2, bottom);
+                    c.DrawLine(2, 1, W - 2, 1, top);
+                    c.DrawLine(1, 2, W - 1, 2, second);
+                    c.DrawLine(2, 3, 2, H - 3, sides);
+                    c.DrawLine(W - 3, 3, W - 3, H - 3, sides);
+                };
                 if (hover_) {
-                    c.FrameBox(1, 2, W - 2, H - 4, 0x31B2FF);
-                    c.DrawLine(2, H - 2, W - 2, H - 2, 0x0096E7);
-                    c.DrawLine(2, 1, W - 2, 1, 0xCEF3FF);
-                    c.DrawLine(1, 2, W - 1, 2, 0x8CDBFF);
-                    c.DrawLine(2, 3, 2, H - 3, 0x6BCBFF);
-                    c.DrawLine(W - 3, 3, W - 3, H - 3, 0x6BCBFF);
+                    rim(0x31B2FF, 0x0096E7, 0xCEF3FF, 0x8CDBFF, 0x6BCBFF);
                 } else if ((hasFocus_ || host_.IsDefault()) && showFocusRect_) {
-                    c.FrameBox(1, 2, W - 2, H - 4, 0xE7AE8C);
-                    c.DrawLine(2, H - 2, W - 2, H - 2, 0xEF826B);
-                    c.DrawLine(2, 1, W - 2, 1, 0xFFE7CE);
-                    c.DrawLine(1, 2, W - 1, 2, 0xF7D7BD);
-                    c.DrawLine(2, 3, 2, H - 3, 0xF0D1B5);
-                    c.DrawLine(W - 3, 3, W - 3, H - 3, 0xF0D1B5);
+                    rim(0xE7AE8C, 0xEF826B, 0xFFE7CE, 0xF7D7BD, 0xF0D1B5);
                 } else {
                     c.DrawLine(2, H - 2, W - 2, H - 2, SB(b, -48));
                     c.DrawLine(1, H - 3, W - 2, H - 3, SB(b, -32));
