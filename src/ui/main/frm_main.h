@@ -92,7 +92,6 @@ public:
     // The help page's address: the web server's base address + "/vt/help.php".
     std::string HelpAddress() const;
 
-    std::int32_t LightPhase() const { return lightPhase_; }
     bool Unloaded() const { return unloaded_; }
     Guard& guard() { return guard_; }
 
