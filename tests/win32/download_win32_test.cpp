@@ -147,8 +147,8 @@ TEST_F(WinInetDownload, RefusalsCutsAndUnusableSizesLeaveTheInstalledFile) {
                                                          {"/twolengths/3000/5000", "both 3000 and 5000"}};
     for (const auto& [path, named] : sizes) {
         EXPECT_FALSE(Get(path));
-        EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;
-        EXPECT_NE(events_.find(named), std::string::npos) << events_;
+        EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << path << ": " << events_;
+        EXPECT_NE(events_.find(named), std::string::npos) << path << ": " << events_;
     }
     EXPECT_TRUE(Get("/auth/3000", "vt", "secret")) << "the protected file with the right credentials";
     EXPECT_EQ(ReadFile(dest_), Pattern(3000));
