@@ -100,12 +100,8 @@ class Handler(BaseHTTPRequestHandler):
                     self.answer(401, b"who are you?", extra=[("WWW-Authenticate", 'Basic realm="vt"')])
             elif kind in ("cut", "length"):  # announces N (or TEXT), sends SENT (or N) bytes and closes
                 announced, n = (args[0], int(args[1])) if kind == "length" else (args[0], int(args[0]))
-                # Said to close: Wine's WinINet reads "abc" or "1e999" as a small length and would
-                # otherwise pool the connection with the rest of the body unread, to be taken as
-                # the next answer.
                 self.send_response(200)
                 self.send_header("Content-Length", announced)
-                self.send_header("Connection", "close")
                 self.end_headers()
                 self.wfile.write(body(n)[:int(args[1])])
                 self.cut()

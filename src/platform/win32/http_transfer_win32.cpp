@@ -200,97 +200,109 @@ void WinInetTransfer::Work(std::shared_ptr<Shared> shared, Request request, std:
                                             request.password.empty() ? nullptr : request.password.c_str(),
                                             INTERNET_SERVICE_HTTP, 0, 0));
     }
+    // Sends the request and reads the answer's header; false when a call failed (its code in
+    // `sendFailure`) or the transfer was cancelled first.
     HINTERNET opened = nullptr;
-    if (connection) {
-        DWORD flags = INTERNET_FLAG_RELOAD | INTERNET_FLAG_NO_CACHE_WRITE | INTERNET_FLAG_NO_UI |
-                      INTERNET_FLAG_NO_COOKIES | (request.secure ? INTERNET_FLAG_SECURE : 0);
-        opened = ::HttpOpenRequestA(connection.get(), "GET", request.path.c_str(), nullptr, nullptr, nullptr, flags, 0);
-    }
-    bool stopped = false;
-    {
-        std::lock_guard<std::mutex> lock(shared->mutex);
-        stopped = shared->stop;
-    }
-
-    if (opened == nullptr) {
-        fail(::GetLastError());
-    } else if (stopped) {
-        // Cancelled before the request went out.
-    } else if (!::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()), nullptr,
-                                   0)) {
-        fail(::GetLastError());
-    } else {
-        std::string header(4096, '\0');
+    std::string header;
+    DWORD sendFailure = 0;
+    auto send = [&] {
+        if (opened != nullptr) ::InternetCloseHandle(opened);
+        opened = nullptr;
+        if (connection) {
+            DWORD flags = INTERNET_FLAG_RELOAD | INTERNET_FLAG_NO_CACHE_WRITE | INTERNET_FLAG_NO_UI |
+                          INTERNET_FLAG_NO_COOKIES | (request.secure ? INTERNET_FLAG_SECURE : 0);
+            opened =
+                ::HttpOpenRequestA(connection.get(), "GET", request.path.c_str(), nullptr, nullptr, nullptr, flags, 0);
+        }
+        if (opened == nullptr) {
+            sendFailure = ::GetLastError();
+            return false;
+        }
+        {
+            std::lock_guard<std::mutex> lock(shared->mutex);
+            if (shared->stop) return false;  // cancelled before the request went out
+        }
+        header.assign(4096, '\0');
         DWORD length = static_cast<DWORD>(header.size());
-        BOOL ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
+        BOOL ok = ::HttpSendRequestA(opened, request.headers.c_str(), static_cast<DWORD>(request.headers.size()),
+                                     nullptr, 0) &&
+                  ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
         if (!ok && ::GetLastError() == ERROR_INSUFFICIENT_BUFFER) {
             header.resize(length + 1);
             ok = ::HttpQueryInfoA(opened, HTTP_QUERY_RAW_HEADERS_CRLF, header.data(), &length, nullptr);
         }
-        if (!ok) {
-            fail(::GetLastError());
-        } else {
-            header.resize(length);
-            shared->Publish([&] {
-                shared->header = header;
-                shared->stage = Shared::Stage::Answered;
-            });
-            // The body: whatever each read brings goes to the window thread at once, a few blocks'
-            // worth ahead of it at most. A read returns only once its buffer is full or the body
-            // has ended, so while the data comes slowly the worker asks for no more than has
-            // arrived (waiting until something has): a slow server's bytes reach the window thread
-            // as they come. Once a whole block arrives within kWholeBlockMs, whole blocks are read
-            // (one call each, the fast path); a block that takes longer goes back to the careful way.
-            LARGE_INTEGER frequency, now;
-            ::QueryPerformanceFrequency(&frequency);
-            auto Ms = [&] {
-                ::QueryPerformanceCounter(&now);
-                return static_cast<double>(now.QuadPart) * 1000.0 / static_cast<double>(frequency.QuadPart);
-            };
-            bool whole = false;
-            double measureFrom = Ms();
-            std::size_t measured = 0;
-            for (;;) {
-                {
-                    std::unique_lock<std::mutex> lock(shared->mutex);
-                    shared->room.wait(lock, [&] { return shared->stop || shared->queued < kBlocksAhead * blockSize; });
-                    if (shared->stop) break;
-                }
-                DWORD ask = static_cast<DWORD>(blockSize), available = 0, read = 0, failure = 0;
-                if (!whole && ::InternetQueryDataAvailable(opened, &available, 0, 0) && available > 0 &&
-                    available < ask)
-                    ask = available;
-                std::string block(ask, '\0');
-                double before = Ms();
-                if (!::InternetReadFile(opened, block.data(), ask, &read)) {
-                    failure = ::GetLastError();
-                    read = 0;
-                }
-                block.resize(read);
-                double after = Ms();
-                if (whole) {
-                    whole = after - before <= kWholeBlockMs;
-                    measureFrom = after;
-                    measured = 0;
-                } else if ((measured += read, after - measureFrom >= kMeasureMs)) {
-                    whole = static_cast<double>(measured) * kWholeBlockMs >=
-                            static_cast<double>(blockSize) * (after - measureFrom);
-                    measureFrom = after;
-                    measured = 0;
-                }
-                const bool ended = failure != 0 || read == 0;
-                platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
-                shared->Publish([&] {
-                    shared->queued += block.size();
-                    if (!block.empty()) shared->blocks.push_back(std::move(block));
-                    if (failure != 0) {
-                        shared->bodyFailed = true;
-                        shared->bodyError = error;
-                    }
-                    shared->bodyEnded = ended;
-                });
-                if (ended) break;
+        sendFailure = ok ? 0 : ::GetLastError();
+        header.resize(ok ? length : 0);
+        return ok != FALSE;
+    };
+    // A status line without a single field is what WinINet makes of bytes that an earlier answer left
+    // unread on a kept-alive connection (it takes them for an answer of HTTP/0.9 and does not keep
+    // that connection): the request goes once more, on another connection.
+    const auto statusLineOnly = [&] { return header.find("\r\n") + 4 == header.size(); };
+    bool sent = send();
+    if (sent && statusLineOnly()) sent = send();
+
+    if (!sent) {
+        if (sendFailure != 0) fail(sendFailure);
+    } else {
+        shared->Publish([&] {
+            shared->header = header;
+            shared->stage = Shared::Stage::Answered;
+        });
+        // The body: whatever each read brings goes to the window thread at once, a few blocks'
+        // worth ahead of it at most. A read returns only once its buffer is full or the body
+        // has ended, so while the data comes slowly the worker asks for no more than has
+        // arrived (waiting until something has): a slow server's bytes reach the window thread
+        // as they come. Once a whole block arrives within kWholeBlockMs, whole blocks are read
+        // (one call each, the fast path); a block that takes longer goes back to the careful way.
+        LARGE_INTEGER frequency, now;
+        ::QueryPerformanceFrequency(&frequency);
+        auto Ms = [&] {
+            ::QueryPerformanceCounter(&now);
+            return static_cast<double>(now.QuadPart) * 1000.0 / static_cast<double>(frequency.QuadPart);
+        };
+        bool whole = false;
+        double measureFrom = Ms();
+        std::size_t measured = 0;
+        for (;;) {
+            {
+                std::unique_lock<std::mutex> lock(shared->mutex);
+                shared->room.wait(lock, [&] { return shared->stop || shared->queued < kBlocksAhead * blockSize; });
+                if (shared->stop) break;
             }
+            DWORD ask = static_cast<DWORD>(blockSize), available = 0, read = 0, failure = 0;
+            if (!whole && ::InternetQueryDataAvailable(opened, &available, 0, 0) && available > 0 && available < ask)
+                ask = available;
+            std::string block(ask, '\0');
+            double before = Ms();
+            if (!::InternetReadFile(opened, block.data(), ask, &read)) {
+                failure = ::GetLastError();
+                read = 0;
+            }
+            block.resize(read);
+            double after = Ms();
+            if (whole) {
+                whole = after - before <= kWholeBlockMs;
+                measureFrom = after;
+                measured = 0;
+            } else if ((measured += read, after - measureFrom >= kMeasureMs)) {
+                whole = static_cast<double>(measured) * kWholeBlockMs >=
+                        static_cast<double>(blockSize) * (after - measureFrom);
+                measureFrom = after;
+                measured = 0;
+            }
+            const bool ended = failure != 0 || read == 0;
+            platform::TransferError error = failure != 0 ? InternetError(failure) : platform::TransferError{};
+            shared->Publish([&] {
+                shared->queued += block.size();
+                if (!block.empty()) shared->blocks.push_back(std::move(block));
+                if (failure != 0) {
+                    shared->bodyFailed = true;
+                    shared->bodyError = error;
+                }
+                shared->bodyEnded = ended;
+            });
+            if (ended) break;
         }
     }
     if (opened != nullptr) ::InternetCloseHandle(opened);
