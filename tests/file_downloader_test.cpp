@@ -6,7 +6,6 @@
 
 #include <gtest/gtest.h>
 
-#include <functional>
 
 #include "fakes/fake_file_system.h"
 #include "fakes/fake_http_transfer.h"
@@ -90,35 +89,22 @@ TEST(FileDownloader, FreeSpaceIsCheckedOnDriveLetterPathsOnly) {
 }
 
 TEST(FileDownloader, FileErrorsAreReportedAndLeaveOnlyTheInstalledFile) {
-    const std::pair<std::function<void(Rig&)>, std::string> cases[] = {
-        {[](Rig& r) {
-             r.disk.createFails = platform::FileError{5, "Access is denied."};
-         },
-         "5: Access is denied."},
-        {[](Rig& r) {
-             r.disk.writeFails = platform::FileError{112, "There is not enough space on the disk."};
-             r.disk.writeFailsAt = 2048;
-         },
-         "112: There is not enough space on the disk."},
-        {[](Rig& r) {
-             r.disk.closeFails = platform::FileError{112, "Flush failed."};
-         },
-         "112: Flush failed."},
-        {[](Rig& r) {
-             r.disk.replaceFails = platform::FileError{32, "In use."};
-         },
-         "32: In use."},
-        {[](Rig& r) {
-             r.inet.chunkFails = platform::TransferError{12030, "The connection was aborted."};
-             r.inet.chunkFailsAt = 2048;
-         },
-         "12030: The connection was aborted."},
+    // Each disk call failing in turn, then the connection failing mid-body (both at 2 KiB).
+    const std::pair<std::optional<platform::FileError> FakeFileSystem::*, platform::FileError> cases[] = {
+        {&FakeFileSystem::createFails, {5, "Access is denied."}},
+        {&FakeFileSystem::writeFails, {112, "There is not enough space on the disk."}},
+        {&FakeFileSystem::closeFails, {112, "Flush failed."}},
+        {&FakeFileSystem::replaceFails, {32, "In use."}},
+        {nullptr, {12030, "The connection was aborted."}},
     };
-    for (const auto& [script, error] : cases) {
+    for (const auto& [diskCall, error] : cases) {
         Rig rig;
-        script(rig);
-        EXPECT_EQ(rig.Run().back(), "error:Cannot write file to disk.\r\rError " + error);
-        EXPECT_TRUE(rig.Untouched()) << error;
+        rig.disk.writeFailsAt = rig.inet.chunkFailsAt = 2048;
+        if (diskCall != nullptr) rig.disk.*diskCall = error;
+        else rig.inet.chunkFails = platform::TransferError{error.number, error.description};
+        EXPECT_EQ(rig.Run().back(), "error:Cannot write file to disk.\r\rError " + std::to_string(error.number) + ": " +
+                                        error.description);
+        EXPECT_TRUE(rig.Untouched()) << error.description;
     }
     // A missing folder is created one level deep (proved under Wine); two missing levels cannot be opened.
     Rig deep;
