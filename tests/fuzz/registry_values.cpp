@@ -85,6 +85,10 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     for (std::size_t i = 0; i < items.size(); ++i)
         if (std::holds_alternative<Bytes>(items[i].value)) std::abort();  // binary data is listed as hex text
     reg.EnumRegistryKeys(platform::kHkeyCurrentUser, kPath);
+    reg.EnumRegistryKeys(platform::kHkeyCurrentUser, "");
+    if (reg.ReadRemoteRegistryValue("\\\\far", platform::kHkeyCurrentUser, "State") != Variant(std::string("Error!")) ||
+        !reg.WriteRemoteRegistryValue("", platform::kHkeyCurrentUser, "State", std::string("0"), 1))
+        std::abort();  // an unreachable computer is an error; the local one through the remote path is written
     if (registry.OpenHandles() != 0) std::abort();
     return 0;
 }
