@@ -14,19 +14,6 @@
 
 namespace vantorel::testing {
 
-FileDescriptor& FileDescriptor::operator=(FileDescriptor&& other) noexcept {
-    if (this != &other) {
-        if (fd_ >= 0) ::close(fd_);
-        fd_ = other.fd_;
-        other.fd_ = -1;
-    }
-    return *this;
-}
-
-FileDescriptor::~FileDescriptor() {
-    if (fd_ >= 0) ::close(fd_);
-}
-
 std::string TeardownUnavailableReason() {
     return ::geteuid() == 0 ? ""
                             : "not run as root: tearing connections down (SOCK_DESTROY) and a private network "
@@ -34,16 +21,14 @@ std::string TeardownUnavailableReason() {
 }
 
 std::string EnterPrivateNetwork() {
-    if (::unshare(CLONE_NEWNET) != 0) return std::string("unshare(CLONE_NEWNET) failed: ") + std::strerror(errno);
+    auto failed = [](const char* call) { return std::string(call) + " failed: " + std::strerror(errno); };
+    if (::unshare(CLONE_NEWNET) != 0) return failed("unshare(CLONE_NEWNET)");
     FileDescriptor control(::socket(AF_INET, SOCK_DGRAM | SOCK_CLOEXEC, 0));
-    if (!control) return std::string("socket failed: ") + std::strerror(errno);
     ifreq request{};
     std::strncpy(request.ifr_name, "lo", IFNAMSIZ - 1);
-    if (::ioctl(control.get(), SIOCGIFFLAGS, &request) != 0)
-        return std::string("SIOCGIFFLAGS: ") + std::strerror(errno);
+    if (::ioctl(control.get(), SIOCGIFFLAGS, &request) != 0) return failed("SIOCGIFFLAGS");
     request.ifr_flags = static_cast<short>(request.ifr_flags | IFF_UP);
-    if (::ioctl(control.get(), SIOCSIFFLAGS, &request) != 0)
-        return std::string("SIOCSIFFLAGS: ") + std::strerror(errno);
+    if (::ioctl(control.get(), SIOCSIFFLAGS, &request) != 0) return failed("SIOCSIFFLAGS");
     return std::string();
 }
 
@@ -84,23 +69,19 @@ Listener Listen(const std::string& address, int backlog) {
 Connection Connect(const Listener& listener) {
     Connection connection;
     connection.client = FileDescriptor(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
-    if (!connection.client) return connection;
-    sockaddr_in local{};
-    local.sin_family = AF_INET;
-    local.sin_addr.s_addr = AddressField("127.0.0.1");
-    sockaddr_in remote{};
-    remote.sin_family = AF_INET;
-    remote.sin_addr.s_addr = listener.address;
-    remote.sin_port = htons(listener.port);
-    if (::bind(connection.client.get(), reinterpret_cast<sockaddr*>(&local), sizeof local) != 0 ||
-        ::connect(connection.client.get(), reinterpret_cast<sockaddr*>(&remote), sizeof remote) != 0) {
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = listener.address;
+    address.sin_port = htons(listener.port);
+    // From 127.0.0.1: the source the loopback route gives every 127.x.y.z peer.
+    if (::connect(connection.client.get(), reinterpret_cast<sockaddr*>(&address), sizeof address) != 0) {
         connection.client = FileDescriptor();
         return connection;
     }
     connection.server = FileDescriptor(::accept4(listener.fd.get(), nullptr, nullptr, SOCK_CLOEXEC));
-    socklen_t length = sizeof local;
-    ::getsockname(connection.client.get(), reinterpret_cast<sockaddr*>(&local), &length);
-    connection.clientPort = ntohs(local.sin_port);
+    socklen_t length = sizeof address;
+    ::getsockname(connection.client.get(), reinterpret_cast<sockaddr*>(&address), &length);
+    connection.clientPort = ntohs(address.sin_port);
     return connection;
 }
 
@@ -109,18 +90,6 @@ int ReadError(int fd) {
     ssize_t got = ::recv(fd, &byte, 1, MSG_DONTWAIT);
     if (got >= 0) return 0;
     return errno == EWOULDBLOCK ? EAGAIN : errno;
-}
-
-bool Exchange(int from, int to, const std::string& text) {
-    if (::send(from, text.data(), text.size(), MSG_NOSIGNAL) != static_cast<ssize_t>(text.size())) return false;
-    std::string got(text.size(), '\0');
-    std::size_t have = 0;
-    while (have < got.size()) {
-        ssize_t n = ::recv(to, got.data() + have, got.size() - have, 0);
-        if (n <= 0) return false;
-        have += static_cast<std::size_t>(n);
-    }
-    return got == text;
 }
 
 }  // namespace vantorel::testing

@@ -3,9 +3,11 @@
 // listeners on chosen 127.x.y.z addresses, and connected socket pairs.
 #pragma once
 
+#include <unistd.h>
+
 #include <cstdint>
 #include <string>
-#include <vector>
+#include <utility>
 
 namespace vantorel::testing {
 
@@ -24,11 +26,15 @@ class FileDescriptor {
 public:
     FileDescriptor() = default;
     explicit FileDescriptor(int fd) : fd_(fd) {}
-    FileDescriptor(const FileDescriptor&) = delete;
-    FileDescriptor& operator=(const FileDescriptor&) = delete;
-    FileDescriptor(FileDescriptor&& other) noexcept : fd_(other.fd_) { other.fd_ = -1; }
-    FileDescriptor& operator=(FileDescriptor&& other) noexcept;
-    ~FileDescriptor();
+    FileDescriptor(FileDescriptor&& other) noexcept { std::swap(fd_, other.fd_); }
+    // The descriptor held before goes to `other`, which closes it.
+    FileDescriptor& operator=(FileDescriptor&& other) noexcept {
+        std::swap(fd_, other.fd_);
+        return *this;
+    }
+    ~FileDescriptor() {
+        if (fd_ >= 0) ::close(fd_);
+    }
     int get() const { return fd_; }
     explicit operator bool() const { return fd_ >= 0; }
 
@@ -58,8 +64,5 @@ std::uint32_t AddressField(const std::string& address);
 // errno of a one-byte read that must not block: 0 when a byte or end of stream came, EAGAIN when
 // the connection is idle and open, the error otherwise (ECONNABORTED for a torn-down socket).
 int ReadError(int fd);
-
-// True when `text` goes from `from` to `to` intact.
-bool Exchange(int from, int to, const std::string& text);
 
 }  // namespace vantorel::testing
