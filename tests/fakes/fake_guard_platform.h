@@ -17,6 +17,7 @@
 #include "platform/connection_table.h"
 #include "platform/notify_area.h"
 #include "platform/window.h"
+#include "settings/settings.h"
 
 namespace vantorel::testing {
 
@@ -38,6 +39,11 @@ inline DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
 
 inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint32_t remotePort = 0x5000) {
     return platform::TcpRow{state, Ipv4(10, 0, 0, 1), 0x3930, remote, remotePort};
+}
+
+// A value under the program's settings key as text, "<missing>" when there is none.
+inline std::string StoredSetting(platform::Registry& registry, std::int32_t root, const std::string& name) {
+    return VariantText(OpenSettings(registry, root).GetRegistryValue(name, std::string("<missing>")));
 }
 
 // The guard's view as a recorder of each count shown after a teardown.
@@ -95,10 +101,7 @@ class FakeWindow final : public platform::Window {
 public:
     platform::WindowHandle Handle() const override { return handle; }
     platform::IconHandle Icon() const override { return icon; }
-    void SetIcon(platform::IconHandle i) override {
-        icon = i;
-        icons.push_back(i);
-    }
+    void SetIcon(platform::IconHandle i) override { icon = i; }
     std::string Caption() const override { return caption; }
     void SetCaption(const std::string& text) override { caption = text; }
     bool Visible() const override { return visible; }
@@ -111,7 +114,6 @@ public:
 
     platform::WindowHandle handle = 0x1234;
     platform::IconHandle icon = 0x777;
-    std::vector<platform::IconHandle> icons;  // every icon set, in order
     std::string caption = "FrmMain";
     bool visible = false;
     platform::WindowState state = platform::WindowState::Normal;
@@ -152,7 +154,11 @@ public:
     }
     std::int32_t ScreenWidth() const override { return 1024; }
     std::int32_t ScreenHeight() const override { return 768; }
-    bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t) override { return true; }
+    bool DeleteSystemMenuCommand(platform::WindowHandle, std::uint32_t command) override {
+        deletedCommand = command;
+        return true;
+    }
+    std::uint32_t deletedCommand = 0;
 };
 
 class FakeInstance final : public platform::Instance {
