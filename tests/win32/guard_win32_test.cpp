@@ -40,20 +40,15 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
     handlers.taskbarCreated = [&] { AddTrayIcon(tray, window, window.Icon(), window.Caption(), kTrayCallbackMessage); };
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers)) << "no display? error " << ::GetLastError();
     AddTrayIcon(tray, window, window.Icon(), StatusText(0, CountForm::BlankBeforeSign), kTrayCallbackMessage);
-    ModifyTrayIcon(tray, window, StatusText(1, CountForm::Plain), kTrayCallbackMessage);
     ModifyTrayIcon(tray, window, std::string(100, 'x'), kTrayCallbackMessage);  // cut to the field
     RemoveTrayIcon(tray, window);
-    ASSERT_EQ(tray.calls.size(), 4u);
-    for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
-    EXPECT_EQ(tray.calls[2].tip, std::string(63, 'x')) << "the tip handed to the shell fits its 64-byte field";
-
     // A restarted taskbar announces itself with the registered message: the icon is added again.
-    ASSERT_NE(window.TaskbarCreatedMessage(), 0u);
     ::SendMessageA(window.hwnd(), window.TaskbarCreatedMessage(), 0, 0);
-    ASSERT_EQ(tray.calls.size(), 5u);
-    EXPECT_EQ(tray.calls[4].message, platform::kNimAdd);
-    EXPECT_TRUE(tray.calls[4].ok);
     RemoveTrayIcon(tray, window);
+    ASSERT_EQ(tray.calls.size(), 5u);
+    for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
+    EXPECT_EQ(tray.calls[1].tip, std::string(63, 'x')) << "the tip handed to the shell fits its 64-byte field";
+    EXPECT_EQ(tray.calls[3].message, platform::kNimAdd);
 }
 
 TEST(MessagePumpWin32, TheSweepsYieldStillRunsWaitingMessages) {
