@@ -160,8 +160,6 @@ set_tests_properties(options_updates_win32_tests PROPERTIES FIXTURES_REQUIRED "w
 add_executable(pump_bench bench/win32/pump_bench.cpp)
 target_link_libraries(pump_bench PRIVATE vantorel_win32)
 
-vantorel_wine_test(guard_win32_tests tests/win32/guard_win32_test.cpp)
-
 # The main window with the program's own resources (icons, manifest, version) linked in.
 vantorel_wine_test(main_window_win32_tests tests/win32/main_window_win32_test.cpp ${CMAKE_BINARY_DIR}/vantorel.rc)
 target_link_libraries(main_window_win32_tests PRIVATE version)

@@ -1,9 +1,10 @@
 // FrmMain's Win32 window under Wine on a virtual display, with the program's own resources linked
 // in: the icons as compiled (padlock 48 x 48 in 24-bit colour, bulbs 32 x 32 and 16 x 16 in 16
-// colours), the version resource, the layout in twips at each DPI and the tab order, and what the
+// colours), the version resource, the layout in twips at each DPI and the tab order, what the
 // window logic asks of the real window (the status light as its icon, no size command, Alt+O
-// through the sweep's pump, the session's end). Clicks, the tray, closing and the layout of the
-// real program at 150 % are proved in tests/e2e/.
+// through the sweep's pump, the session's end), the sweep's yield, and the tray routines against
+// Wine's shell. Start-up, the switch, clicks, hiding in the tray and back, closing and the layout
+// of the real program at 150 % are proved in tests/e2e/.
 #include <windows.h>
 
 #include <gtest/gtest.h>
@@ -15,6 +16,8 @@
 #include "app/main_window.h"
 #include "platform/win32/resource_ids.h"
 #include "platform/win32/shell_win32.h"
+#include "guard/attempts.h"
+#include "ui/main/tray.h"
 #include "ui/main/frm_main.h"
 #include "version.h"
 #include "win32/ui_input.h"
@@ -57,12 +60,13 @@ TEST(ResourcesWin32, IconsAndVersionAsCompiledIn) {
     EXPECT_EQ(LOWORD(fixed->dwFileVersionMS), static_cast<WORD>(kVersionMinor));
 }
 
-TEST(MainWindowWin32, LightsTheSizeCommandAltOAndTheSessionsEndOnTheRealWindow) {
+TEST(MainWindowWin32, LightsTheSizeCommandAltOTheSweepsYieldAndTheSessionsEndOnTheRealWindow) {
     MSG stale;  // windows of earlier tests on this thread posted their quit message when destroyed
     while (::PeekMessageA(&stale, nullptr, 0, 0, PM_REMOVE)) {}
     win32::MainWindow window;
-    int closes = 0;
+    int closes = 0, ticks = 0;
     win32::MainWindowHandlers handlers;
+    handlers.timerTick = [&] { ++ticks; };
     handlers.close = [&] {
         ++closes;
         window.Destroy();
@@ -94,6 +98,14 @@ TEST(MainWindowWin32, LightsTheSizeCommandAltOAndTheSessionsEndOnTheRealWindow) 
     EXPECT_TRUE(pump.PumpMessages());
     EXPECT_EQ(options, 1) << "Alt+O presses \"&Options\"";
 
+    // A loop that only yields, as a long sweep does: the timer's ticks still arrive.
+    window.Timer().SetInterval(20);
+    window.Timer().SetEnabled(true);
+    DWORD until = ::GetTickCount() + 3000;
+    while (ticks < 3 && ::GetTickCount() < until) ASSERT_TRUE(pump.YieldToMessages());
+    EXPECT_GE(ticks, 3);
+    window.Timer().SetEnabled(false);
+
     // Logging off or shutting down closes the window as "&Exit" does, once the session really ends.
     EXPECT_EQ(::SendMessageA(hwnd, WM_QUERYENDSESSION, 0, 0), TRUE) << "the session may end";
     ::SendMessageA(hwnd, WM_ENDSESSION, FALSE, 0);  // it did not end after all
@@ -101,8 +113,48 @@ TEST(MainWindowWin32, LightsTheSizeCommandAltOAndTheSessionsEndOnTheRealWindow) 
     ::SendMessageA(hwnd, WM_ENDSESSION, TRUE, 0);
     EXPECT_EQ(closes, 1);
     EXPECT_EQ(window.hwnd(), nullptr);
+    // The quit request the window's end posts ends a sweep's yield and is kept for the main loop.
+    bool going = true;
+    for (until = ::GetTickCount() + 3000; going && ::GetTickCount() < until;) going = pump.YieldToMessages();
+    EXPECT_FALSE(going);
+    EXPECT_FALSE(pump.PumpMessages()) << "stays quitting";
     MSG quit;
     EXPECT_TRUE(::PeekMessageA(&quit, nullptr, WM_QUIT, WM_QUIT, PM_REMOVE)) << "the message loop is told to end";
+}
+
+// The shell, noting each call's answer and the tip it was given.
+class NotingNotifyArea final : public platform::NotifyArea {
+public:
+    bool ShellNotifyIcon(std::uint32_t message, const platform::NotifyIconData& data) override {
+        bool ok = real.ShellNotifyIcon(message, data);
+        calls.push_back({message, ok, data.tip});
+        return ok;
+    }
+    struct Call {
+        std::uint32_t message;
+        bool ok;
+        std::string tip;
+    };
+    win32::Win32NotifyArea real;
+    std::vector<Call> calls;
+};
+
+TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
+    win32::MainWindow window;
+    NotingNotifyArea tray;
+    win32::MainWindowHandlers handlers;
+    handlers.taskbarCreated = [&] { AddTrayIcon(tray, window, window.Icon(), window.Caption(), kTrayCallbackMessage); };
+    ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr), handlers)) << "no display? error " << ::GetLastError();
+    AddTrayIcon(tray, window, window.Icon(), StatusText(0, CountForm::BlankBeforeSign), kTrayCallbackMessage);
+    ModifyTrayIcon(tray, window, std::string(100, 'x'), kTrayCallbackMessage);  // cut to the field
+    RemoveTrayIcon(tray, window);
+    // A restarted taskbar announces itself with the registered message: the icon is added again.
+    ::SendMessageA(window.hwnd(), window.TaskbarCreatedMessage(), 0, 0);
+    RemoveTrayIcon(tray, window);
+    ASSERT_EQ(tray.calls.size(), 5u);
+    for (const auto& call : tray.calls) EXPECT_TRUE(call.ok) << "Shell_NotifyIconA operation " << call.message;
+    EXPECT_EQ(tray.calls[1].tip, std::string(63, 'x')) << "the tip handed to the shell fits its 64-byte field";
+    EXPECT_EQ(tray.calls[3].message, platform::kNimAdd);
 }
 
 TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTabWalksTheButtons) {
