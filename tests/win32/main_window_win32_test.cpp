@@ -49,15 +49,12 @@ TEST(ResourcesWin32, IconsAndVersionAsCompiledIn) {
     char path[MAX_PATH];
     ::GetModuleFileNameA(nullptr, path, sizeof path);
     DWORD ignored = 0;
-    DWORD size = ::GetFileVersionInfoSizeA(path, &ignored);
-    ASSERT_GT(size, 0u);
-    std::vector<char> info(size);
-    ASSERT_TRUE(::GetFileVersionInfoA(path, 0, size, info.data()));
+    std::vector<char> info(::GetFileVersionInfoSizeA(path, &ignored));
     VS_FIXEDFILEINFO* fixed = nullptr;
     UINT length = 0;
-    ASSERT_TRUE(::VerQueryValueA(info.data(), "\\", reinterpret_cast<void**>(&fixed), &length));
-    EXPECT_EQ(HIWORD(fixed->dwFileVersionMS), static_cast<WORD>(kVersionMajor));
-    EXPECT_EQ(LOWORD(fixed->dwFileVersionMS), static_cast<WORD>(kVersionMinor));
+    ASSERT_TRUE(!info.empty() && ::GetFileVersionInfoA(path, 0, static_cast<DWORD>(info.size()), info.data()) &&
+                ::VerQueryValueA(info.data(), "\\", reinterpret_cast<void**>(&fixed), &length));
+    EXPECT_EQ(fixed->dwFileVersionMS, static_cast<DWORD>(MAKELONG(kVersionMinor, kVersionMajor)));
 }
 
 TEST(MainWindowWin32, LightsTheSizeCommandAltOTheSweepsYieldAndTheSessionsEndOnTheRealWindow) {
@@ -160,25 +157,24 @@ TEST(TrayWin32, RoutinesRunAgainstWinesShell) {
 TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTabWalksTheButtons) {
     win32::MainWindow window;
     ASSERT_TRUE(window.Create(::GetModuleHandleA(nullptr)));
-    HWND hwnd = window.hwnd();
+    HWND hwnd = window.hwnd(), onOff = window.BtnOnOff().Handle();
     ::ShowWindow(hwnd, SW_SHOWNA);
     for (UINT dpi : {144u, 192u, 120u, 96u}) {
         const int d = static_cast<int>(dpi);
         RECT suggested = win32::SendDpiChange(hwnd, dpi, {9120, 4335}), now;
         ::GetWindowRect(hwnd, &now);
         EXPECT_TRUE(::EqualRect(&now, &suggested)) << dpi << ": the suggested rectangle taken";
-        RECT onOff = ChildRect(window.BtnOnOff().Handle(), hwnd);
-        EXPECT_EQ(onOff.left, ::MulDiv(120, d, 1440)) << dpi;
-        EXPECT_EQ(onOff.bottom - onOff.top, ::MulDiv(4095, d, 1440)) << dpi;
+        RECT switchRect = ChildRect(onOff, hwnd);
+        EXPECT_EQ(switchRect.left, ::MulDiv(120, d, 1440)) << dpi;
+        EXPECT_EQ(switchRect.bottom - switchRect.top, ::MulDiv(4095, d, 1440)) << dpi;
         EXPECT_EQ(win32::FontHeight(window.BtnO(kBtnExit).hwnd()), -::MulDiv(825, d, 7200)) << dpi;
-        HWND onOffHwnd = window.BtnOnOff().Handle();
-        EXPECT_EQ(win32::FontHeight(onOffHwnd), -std::lround(14.25 * d / 72)) << dpi << ": the switch";
-        HDC dc = ::GetDC(onOffHwnd);
-        HGDIOBJ old = ::SelectObject(dc, reinterpret_cast<HFONT>(::SendMessageA(onOffHwnd, WM_GETFONT, 0, 0)));
+        EXPECT_EQ(win32::FontHeight(onOff), -std::lround(14.25 * d / 72)) << dpi << ": the switch";
+        HDC dc = ::GetDC(onOff);
+        HGDIOBJ old = ::SelectObject(dc, reinterpret_cast<HFONT>(::SendMessageA(onOff, WM_GETFONT, 0, 0)));
         SIZE off{};
         ::GetTextExtentPoint32A(dc, "OFF", 3, &off);
         ::SelectObject(dc, old);
-        ::ReleaseDC(onOffHwnd, dc);
+        ::ReleaseDC(onOff, dc);
         const auto& caption = window.BtnOnOffWindow().button().captionRect();
         EXPECT_EQ(caption.right - caption.left, off.cx) << dpi << ": the switch's caption laid out in that font";
         EXPECT_EQ(win32::IconWidth(reinterpret_cast<HICON>(::SendMessageA(hwnd, WM_GETICON, ICON_BIG, 0))),
@@ -188,8 +184,8 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTabWalksTheButto
         EXPECT_EQ(window.BtnOnOffWindow().button().Font().name, "Verdana");
     }
 
-    // Tab, through a loop that hands dialog keys to the window as the program's does: the switch
-    // has the focus first; Tab walks the panels' buttons, then the row, and round.
+    // Tab, through the program's own handling of queued messages: the switch has the focus first;
+    // Tab walks the panels' buttons, then the row, and round.
     ::ShowWindow(hwnd, SW_SHOW);
     ::SetForegroundWindow(hwnd);
     std::vector<HWND> focus;
@@ -200,15 +196,9 @@ TEST(MainWindowWin32, FollowsTheMonitorsDpiWithEveryTextWholeAndTabWalksTheButto
     });
     for (DWORD start = ::GetTickCount(); focus.size() < 7 && ::GetTickCount() - start < 5000;) {
         MSG msg;
-        if (!::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) {
-            ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
-            continue;
-        }
-        if (::IsDialogMessageA(hwnd, &msg)) continue;
-        ::TranslateMessage(&msg);
-        ::DispatchMessageA(&msg);
+        if (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) win32::DispatchQueuedMessage(msg);
+        else ::MsgWaitForMultipleObjects(0, nullptr, FALSE, 50, QS_ALLINPUT);
     }
-    HWND onOff = window.BtnOnOff().Handle();
     EXPECT_EQ(focus, (std::vector<HWND>{onOff, window.BtnO(kBtnOptions).hwnd(), window.BtnO(kBtnUpdates).hwnd(),
                                         window.BtnO(kBtnTray).hwnd(), window.BtnO(kBtnExit).hwnd(),
                                         window.BtnO(kBtnHelp).hwnd(), onOff}));
