@@ -45,18 +45,14 @@ public:
         events.push_back("Options " + std::to_string(frameIndex));
         if (onOptions) onOptions();
     }
-    void EndProgram() override {
-        events.push_back("End");
-        if (onEnd) onEnd();
-    }
-    std::function<void()> onOptions, onEnd;
+    void EndProgram() override { events.push_back("End"); }
+    std::function<void()> onOptions;
     std::vector<std::string> events, texts;
 };
 
 // The main window with every platform piece faked; the definitions list 10.0.0.200 and 1.2.3.4.
 struct MainRig {
     FakeDesktop desktop;
-    std::vector<std::string>& events = desktop.events;
     FakeRegistry registry;
     FakeFileSystem files;
     FakeConnectionTable table;
@@ -82,7 +78,7 @@ struct MainRig {
 
     MainRig() {
         files.files[kDefinitionsPath] = "-939524086\r\n67305985";
-        tray.events = &events;
+        tray.events = &desktop.events;
     }
     void Put(std::int32_t root, const std::string& name, const std::string& value) {
         registry.PutRaw(root, kSettingsKey, name, platform::kRegSz, {value.begin(), value.end()});
@@ -123,18 +119,18 @@ TEST(FrmMain, FirstStartCentresAndAddsTheIconHelpExitAndMinimising) {
     EXPECT_EQ(std::make_tuple(rig.tray.calls.back().data.tip, rig.frm.visible, rig.windows.deletedCommand),
               std::make_tuple("Vantorel", false, platform::kScSize));
 
-    rig.events.clear();
+    rig.desktop.events.clear();
     rig.btnO[kBtnHelp].UserClick();
     rig.Put(kHkeyLocalMachine, "Server", "http://127.0.0.1:8080");
     rig.btnO[kBtnHelp].UserClick();
-    rig.desktop.onEnd = [&] { rig.events.push_back(rig.tmr.enabled || rig.timer.enabled ? "on" : "off"); };
     rig.btnO[kBtnExit].UserClick();
     rig.form.QueryUnload();  // the window's destruction, which the end brings, unloads nothing again
     rig.form.Unload();
     const std::string owner = " " + std::to_string(rig.frm.handle);
-    EXPECT_EQ(rig.events,
+    EXPECT_EQ(rig.desktop.events,
               (std::vector<std::string>{"open http://www.vantorel.com/vt/help.php 1" + owner,
-                                        "open http://127.0.0.1:8080/vt/help.php 1" + owner, "Tray 2", "End", "off"}));
+                                        "open http://127.0.0.1:8080/vt/help.php 1" + owner, "Tray 2", "End"}));
+    EXPECT_FALSE(rig.tmr.enabled || rig.timer.enabled) << "both timers stopped";
 }
 
 TEST(Guard, SweepsNeverNestAndAModalWindowOpenedInTheMiddleOfASweepNeverPausesTheGuard) {
@@ -165,9 +161,7 @@ TEST(Guard, SweepsNeverNestAndAModalWindowOpenedInTheMiddleOfASweepNeverPausesTh
 
 TEST(StartUp, StoredSettingsAndSettingsThatAreNotNumbers) {
     struct Case {
-        const char *state, *attempts, *tray;
-        const char* switchState;
-        const char* caption;
+        const char *state, *attempts, *tray, *switchState, *caption;
         bool visible;
         const char* stateWritten;
     } cases[] = {
@@ -193,7 +187,8 @@ TEST(StartUp, MissingDefinitionsAreReportedAndTheUpdatesWindowOpensBeforeTheTray
     rig.Put(kHkeyLocalMachine, "Server", "https://updates.example.org");
     rig.Start();
     const std::string box = "MessageBox Definitions Error ", owner = " " + std::to_string(rig.frm.handle);
-    EXPECT_EQ(rig.events, (std::vector<std::string>{box + "16" + owner, "Options 1", box + "48" + owner, "Tray 0"}));
+    EXPECT_EQ(rig.desktop.events,
+              (std::vector<std::string>{box + "16" + owner, "Options 1", box + "48" + owner, "Tray 0"}));
     EXPECT_EQ(rig.desktop.texts,
               (std::vector<std::string>{
                   "Reading definitions, installation corrupted re-install at https://updates.example.org/",

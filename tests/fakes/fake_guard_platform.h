@@ -8,7 +8,6 @@
 #include <functional>
 #include <string>
 #include <tuple>
-#include <utility>
 #include <vector>
 
 #include "fakes/fake_message_pump.h"
@@ -23,8 +22,7 @@ namespace vantorel::testing {
 
 // 1.2.3.4 -> the row's address field (network order read little-endian).
 constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std::uint8_t d) {
-    return static_cast<std::uint32_t>(a) | static_cast<std::uint32_t>(b) << 8 | static_cast<std::uint32_t>(c) << 16 |
-           static_cast<std::uint32_t>(d) << 24;
+    return a | b << 8 | c << 16 | static_cast<std::uint32_t>(d) << 24;  // d << 24 would overflow an int
 }
 
 // A sorted definitions list holding the given address fields.
