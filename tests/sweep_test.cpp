@@ -5,7 +5,7 @@
 
 #include <gtest/gtest.h>
 
-#include <utility>
+#include <tuple>
 
 #include "fakes/fake_guard_platform.h"
 #include "fakes/fake_registry.h"
@@ -53,21 +53,20 @@ TEST(SweepConnections, OverstatedFailedOrNeverFittingFetchesReadNothingBeyondThe
     rig.table.rows = {listed};
     rig.table.overstateCount = 1'000'000;  // only the buffer's rows are read
     rig.sweep.SweepConnections();
-    EXPECT_EQ(std::make_pair(rig.sweep.LastSweep().rows, rig.table.entries.size()),
-              std::make_pair(1001u, std::size_t{1}));
+    const SweepResult& last = rig.sweep.LastSweep();
+    EXPECT_EQ(std::make_pair(last.rows, rig.table.entries.size()), std::make_pair(1001u, std::size_t{1}));
 
     rig.table.failWith = 87;
     rig.sweep.SweepConnections();
-    EXPECT_FALSE(rig.sweep.LastSweep().fetched);
+    EXPECT_FALSE(last.fetched);
 
     // A table that doubles before every fetch: given up after four.
     rig.table.failWith = platform::kNoError;
     rig.table.rows.assign(1000, listed);
     rig.table.beforeFetch = [&] { rig.table.rows.resize(rig.table.rows.size() * 2, listed); };
     rig.sweep.SweepConnections();
-    EXPECT_EQ(std::make_pair(rig.sweep.LastSweep().fetched, rig.sweep.LastSweep().fetchCalls),
-              std::make_pair(false, 4));
-    EXPECT_EQ(rig.table.entries.size(), 1u);
+    EXPECT_EQ(std::make_tuple(last.fetched, last.fetchCalls, rig.table.entries.size()),
+              std::make_tuple(false, 4, std::size_t{1}));
 }
 
 }  // namespace
