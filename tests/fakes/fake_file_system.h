@@ -15,7 +15,13 @@ namespace vantorel::testing {
 
 class FakeFileSystem final : public platform::FileSystem, public platform::Files {
 public:
+    std::map<std::string, std::string> files;
     std::set<std::string> unreadable;
+    std::set<std::string> folders{"C:", "C:\\Vantorel"};
+    std::uint32_t freeClusters = 1000000;  // of 4096 bytes
+    std::string lastFreeSpaceRoot;
+    std::optional<platform::FileError> createFolderFails, createFails, writeFails, closeFails, replaceFails;
+    std::size_t writeFailsAt = 0;  // a write fails once the file would grow beyond this size
 
     // platform::Files, over the same files.
     bool Exists(const std::string& path) override { return files.count(path) != 0 || FolderExists(path); }
@@ -26,47 +32,21 @@ public:
         return true;
     }
 
-    std::map<std::string, std::string> files;
-    std::set<std::string> folders{"C:", "C:\\Vantorel"};
-    std::uint32_t bytesPerSector = 512, sectorsPerCluster = 8, freeClusters = 1000000;
-    std::string lastFreeSpaceRoot;
-    std::optional<platform::FileError> createFolderFails, createFails, writeFails, closeFails, replaceFails;
-    std::size_t writeFailsAt = 0;  // a write fails once the file would grow beyond this size
-
     bool FileExists(const std::string& path) override { return files.count(path) != 0; }
     bool FolderExists(const std::string& path) override { return folders.count(Trim(path)) != 0; }
     bool CreateFolder(const std::string& path, platform::FileError& error) override {
         std::string folder = Trim(path);
-        std::size_t slash = folder.rfind('\\');
-        if (createFolderFails) {
-            error = *createFolderFails;
-            return false;
-        }
-        if (slash == std::string::npos || folders.count(folder.substr(0, slash)) == 0) {
-            error = {3, "The system cannot find the path specified."};
-            return false;
-        }
+        if (!Succeeds(createFolderFails, error) || !ParentExists(folder, error)) return false;
         folders.insert(folder);
         return true;
     }
     std::unique_ptr<platform::FileWriter> CreateNew(const std::string& path, platform::FileError& error) override {
-        std::size_t slash = path.rfind('\\');
-        if (createFails) {
-            error = *createFails;
-            return nullptr;
-        }
-        if (slash == std::string::npos || folders.count(path.substr(0, slash)) == 0) {
-            error = {3, "The system cannot find the path specified."};
-            return nullptr;
-        }
+        if (!Succeeds(createFails, error) || !ParentExists(path, error)) return nullptr;
         files[path].clear();
         return std::make_unique<Writer>(*this, path);
     }
     bool Replace(const std::string& from, const std::string& to, platform::FileError& error) override {
-        if (replaceFails) {
-            error = *replaceFails;
-            return false;
-        }
+        if (!Succeeds(replaceFails, error)) return false;
         auto it = files.find(from);
         if (it == files.end()) {
             error = {2, "The system cannot find the file specified."};
@@ -80,8 +60,8 @@ public:
     bool QueryDiskFreeSpace(const std::string& root, std::uint32_t& bps, std::uint32_t& spc,
                             std::uint32_t& free) override {
         lastFreeSpaceRoot = root;
-        bps = bytesPerSector;
-        spc = sectorsPerCluster;
+        bps = 512;
+        spc = 8;
         free = freeClusters;
         return true;
     }
@@ -90,6 +70,16 @@ private:
     static std::string Trim(std::string path) {
         while (!path.empty() && path.back() == '\\') path.pop_back();
         return path;
+    }
+    static bool Succeeds(const std::optional<platform::FileError>& failure, platform::FileError& error) {
+        if (failure) error = *failure;
+        return !failure;
+    }
+    bool ParentExists(const std::string& path, platform::FileError& error) const {
+        std::size_t slash = path.rfind('\\');
+        if (slash != std::string::npos && folders.count(path.substr(0, slash)) != 0) return true;
+        error = {3, "The system cannot find the path specified."};
+        return false;
     }
 
     class Writer final : public platform::FileWriter {
@@ -104,13 +94,7 @@ private:
             content += data;
             return true;
         }
-        bool Close(platform::FileError& error) override {
-            if (owner_.closeFails) {
-                error = *owner_.closeFails;
-                return false;
-            }
-            return true;
-        }
+        bool Close(platform::FileError& error) override { return Succeeds(owner_.closeFails, error); }
 
     private:
         FakeFileSystem& owner_;
