@@ -1,25 +1,29 @@
 // The update check in the real options window under Wine, against nginx (the configuration in
-// deploy/, started by a CTest fixture on a loopback port), with the window's own WinINet
-// downloaders: "&Check for Updates" is clicked with BM_CLICK, and what the window shows is read back
-// from its controls: the status labels, the picture box pb and its pixels, the button and the
-// "Updates" message boxes.
+// deploy/, started by a CTest fixture on a loopback port, serving VANTOREL_NGINX_DIR/www/vt), with
+// the window's own WinINet downloaders, for a program folder in the temp folder and the "Server"
+// setting pointing at nginx. "&Check for Updates" is clicked with BM_CLICK, and what the window
+// shows is read back from its controls: the status labels, the picture box pb and its pixels, the
+// button and the "Updates" message boxes. Closing the window during a check, and a new list taking
+// effect in the running guard, are proved end to end (tests/e2e/e2e_tests.py).
 #include <windows.h>
-
-#include "win32/update_server.h"
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
+#include <fstream>
 #include <functional>
 #include <optional>
+#include <sstream>
 
 #include "app/options_window.h"
 #include "platform/win32/registry_win32.h"
+#include "settings/registry_routines.h"
 #include "win32/ui_input.h"
 
 namespace vantorel::win32 {
 namespace {
 
-using testing::WriteFile;
+const std::string kInstalled = "installed definitions\r\n";
 
 std::string Text(HWND hwnd) {
     char text[512] = {0};
@@ -27,25 +31,77 @@ std::string Text(HWND hwnd) {
     return text;
 }
 
-// What the window showed: labels and pb when the check returned, and every message box on the way
-// (its title, owner and text, and whether the button was disabled meanwhile).
+std::string ReadFile(const std::string& path) {
+    std::stringstream content;
+    content << std::ifstream(path, std::ios::binary).rdbuf();
+    return content.str();
+}
+
+// What the window showed: labels and pb when the check returned, every message box on the way (its
+// title, owner and text, and whether the button was disabled meanwhile), and the reloads asked for.
 struct Shown {
     std::string L0, L1;
-    bool pbVisible = false, enabled = false;
-    COLORREF pbLeft = 0, pbRight = 0;
+    bool pbVisible = false, barFull = false, enabled = false;
     std::vector<std::string> boxes;
+    int reloads = 0;
 };
 
-class OptionsUpdatesTest : public testing::UpdateServerTest {
+class OptionsUpdatesTest : public ::testing::Test {
 protected:
-    OptionsUpdatesTest() : UpdateServerTest("vtopt-") {}
+    void SetUp() override {
+        const char* dir = std::getenv("VANTOREL_NGINX_DIR");
+        ASSERT_NE(dir, nullptr) << "VANTOREL_NGINX_DIR is not set";
+        std::string port = ReadFile(std::string("Z:") + dir + "/server.port");
+        while (!port.empty() && (port.back() == '\n' || port.back() == '\r')) port.pop_back();
+        ASSERT_FALSE(port.empty()) << "nginx is not running";
+        www_ = std::string("Z:") + dir + "/www/vt/";
+        SetServer("http://127.0.0.1:" + port + "/");
+        char temp[MAX_PATH];
+        ::GetTempPathA(MAX_PATH, temp);
+        folder_ = std::string(temp) + "vtopt-" + std::to_string(::GetCurrentProcessId());
+        ::CreateDirectoryA(folder_.c_str(), nullptr);
+    }
+    void TearDown() override {
+        Serve(nullptr, nullptr, nullptr, nullptr);
+        for (const char* name : {"\\defver", "\\sw2.def", "\\VTSetup.exe"}) ::DeleteFileA((folder_ + name).c_str());
+        EXPECT_TRUE(::RemoveDirectoryA(folder_.c_str())) << "something was left behind in " << folder_;
+        SetServer("");
+    }
 
-    // Opens the updates panel, clicks the button once the modal loop runs, answers each message box
-    // and closes the window when the check has returned.
-    Shown Check(ProgramVersion version = {1, 0}, std::function<std::optional<std::size_t>()> reload = nullptr) {
+    // The "Server" setting, as the program reads it; removed when empty.
+    void SetServer(const std::string& address) {
+        RegistryRoutines reg(registry_);
+        reg.hkey(platform::kHkeyLocalMachine);
+        reg.KeyRoot("SOFTWARE\\Vantorel\\");
+        reg.CreateKey();
+        if (address.empty()) reg.DeleteValue("Server");
+        else ASSERT_TRUE(reg.SetRegistryValue("Server", address, platform::kRegSz));
+    }
+    // What nginx serves; a file given as null is not there.
+    void Serve(const char* defver, const char* sw2, const char* mainver, const char* setup) {
+        const std::pair<const char*, const char*> files[] = {
+            {"defver", defver}, {"sw2.def", sw2}, {"mainver", mainver}, {"VTSetup.exe", setup}};
+        for (const auto& [name, content] : files) {
+            if (content != nullptr) std::ofstream(www_ + name, std::ios::binary) << content;
+            else ::DeleteFileA((www_ + name).c_str());
+        }
+    }
+    std::string Local(const std::string& name) { return ReadFile(folder_ + "\\" + name); }
+
+    // Installs the definitions and `localDefver` (none when null), opens the updates panel, clicks
+    // the button once the modal loop runs, answers each message box and closes the window when the
+    // check has returned.
+    Shown Check(const char* localDefver, ProgramVersion version = {1, 0}) {
+        if (localDefver != nullptr) std::ofstream(folder_ + "\\defver", std::ios::binary) << localDefver;
+        else ::DeleteFileA((folder_ + "\\defver").c_str());
+        std::ofstream(folder_ + "\\sw2.def", std::ios::binary) << kInstalled;
+        ::DeleteFileA((folder_ + "\\VTSetup.exe").c_str());
         Shown shown;
         OptionsWindow window(nullptr, 1, registry_, AutostartPath(), {folder_, version});
-        window.SetReloadDefinitions(std::move(reload));
+        window.SetReloadDefinitions([&] {
+            ++shown.reloads;
+            return std::optional<std::size_t>(2);
+        });
         EXPECT_NE(window.hwnd(), nullptr) << "no display?";
         EXPECT_FALSE(::IsWindowVisible(window.pbWindow())) << "pb is hidden until a download starts";
         std::function<void()> check = window.updateButton().Click;
@@ -57,10 +113,12 @@ protected:
             shown.L1 = Text(window.label(1).hwnd());
             shown.pbVisible = ::IsWindowVisible(window.pbWindow()) != FALSE;
             shown.enabled = ::IsWindowEnabled(window.updateButton().hwnd()) != FALSE;
+            // The bar (highlight colour) reaches across pb.
             RECT inside;
             ::GetClientRect(window.pbWindow(), &inside);
-            shown.pbLeft = window.picture().Pixel(3, 3);
-            shown.pbRight = window.picture().Pixel(inside.right - 4, inside.bottom / 2);
+            shown.barFull =
+                window.picture().Pixel(3, 3) == ::GetSysColor(COLOR_HIGHLIGHT) &&
+                window.picture().Pixel(inside.right - 4, inside.bottom / 2) == ::GetSysColor(COLOR_HIGHLIGHT);
             ::PostMessageA(window.hwnd(), WM_CLOSE, 0, 0);
         };
         bool clicked = false;
@@ -90,132 +148,77 @@ protected:
         EXPECT_EQ(clicks, 1) << "the click reached the button once, and none while it was off";
         return shown;
     }
+
+    win32::Win32Registry registry_;
+    std::string www_, folder_;
 };
 
-TEST_F(OptionsUpdatesTest, FetchesNewerDefinitionsAndPaintsProgress) {
-    std::string definitions;
-    for (int i = 0; i < 20000; ++i) definitions += std::to_string(-2000000 + i * 11) + "\r\n";
-    Serve("defver", "21\n");
-    Serve("sw2.def", definitions);
-    Serve("mainver", "1.0\n");
-    Shown shown = Check();
-    EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.pbVisible, shown.enabled),
-              std::make_tuple(std::string("Definitions Updates: Complete"), std::string("Program Updates: No Updates"),
-                              true, true));
-    EXPECT_TRUE(shown.boxes.empty());
-    EXPECT_EQ(Local("sw2.def"), definitions);
-    EXPECT_EQ(Local("defver"), "21\n");
-    // The last progress painted was 100 %: the bar (highlight colour) reaches across pb.
-    EXPECT_EQ(std::make_pair(shown.pbLeft, shown.pbRight),
-              std::make_pair(::GetSysColor(COLOR_HIGHLIGHT), ::GetSysColor(COLOR_HIGHLIGHT)));
-}
-
-TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndFailuresKeepTheInstalledVersion) {
-    const std::string installed = "installed definitions\r\n";
-    const char *kNoDefs = "Definitions Updates: No Updates", *kNoProgram = "Program Updates: No Updates";
+TEST_F(OptionsUpdatesTest, VersionsCompareAsNumbersAndOnlyACompleteListReplacesTheInstalledOne) {
+    std::string list;  // 20,000 keys, some 230 KB: many chunks of progress
+    for (int i = 0; i < 20000; ++i) list += std::to_string(-2000000 + i * 11) + "\r\n";
+    const std::string kNoDefs = "Definitions Updates: No Updates", kNoProgram = "Program Updates: No Updates";
+    const char* kAsLoaded = "Definitions Updates:";  // the caption the window was loaded with
+    const char* kNew = "Definitions Updates: Complete, 2 definitions in use";
+    const char* kNoList = "Updates owned: Error downloading definition updates The file, \"";
+    const char* kNotAList =
+        "Updates owned: Error downloading definition updates The downloaded file is not a definitions";
+    const char* kNoSetup = "Updates owned: Error downloading program updates The file, \"";
+    const char* kEmpty = "Updates owned: Error downloading program updates The downloaded setup program is empty.";
     struct Case {
         const char *localDefver, *defver, *sw2, *mainver, *setup;
         ProgramVersion version;
-        const char *L0, *L1, *box, *defverAfter;
+        std::string L0, L1;
+        const char* box;
     } cases[] = {
-        // Equal versions fetch nothing and pb stays hidden.
-        {"20\r\n", "20", "not fetched", "1.0", nullptr, {1, 0}, kNoDefs, kNoProgram, "", "20\r\n"},
-        // 3 against 10: older as numbers, though "3" sorts after "10" as text.
-        {"10\r\n", "3", "not fetched", "1.0", nullptr, {1, 0}, kNoDefs, kNoProgram, "", "10\r\n"},
+        // Equal versions fetch nothing; 3 against 10 is older as numbers, though "3" sorts after "10" as text.
+        {"20\r\n", "20", "not fetched", "1.0", nullptr, {1, 0}, kNoDefs, kNoProgram, ""},
+        {"10\r\n", "3", "not fetched", "1.0", nullptr, {1, 0}, kNoDefs, kNoProgram, ""},
+        // A newer list is installed and put in force through the owner; a missing local version counts as 0.
+        {"20\r\n", "21\n", list.c_str(), "1.0\n", nullptr, {1, 0}, kNew, kNoProgram, ""},
+        {nullptr, "1", "67305985\r\n", "1.0", nullptr, {1, 0}, kNew, kNoProgram, ""},
         // Program 1.10 reads as 1.1, below the server's 1.9: the setup program is fetched.
-        {"20\r\n", "20", nullptr, "1.9\r\n", "setup", {1, 10}, kNoDefs, "Program Updates: Complete", "", "20\r\n"},
-        // A newer version without sw2.def on the server: defver stays, so the next check retries.
-        {"20\r\n",
-         "21",
-         nullptr,
-         "1.0",
-         nullptr,
-         {1, 0},
-         "Definitions Updates:",
-         kNoProgram,
-         "Updates owned: Error downloading definition updates The file, \"",
-         "20\r\n"},
-        // A missing local version counts as 0.
-        {nullptr, "1", "67305985\r\n", "1.0", nullptr, {1, 0}, "Definitions Updates: Complete", kNoProgram, "", "1"},
-        // The setup program's own failure has its own message; the caption keeps its text.
-        {"20\r\n",
-         "20",
-         nullptr,
-         "2",
-         nullptr,
-         {1, 0},
-         kNoDefs,
-         "Program Updates:",
-         "Updates owned: Error downloading program updates The file, \"",
-         "20\r\n"},
+        {"20\r\n", "20", nullptr, "1.9\r\n", "setup", {1, 10}, kNoDefs, "Program Updates: Complete", ""},
+        // No sw2.def on the server, an empty body, an error page served as a success, binary bytes:
+        // "defver" stays, so the next check tries again.
+        {"20\r\n", "21", nullptr, "1.0", nullptr, {1, 0}, kAsLoaded, kNoProgram, kNoList},
+        {"20\r\n", "21", "", "1.0", nullptr, {1, 0}, kAsLoaded, kNoProgram, kNotAList},
+        {"20\r\n", "21", "<html>Not here</html>", "1.0", nullptr, {1, 0}, kAsLoaded, kNoProgram, kNotAList},
+        {"20\r\n", "21", "\x01\x02\xff\x10", "1.0", nullptr, {1, 0}, kAsLoaded, kNoProgram, kNotAList},
+        // No setup program, an empty one: the caption keeps its text.
+        {"20\r\n", "20", nullptr, "2", nullptr, {1, 0}, kNoDefs, "Program Updates:", kNoSetup},
+        {"20\r\n", "20", nullptr, "2", "", {1, 0}, kNoDefs, "Program Updates:", kEmpty},
     };
-    for (const Case& c : cases) {
-        SCOPED_TRACE(std::string(c.defver) + " " + c.mainver);
-        if (c.localDefver) WriteFile(folder_ + "\\defver", c.localDefver);
-        else ::DeleteFileA((folder_ + "\\defver").c_str());
-        WriteFile(folder_ + "\\sw2.def", installed);
-        ::DeleteFileA((folder_ + "\\VTSetup.exe").c_str());
-        for (const char* name : {"sw2.def", "VTSetup.exe"}) ::DeleteFileA((www_ + name).c_str());
-        Serve("defver", c.defver);
-        Serve("mainver", c.mainver);
-        if (c.sw2) Serve("sw2.def", c.sw2);
-        if (c.setup) Serve("VTSetup.exe", c.setup);
-        Shown shown = Check(c.version);
-        EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.enabled),
-                  std::make_tuple(std::string(c.L0), std::string(c.L1), true));
+    for (std::size_t i = 0; i < std::size(cases); ++i) {
+        const Case& c = cases[i];
+        SCOPED_TRACE("case " + std::to_string(i));
+        Serve(c.defver, c.sw2, c.mainver, c.setup);
+        Shown shown = Check(c.localDefver, c.version);
+        EXPECT_EQ(std::make_tuple(shown.L0, shown.L1, shown.enabled), std::make_tuple(c.L0, c.L1, true));
         ASSERT_EQ(shown.boxes.size(), *c.box ? 1u : 0u);
         if (*c.box) {
             EXPECT_EQ(shown.boxes[0].rfind(c.box, 0), 0u) << shown.boxes[0];
         }
-        EXPECT_EQ(Local("defver"), c.defverAfter);
-        const bool definitions = std::string(c.L0).find("Complete") != std::string::npos;
-        const bool program = std::string(c.L1).find("Complete") != std::string::npos;
-        EXPECT_EQ(Local("sw2.def"), definitions ? std::string(c.sw2) : installed);
+        const bool definitions = c.L0 == kNew, program = c.L1 == "Program Updates: Complete";
+        EXPECT_EQ(shown.reloads, definitions ? 1 : 0);
+        EXPECT_EQ(Local("sw2.def"), definitions ? c.sw2 : kInstalled);
+        EXPECT_EQ(Local("defver"), definitions ? c.defver : c.localDefver != nullptr ? c.localDefver : "");
         EXPECT_EQ(Local("VTSetup.exe"), program ? c.setup : "");
+        EXPECT_EQ(shown.pbVisible, c.L0 != kNoDefs || c.L1 != kNoProgram);
+        if (definitions || program) {
+            EXPECT_TRUE(shown.barFull) << "the last progress painted was 100 %";
+        }
     }
 }
 
 TEST_F(OptionsUpdatesTest, UnreachableServerShowsOneMessageBoxWhileTheButtonIsOff) {
     SetServer("http://127.0.0.1:9");  // discard: nothing listens there on this loopback
-    Shown shown = Check();
+    Shown shown = Check("20\r\n");
     ASSERT_EQ(shown.boxes.size(), 1u);
     EXPECT_EQ(shown.boxes[0].rfind("Updates owned: Cannot check for updates", 0), 0u) << shown.boxes[0];
     EXPECT_NE(shown.boxes[0].find("http://127.0.0.1:9"), std::string::npos) << shown.boxes[0];
     EXPECT_NE(shown.boxes[0].find("(button off)"), std::string::npos) << "the button stays off while the check runs";
     EXPECT_TRUE(shown.enabled);
-    EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
-}
-
-TEST_F(OptionsUpdatesTest, OnlyADefinitionsListReplacesTheInstalledOneAndTakesEffectAtOnce) {
-    Serve("defver", "21\n");
-    Serve("mainver", "1.0\n");
-    // An empty body, an error page served as a success, binary bytes: refused before the rename, and
-    // "defver" is not fetched, so the next check tries again.
-    for (const std::string& body :
-         {std::string(), std::string("<html><body>Not here</body></html>"), std::string("\x01\x02\xff\x00\x10", 5)}) {
-        Serve("sw2.def", body);
-        Shown shown = Check();
-        ASSERT_EQ(shown.boxes.size(), 1u) << body;
-        EXPECT_EQ(shown.boxes[0].rfind("Updates owned: Error downloading definition updates The downloaded file is "
-                                       "not a definitions list",
-                                       0),
-                  0u)
-            << shown.boxes[0];
-        EXPECT_TRUE(shown.enabled);
-        EXPECT_EQ(Local("sw2.def"), "installed definitions\r\n");
-        EXPECT_EQ(Local("defver"), "20\r\n");
-        EXPECT_EQ(::GetFileAttributesA((folder_ + "\\sw2.def.part").c_str()), INVALID_FILE_ATTRIBUTES);
-    }
-    // A list is installed and put in force through the owner at once; the label says so.
-    Serve("sw2.def", "-939524086\r\n33554559\r\n");
-    int reloads = 0;
-    Shown shown = Check({1, 0}, [&] {
-        ++reloads;
-        return std::optional<std::size_t>(2);
-    });
-    EXPECT_EQ(reloads, 1);
-    EXPECT_EQ(shown.L0, "Definitions Updates: Complete, 2 definitions in use");
-    EXPECT_EQ(Local("defver"), "21\n");
+    EXPECT_EQ(Local("sw2.def"), kInstalled);
 }
 
 }  // namespace
