@@ -46,28 +46,43 @@ std::wstring StoredTask(bool remove = false) {
     return text;
 }
 
+// Presses `keys` (with Alt where marked) one a tick while `window` shows modally, noting which control
+// had the focus before each; true when the keys closed the window (it is closed for them otherwise).
+bool PressKeys(OptionsWindow& window, const std::vector<std::pair<WORD, bool>>& keys, std::vector<HWND>& focus) {
+    bool closedByKeys = true;
+    Ticker ticker(60, [&] {
+        if (!::IsWindowVisible(window.hwnd()) || ::GetFocus() == nullptr) return false;
+        if (focus.size() == keys.size()) {  // still open after the last key
+            closedByKeys = false;
+            ::PostMessageA(window.hwnd(), WM_CLOSE, 0, 0);
+            return true;
+        }
+        focus.push_back(::GetFocus());
+        Key(keys[focus.size() - 1].first, keys[focus.size() - 1].second);
+        return false;
+    });
+    window.ShowModal();
+    return closedByKeys;
+}
+
 class OptionsWindowTest : public ::testing::Test {
 protected:
     void SetUp() override { Clean(); }
     void TearDown() override { Clean(); }
 
-    Variant Read(std::int32_t root, const std::string& key, const std::string& name) {
+    // A value as the program reads it; removed first when `remove`.
+    Variant Read(std::int32_t root, const std::string& key, const std::string& name, bool remove = false) {
         RegistryRoutines reg(registry_);
         reg.hkey(root);
         reg.KeyRoot(key);
+        if (remove) reg.DeleteValue(name);
         return reg.GetRegistryValue(name);
     }
-    void Remove(std::int32_t root, const std::string& key, const std::string& name) {
-        RegistryRoutines reg(registry_);
-        reg.hkey(root);
-        reg.KeyRoot(key);
-        reg.DeleteValue(name);
-    }
     void Clean() {
-        Remove(kHkeyLocalMachine, kSettingsKey, "Start");
-        Remove(kHkeyLocalMachine, kSettingsKey, "Tray");
-        Remove(kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel");
-        Remove(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger");
+        Read(kHkeyLocalMachine, kSettingsKey, "Start", true);
+        Read(kHkeyLocalMachine, kSettingsKey, "Tray", true);
+        Read(kHkeyLocalMachine, std::string(kRunKey) + "\\", "Vantorel", true);
+        Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger", true);
         StoredTask(true);
     }
 
@@ -137,18 +152,9 @@ TEST_F(OptionsWindowTest, PointerClicksStoreTheBoxesAndBootWhenWindowsBootsRegis
     EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
     EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("1")));
     EXPECT_EQ(Read(kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger"), Variant(std::string("no")));
-
-    // Opened again, on the updates frame: the boxes show what is now in effect.
-    OptionsWindow again(nullptr, 1, registry_, exe);
-    ::GetWindowTextA(again.hwnd(), caption, sizeof caption);
-    EXPECT_STREQ(caption, "Updates");
-    EXPECT_TRUE(again.controls().F[1]->Visible());
-    EXPECT_FALSE(again.controls().F[0]->Visible());
-    EXPECT_EQ(std::vector<bool>({again.box(0).Value(), again.box(1).Value(), again.box(2).Value()}),
-              std::vector<bool>({false, true, false}));
 }
 
-TEST_F(OptionsWindowTest, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard) {
+TEST_F(OptionsWindowTest, FollowsTheMonitorsDpiWithEveryTextWhole) {
     OptionsWindow window(nullptr, 0, registry_, AutostartPath());
     ASSERT_NE(window.hwnd(), nullptr) << "no display?";
     HWND hwnd = window.hwnd();
@@ -174,55 +180,34 @@ TEST_F(OptionsWindowTest, FollowsTheMonitorsDpiWithEveryTextWholeAndTheKeyboard)
         window.controls().F[1]->SetVisible(false);
         window.controls().F[0]->SetVisible(true);
     }
-
-    // The keyboard: the first box has the focus, Tab walks the boxes to "&Close" and round, Esc closes.
-    std::vector<HWND> focus;
-    Ticker keys(60, [&] {
-        if (!::IsWindowVisible(hwnd)) return false;
-        focus.push_back(::GetFocus());
-        if (focus.size() > 5) ::PostMessageA(hwnd, WM_CLOSE, 0, 0);  // Esc did not close it
-        else Key(focus.size() < 5 ? VK_TAB : VK_ESCAPE);
-        return focus.size() > 5;
-    });
-    ::ShowWindow(hwnd, SW_HIDE);
-    window.ShowModal();
-    EXPECT_EQ(focus, (std::vector<HWND>{window.box(0).hwnd(), window.box(1).hwnd(), window.box(2).hwnd(),
-                                        window.closeButton().hwnd(), window.box(0).hwnd()}))
-        << "a sixth entry: Esc did not close the window";
 }
 
-TEST_F(OptionsWindowTest, AccessKeysReachEveryShownButton) {
+TEST_F(OptionsWindowTest, TabWalksTheControlsEscClosesAndAccessKeysReachEveryShownButton) {
+    // The first box has the focus, Tab walks the boxes to "&Close" and round, Esc closes.
+    OptionsWindow window(nullptr, 0, registry_, AutostartPath());
+    std::vector<HWND> focus;
+    EXPECT_TRUE(PressKeys(
+        window, {{VK_TAB, false}, {VK_TAB, false}, {VK_TAB, false}, {VK_TAB, false}, {VK_ESCAPE, false}}, focus))
+        << "Esc closed the window";
+    EXPECT_EQ(focus, (std::vector<HWND>{window.box(0).hwnd(), window.box(1).hwnd(), window.box(2).hwnd(),
+                                        window.closeButton().hwnd(), window.box(0).hwnd()}));
+
     // The options frame: Alt+C is "&Close" alone (the update button is on the hidden frame).
-    OptionsWindow options(nullptr, 0, registry_, AutostartPath());
     int updates = 0;
+    OptionsWindow options(nullptr, 0, registry_, AutostartPath());
     options.updateButton().Click = [&] { ++updates; };
-    int presses = 0;
-    Ticker close(60, [&] {
-        if (!::IsWindowVisible(options.hwnd())) return false;
-        if (++presses > 20) ::PostMessageA(options.hwnd(), WM_CLOSE, 0, 0);  // never closed: give up
-        else Key('C', true);
-        return presses > 20;
-    });
-    options.ShowModal();
-    EXPECT_LE(presses, 20) << "Alt+C pressed \"&Close\"";
-    EXPECT_EQ(updates, 0);
+    focus.clear();
+    EXPECT_TRUE(PressKeys(options, {{'C', true}}, focus)) << "Alt+C pressed \"&Close\"";
 
     // The updates frame: "&Check for Updates" and "&Close" share C; each Alt+C moves to the next of
     // them, Enter presses the one with the focus.
-    OptionsWindow window(nullptr, 1, registry_, AutostartPath());
-    window.updateButton().Click = [&] { ++updates; };
-    std::vector<HWND> focus;
-    Ticker keys(60, [&] {
-        if (!::IsWindowVisible(window.hwnd())) return false;
-        focus.push_back(::GetFocus());
-        if (focus.size() > 4) ::PostMessageA(window.hwnd(), WM_CLOSE, 0, 0);  // Enter did not close it
-        else Key(focus.size() < 4 ? 'C' : VK_RETURN, focus.size() < 4);
-        return focus.size() > 4;
-    });
-    window.ShowModal();
-    EXPECT_EQ(focus, (std::vector<HWND>{window.updateButton().hwnd(), window.closeButton().hwnd(),
-                                        window.updateButton().hwnd(), window.closeButton().hwnd()}))
-        << "a fifth entry: Enter did not press \"&Close\"";
+    OptionsWindow updatesFrame(nullptr, 1, registry_, AutostartPath());
+    updatesFrame.updateButton().Click = [&] { ++updates; };
+    focus.clear();
+    EXPECT_TRUE(PressKeys(updatesFrame, {{'C', true}, {'C', true}, {'C', true}, {VK_RETURN, false}}, focus))
+        << "Enter pressed \"&Close\"";
+    EXPECT_EQ(focus, (std::vector<HWND>{updatesFrame.updateButton().hwnd(), updatesFrame.closeButton().hwnd(),
+                                        updatesFrame.updateButton().hwnd(), updatesFrame.closeButton().hwnd()}));
     EXPECT_EQ(updates, 0) << "a shared access key presses nothing";
 }
 
