@@ -1,9 +1,11 @@
 // The downloader with the real WinINet transfer, disk and message pump under Wine, against the
 // scriptable HTTP server on 127.0.0.1 that a CTest fixture starts (its port in the file named by
 // VANTOREL_HTTP_PORT_FILE): the status line, the Range header and the credentials cross the wire,
-// bodies arrive as exact 1024-byte chunks, a connection cut mid-body is caught, cancels stop at
-// once, window messages keep running while a slow download waits, and https checks certificates.
-// A download that does not complete leaves the installed file and no partial file behind.
+// bodies arrive as exact 1024-byte chunks, a connection cut mid-body is caught, a cancel stops the
+// worker at once, window messages keep running while a slow download waits, and https checks
+// certificates. A download that does not complete leaves the installed file and no partial file
+// behind. Cancels while the server does not answer, trickles or sends without end are proved on
+// the real program (tests/e2e/e2e_tests.py, closing the updates window during a check).
 #include <windows.h>
 #include <wincrypt.h>
 
@@ -37,18 +39,6 @@ std::string Server(const std::string& scheme, const std::string& file) {
     std::string port = ReadFile("Z:" + file);
     while (!port.empty() && std::isspace(static_cast<unsigned char>(port.back()))) port.pop_back();
     return scheme + "://127.0.0.1:" + port;
-}
-
-// A thread timer standing for the user's click on "Cancel" after `ms`; the time it fired in `cancelledAt`.
-FileDownloader* cancelTarget = nullptr;
-DWORD cancelledAt = 0;
-UINT_PTR CancelAfter(FileDownloader& fd, UINT ms) {
-    cancelTarget = &fd;
-    return ::SetTimer(nullptr, 0, ms, [](HWND, UINT, UINT_PTR id, DWORD) {
-        ::KillTimer(nullptr, id);
-        cancelledAt = ::GetTickCount();
-        cancelTarget->Cancel();
-    });
 }
 
 std::string Progress(std::initializer_list<int> steps) {
@@ -154,7 +144,7 @@ TEST_F(WinInetDownload, RefusalsCutsAndUnusableSizesLeaveTheInstalledFile) {
     EXPECT_EQ(ReadFile(dest_), Pattern(3000));
 }
 
-TEST_F(WinInetDownload, SlowDataShowsProgressWithWindowMessagesRunningAndCancelEndsEveryWaitWithinASecond) {
+TEST_F(WinInetDownload, SlowDataShowsProgressWithWindowMessagesRunning) {
     // 2 KB/s: a chunk of progress every half second, not all of it once a 64 KiB block is full; a
     // thread timer's WM_TIMER only runs when someone dispatches messages: the download must.
     static int ticks = 0;
@@ -170,19 +160,6 @@ TEST_F(WinInetDownload, SlowDataShowsProgressWithWindowMessagesRunningAndCancelE
     EXPECT_LT(longest, 1000u) << "the longest wait for progress";
     EXPECT_TRUE(ReadFile(dest_) == Pattern(4096));
     EXPECT_GE(ticks, static_cast<int>(took / 20 / 3)) << "the timer ran " << ticks << " times in " << took << " ms";
-
-    // The user cancels while the server does not answer, trickles a byte a second, sends without end,
-    // or holds its answer for 8 s.
-    fd_.DownloadProgress = nullptr;
-    for (const char* path : {"/noanswer", "/trickle/2000/1000", "/endless", "/stall/8000"}) {
-        SCOPED_TRACE(path);
-        timer = CancelAfter(fd_, 1500);
-        EXPECT_FALSE(Get(path));
-        DWORD cancelled = ::GetTickCount() - cancelledAt;
-        ::KillTimer(nullptr, timer);
-        EXPECT_LT(cancelled, 1000u) << "the download returned " << cancelled << " ms after the cancel";
-        EXPECT_TRUE(events_.empty());
-    }
 }
 
 TEST_F(WinInetDownload, FailedConnectionsAndSilenceAreRequestErrors) {
@@ -192,12 +169,13 @@ TEST_F(WinInetDownload, FailedConnectionsAndSilenceAreRequestErrors) {
         EXPECT_EQ(events_.rfind("error:Error: ", 0), 0u) << events_;
         EXPECT_EQ(events_.substr(events_.size() - 11), " occurred. ") << events_;
     }
-    // A server that never answers is given up after the silence limit.
+    // A server that says nothing is given up after the silence limit; its late answer finds nobody
+    // waiting.
     win32::WinInetTransfer inet(pump_, win32::WinInetTransfer::kDefaultBlockSize, 500);
     FileDownloader fd(inet, disk_, pump_);
     fd.DownloadErrors = [this](const std::string& s) { events_ += "error:" + s; };
     DWORD started = ::GetTickCount();
-    EXPECT_FALSE(fd.DownloadFile(server_ + "/noanswer", dest_));
+    EXPECT_FALSE(fd.DownloadFile(server_ + "/stall/5000", dest_));
     EXPECT_LT(::GetTickCount() - started, 3000u);
     EXPECT_NE(events_.find("timed out"), std::string::npos) << events_;
 }
