@@ -9,21 +9,25 @@ With --tls CERT KEY it speaks https. The port, chosen by the system, is written 
 """
 import argparse
 import base64
+import functools
 import os
 import socket
 import sys
 import time
 from http.server import BaseHTTPRequestHandler, ThreadingHTTPServer
 
+UNIT = bytes(((i * 7 + i // 251) & 0xFF) for i in range(251 * 256))  # the pattern repeats after this
 
-_cache = {}
+
+def piece(start, size):
+    """The pattern's `size` bytes from byte `start` on."""
+    offset = start % len(UNIT)
+    return (UNIT * ((offset + size) // len(UNIT) + 1))[offset:offset + size]
 
 
+@functools.lru_cache(maxsize=8)
 def body(size):
-    if size not in _cache:
-        unit = bytes(((i * 7 + i // 251) & 0xFF) for i in range(min(size, 1 << 20)))
-        _cache[size] = (unit * (size // len(unit) + 1))[:size] if unit else b""
-    return _cache[size]
+    return piece(0, size)
 
 
 class Handler(BaseHTTPRequestHandler):
@@ -32,26 +36,15 @@ class Handler(BaseHTTPRequestHandler):
     def log_message(self, fmt, *args):
         sys.stderr.write("%s %s\n" % (self.requestline, fmt % args))
 
-    def answer(self, status, data, length=None, close=False, extra=()):
+    def answer(self, status, data, lengths=None, extra=()):
+        """`data` with a Content-Length of each of `lengths` (its own size by default, none for [])."""
         self.send_response(status)
-        if length is not False:
-            self.send_header("Content-Length", str(len(data)) if length is None else length)
+        for length in [str(len(data))] if lengths is None else lengths:
+            self.send_header("Content-Length", length)
         for name, value in extra:
             self.send_header(name, value)
-        if close:
-            self.send_header("Connection", "close")
-            self.close_connection = True
         self.end_headers()
         self.wfile.write(data)
-        self.wfile.flush()
-
-    def cut(self):
-        self.wfile.flush()
-        self.close_connection = True
-        try:
-            self.connection.shutdown(socket.SHUT_RDWR)
-        except OSError:
-            pass
 
     def do_GET(self):
         parts = self.path.split("?")[0].strip("/").split("/")
@@ -62,67 +55,47 @@ class Handler(BaseHTTPRequestHandler):
         try:
             if kind == "noanswer":
                 time.sleep(3600)
-            elif kind == "trickle" or kind == "endless":
-                n, pause = (int(args[0]), int(args[1]) / 1000.0) if kind == "trickle" else (10 ** 9, 0)
-                self.send_response(200)
-                self.send_header("Content-Length", str(n))
-                self.end_headers()
-                piece = b"7" if kind == "trickle" else body(1 << 16)
-                for start in range(0, n, len(piece)):
-                    self.wfile.write(piece[:n - start])
-                    self.wfile.flush()
-                    time.sleep(pause)
-            elif kind == "twolengths":
-                self.answer(200, body(int(args[0])), length=args[0], extra=[("Content-Length", args[1])])
+            elif kind in ("slow", "trickle", "endless"):  # N bytes in pieces (1024, 1, 64 KiB), MS apart
+                n, pause = (int(args[0]), int(args[1])) if kind != "endless" else (10 ** 12, 0)
+                size = int(args[2]) if len(args) > 2 else {"slow": 1024, "trickle": 1, "endless": 1 << 16}[kind]
+                self.answer(200, b"", [str(n)])
+                for start in range(0, n, size):
+                    time.sleep(pause / 1000.0)
+                    self.wfile.write(piece(start, min(size, n - start)))
+            elif kind == "stall":
+                time.sleep(int(args[0]) / 1000.0)
+                self.answer(200, body(10))
             elif kind == "vt":
                 files = {"defver": b"99\n", "mainver": b"0\n", "sw2.def": b"-939524086\r\n33554559\r\n"}
-                if args[0] in files:
-                    self.answer(200, files[args[0]])
-                else:
-                    self.answer(404, b"not found")
+                self.answer(200 if args[0] in files else 404, files.get(args[0], b"not found"))
             elif kind == "body":
                 self.answer(200, body(int(args[0])))
             elif kind == "range":
+                n = int(args[0])
                 if self.headers.get("Range") == "bytes=0-":
-                    n = int(args[0])
                     self.answer(206, body(n), extra=[("Content-Range", "bytes 0-%d/%d" % (n - 1, n))])
                 else:
                     self.answer(400, b"expected Range: bytes=0-")
             elif kind == "status":
                 code = int(args[0])
-                self.answer(code, b"" if code in (204, 304) else ("status %d" % code).encode(),
-                            length=False if code == 204 else None)
+                self.answer(code, b"" if code == 204 else b"status %d" % code, [] if code == 204 else None)
             elif kind == "auth":
-                expected = "Basic " + base64.b64encode(b"vt:secret").decode()
-                if self.headers.get("Authorization") == expected:
+                if self.headers.get("Authorization") == "Basic " + base64.b64encode(b"vt:secret").decode():
                     self.answer(200, body(int(args[0])))
                 else:
                     self.answer(401, b"who are you?", extra=[("WWW-Authenticate", 'Basic realm="vt"')])
             elif kind in ("cut", "length"):  # announces N (or TEXT), sends SENT (or N) bytes and closes
-                announced, n = (args[0], int(args[1])) if kind == "length" else (args[0], int(args[0]))
-                self.send_response(200)
-                self.send_header("Content-Length", announced)
-                self.end_headers()
-                self.wfile.write(body(n)[:int(args[1])])
-                self.cut()
+                self.answer(200, body(int(args[1])), [args[0]])
+                self.close_connection = True
+                self.connection.shutdown(socket.SHUT_RDWR)
             elif kind == "nolength":
-                self.answer(200, body(int(args[0])), length=False, close=True)
-            elif kind == "slow":
-                n, pause = int(args[0]), int(args[1]) / 1000.0
-                piece = int(args[2]) if len(args) > 2 else 1024
-                self.send_response(200)
-                self.send_header("Content-Length", str(n))
-                self.end_headers()
-                for start in range(0, n, piece):
-                    time.sleep(pause)
-                    self.wfile.write(body(n)[start:start + piece])
-                    self.wfile.flush()
-            elif kind == "stall":
-                time.sleep(int(args[0]) / 1000.0)
-                self.answer(200, body(10))
+                self.answer(200, body(int(args[0])), [], extra=[("Connection", "close")])
+                self.close_connection = True
+            elif kind == "twolengths":
+                self.answer(200, body(int(args[0])), args[:2])
             else:
                 self.answer(404, b"not found")
-        except (BrokenPipeError, ConnectionResetError):
+        except OSError:  # the client went away
             self.close_connection = True
 
 
