@@ -22,22 +22,28 @@ using namespace vantorel::testing;
 
 constexpr const char* kQuotedExe = "\"C:\\vantorel.exe\"";
 
-// The updates frame: no check runs in these tests.
-struct SilentFrame final : UpdatesFrame {
+// The options window's logic on fakes; it is its own updates frame, where no check runs.
+struct OptionsRig final : UpdatesFrame {
+    OptionsRig()
+        : form(
+              OptionsPlatform{registry, scheduler, pump, disk, disk, inet, fd1, fd2, fd3},
+              OptionsControls{{&f[0], &f[1]}, {&box[0], &box[1], &box[2]}, &close, &update, {&l[0], &l[1]}}, *this,
+              UpdateTarget{"C:\\Vantorel", {1, 0}}, "C:\\vantorel.exe", [] {},
+              [this](const std::string& m) { messages.push_back(m); }) {}
     void SetBtnUpdateEnabled(bool) override {}
     void SetLCaption(int, const std::string&) override {}
     void ShowPb() override {}
     platform::PictureBox& pb() override { std::abort(); }
     void MsgBoxExclamation(const std::string&, const std::string&) override {}
-};
 
-struct OptionsRig {
-    explicit OptionsRig(FakeRegistry& registry)
-        : form(
-              OptionsPlatform{registry, scheduler, pump, disk, disk, inet, fd1, fd2, fd3},
-              OptionsControls{{&f[0], &f[1]}, {&box[0], &box[1], &box[2]}, &close, &update, {&l[0], &l[1]}}, frame,
-              UpdateTarget{"C:\\Vantorel", {1, 0}}, "C:\\vantorel.exe", [] {},
-              [this](const std::string& m) { messages.push_back(m); }) {}
+    Variant Read(const std::string& key, const std::string& name) {
+        RegistryRoutines reg(registry);
+        reg.hkey(platform::kHkeyLocalMachine);
+        reg.KeyRoot(key);
+        return reg.GetRegistryValue(name);
+    }
+
+    FakeRegistry registry;
     FakeFrame f[2];
     FakeCheckBox box[3];
     FakeButton close, update;
@@ -46,17 +52,9 @@ struct OptionsRig {
     FakePump pump;
     FakeFileSystem disk;
     FakeHttpTransfer inet, fd1, fd2, fd3;
-    SilentFrame frame;
     std::vector<std::string> messages;
     FrmOptions form;
 };
-
-Variant Read(FakeRegistry& registry, const std::string& key, const std::string& name) {
-    RegistryRoutines reg(registry);
-    reg.hkey(platform::kHkeyLocalMachine);
-    reg.KeyRoot(key);
-    return reg.GetRegistryValue(name);
-}
 
 TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
     using platform::kHkeyLocalMachine;
@@ -66,15 +64,14 @@ TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
         {platform::kRegDword, std::string("\1\0\0\0", 4), "1x", "yes", "101"},
     };
     for (const auto& [type, start, tray, debugger, boxes] : cases) {
-        FakeRegistry registry;
+        OptionsRig rig;
         auto put = [&](std::int32_t root, const char* key, const char* name, const std::string& v, std::int32_t t) {
-            registry.PutRaw(root, key, name, t, {v.begin(), v.end()});
+            rig.registry.PutRaw(root, key, name, t, {v.begin(), v.end()});
         };
         put(kHkeyLocalMachine, kRunKey, "Vantorel", "C:\\vantorel.exe", platform::kRegSz);
         put(kHkeyLocalMachine, kSettingsKey, "Start", start, type);
         put(kHkeyLocalMachine, kSettingsKey, "Tray", tray, platform::kRegSz);
         put(platform::kHkeyCurrentUser, kInternetExplorerMainKey, "Disable Script Debugger", debugger, 1);
-        OptionsRig rig(registry);
         rig.form.Form_Load();
         std::string got;
         for (const FakeCheckBox& box : rig.box) got += box.Value() ? '1' : '0';
@@ -83,23 +80,22 @@ TEST(FrmOptions, OnlyExactStoredValuesCheckTheirBoxes) {
 }
 
 TEST(FrmOptions, StartWithWindowsThatTheSchedulerRefusesIsUndoneAndSaysWhy) {
-    FakeRegistry registry;
-    OptionsRig rig(registry);
+    OptionsRig rig;
     rig.form.Form_Load();
     rig.scheduler.failure = {"ITaskFolder::RegisterTask", static_cast<std::int32_t>(0x80070005u), "Access is denied."};
     rig.box[0].UserToggle();  // on, refused
     EXPECT_FALSE(rig.box[0].Value()) << "the box shows unchecked again";
-    EXPECT_TRUE(IsEmpty(Read(registry, std::string(kRunKey) + "\\", "Vantorel")));
-    EXPECT_TRUE(IsEmpty(Read(registry, kSettingsKey, "Start")));
+    EXPECT_TRUE(IsEmpty(rig.Read(std::string(kRunKey) + "\\", "Vantorel")));
+    EXPECT_TRUE(IsEmpty(rig.Read(kSettingsKey, "Start")));
 
     rig.scheduler.failure = {};
     rig.box[0].UserToggle();  // on
-    EXPECT_EQ(rig.scheduler.tasks, (std::map<std::string, std::string>{{"Vantorel", kQuotedExe}}));
     rig.scheduler.failure = {"ITaskFolder::DeleteTask", static_cast<std::int32_t>(0x80070005u), "Access is denied."};
     rig.box[0].UserToggle();  // off, refused: the task still starts the program
     EXPECT_TRUE(rig.box[0].Value());
-    EXPECT_EQ(Read(registry, std::string(kRunKey) + "\\", "Vantorel"), Variant(std::string(kQuotedExe)));
-    EXPECT_EQ(Read(registry, kSettingsKey, "Start"), Variant(std::string("1")));
+    EXPECT_EQ(rig.scheduler.tasks, (std::map<std::string, std::string>{{"Vantorel", kQuotedExe}}));
+    EXPECT_EQ(rig.Read(std::string(kRunKey) + "\\", "Vantorel"), Variant(std::string(kQuotedExe)));
+    EXPECT_EQ(rig.Read(kSettingsKey, "Start"), Variant(std::string("1")));
     EXPECT_EQ(rig.messages,
               (std::vector<std::string>{
                   "Vantorel cannot be set to start when Windows boots: the Task Scheduler refused its task "
