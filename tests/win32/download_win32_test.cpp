@@ -5,7 +5,8 @@
 // running while a slow download waits, and https checks certificates. A download that does not
 // complete leaves the installed file and no partial file behind. Cancels, while the server does not
 // answer, trickles or sends without end, are proved on the real program (tests/e2e/e2e_tests.py,
-// closing the updates window during a check, within a second).
+// closing the updates window during a check, within a second). Last, the file system the
+// downloader writes through is held to the same answers as the in-memory fake of its native tests.
 #include <windows.h>
 #include <wincrypt.h>
 
@@ -18,8 +19,10 @@
 #include <sstream>
 
 #include "download/file_downloader.h"
+#include "fakes/fake_file_system.h"
 #include "fakes/fake_http_transfer.h"
 #include "platform/win32/file_system_win32.h"
+#include "platform/win32/files_win32.h"
 #include "platform/win32/http_transfer_win32.h"
 #include "platform/win32/shell_win32.h"
 
@@ -197,6 +200,63 @@ TEST_F(WinInetDownload, TrustedCertificateDeliversAndUntrustedIsRefused) {
     EXPECT_NE(events_.find("certificate authority"), std::string::npos) << events_;
     EXPECT_TRUE(Get(server("trusted") + "/range/5000")) << events_;
     EXPECT_EQ(ReadFile(dest_), Pattern(5000));
+}
+
+TEST_F(WinInetDownload, TheFileSystemAnswersLikeTheFake) {
+    win32::Win32Files realFiles;
+    testing::FakeFileSystem fake;
+    for (bool real : {true, false}) {
+        SCOPED_TRACE(real ? "Win32" : "fake");
+        platform::FileSystem& disk = real ? static_cast<platform::FileSystem&>(disk_) : fake;
+        platform::Files& files = real ? static_cast<platform::Files&>(realFiles) : fake;  // reads `disk`
+        const std::string folder = real ? folder_ : "C:\\Vantorel";                       // existing and empty
+        const std::string one = folder + "\\new", two = one + "\\two";
+        const std::string part = one + "\\sw2.def.part", to = one + "\\sw2.def";
+        platform::FileError error;
+        auto writeWhole = [&](const std::string& path, const std::string& content) {
+            auto file = disk.CreateNew(path, error);
+            return file && file->Write(content, error) && file->Close(error);
+        };
+        EXPECT_TRUE(disk.FolderExists(folder + "\\")) << "a trailing backslash names the same folder";
+        EXPECT_FALSE(disk.CreateFolder(two, error));
+        EXPECT_EQ(error.number, 3) << "folders are created one level at a time";
+        EXPECT_FALSE(disk.CreateNew(two + "\\file", error));
+        EXPECT_EQ(error.number, 3);
+        ASSERT_TRUE(disk.CreateFolder(one + "\\", error));
+        EXPECT_TRUE(disk.FolderExists(one));
+        EXPECT_FALSE(disk.FileExists(one)) << "a folder is no file";
+
+        // A new file over a longer one starts empty and takes every write, empty ones included.
+        ASSERT_TRUE(writeWhole(part, std::string(100000, 'a')));
+        EXPECT_FALSE(disk.FolderExists(part)) << "a file is no folder";
+        auto file = disk.CreateNew(part, error);
+        ASSERT_TRUE(file);
+        std::string expected, content;
+        for (int i = 0; i < 300; ++i) {
+            std::string piece(i % 7 == 0 ? 0 : 1024, static_cast<char>(i));
+            expected += piece;
+            ASSERT_TRUE(file->Write(piece, error));
+        }
+        ASSERT_TRUE(file->Close(error));
+        file.reset();
+        // Replace puts it in place, onto a missing destination and over an existing one.
+        ASSERT_TRUE(disk.Replace(part, to, error));
+        ASSERT_TRUE(writeWhole(part, "second"));
+        ASSERT_TRUE(files.ReadAll(to, content));
+        EXPECT_TRUE(content == expected);
+        ASSERT_TRUE(disk.Replace(part, to, error));
+        EXPECT_FALSE(disk.FileExists(part));
+        EXPECT_FALSE(disk.Replace(part, to, error));
+        EXPECT_EQ(error.number, 2) << "from nothing: refused, the destination kept";
+        ASSERT_TRUE(files.ReadAll(to, content));
+        EXPECT_EQ(content, "second");
+        EXPECT_TRUE(disk.Delete(to));
+        EXPECT_FALSE(disk.Delete(to));
+
+        std::uint32_t bytesPerSector = 0, sectorsPerCluster = 0, freeClusters = 0;
+        ASSERT_TRUE(disk.QueryDiskFreeSpace(folder.substr(0, 3), bytesPerSector, sectorsPerCluster, freeClusters));
+        EXPECT_GT(std::uint64_t{bytesPerSector} * sectorsPerCluster * freeClusters, 0u);
+    }
 }
 
 }  // namespace
