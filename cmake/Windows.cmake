@@ -127,8 +127,6 @@ add_test(NAME https_servers_stop COMMAND sh -c "\
     '${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh' stop '${VANTOREL_HTTPS_DIR}/untrusted'")
 set_tests_properties(https_servers_stop PROPERTIES FIXTURES_CLEANUP https_servers)
 
-vantorel_wine_test(draw_progress_win32_tests tests/win32/draw_progress_win32_test.cpp)
-
 vantorel_wine_test(download_win32_tests tests/win32/download_win32_test.cpp)
 target_link_libraries(download_win32_tests PRIVATE ws2_32 crypt32)
 set_tests_properties(download_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;http_server;https_servers"

@@ -4,7 +4,8 @@
 // setting pointing at nginx. "&Check for Updates" is clicked with BM_CLICK, and what the window
 // shows is read back from its controls: the status labels, the picture box pb and its pixels, the
 // button and the "Updates" message boxes. Closing the window during a check, and a new list taking
-// effect in the running guard, are proved end to end (tests/e2e/e2e_tests.py).
+// effect in the running guard, are proved end to end (tests/e2e/e2e_tests.py). Then DrawProgress on
+// its own on a bitmap the size of pb.
 #include <windows.h>
 
 #include <gtest/gtest.h>
@@ -16,8 +17,10 @@
 #include <sstream>
 
 #include "app/options_window.h"
+#include "platform/win32/picture_box_win32.h"
 #include "platform/win32/registry_win32.h"
 #include "settings/registry_routines.h"
+#include "ui/options/draw_progress.h"
 #include "win32/ui_input.h"
 
 namespace vantorel::win32 {
@@ -219,6 +222,50 @@ TEST_F(OptionsUpdatesTest, UnreachableServerShowsOneMessageBoxWhileTheButtonIsOf
     EXPECT_NE(shown.boxes[0].find("(button off)"), std::string::npos) << "the button stays off while the check runs";
     EXPECT_TRUE(shown.enabled);
     EXPECT_EQ(Local("sw2.def"), kInstalled);
+}
+
+// The XOR passes leave the bar in the highlight colour and turn the label's strokes under it into the
+// window colour; 0 percent draws no bar.
+TEST(DrawProgressGdi, BarAndInvertedLabelOnARealBitmap) {
+    GdiPictureBox pb(393, 17);
+    ASSERT_EQ(pb.TwipsPerPixelX(), 15) << "the sizes below assume 96 dots per inch";
+    const COLORREF fore = ::GetSysColor(COLOR_HIGHLIGHT), back = ::GetSysColor(COLOR_WINDOW);
+    ASSERT_NE(fore, back);
+    // The columns of the label, centred in the inner width (5865 twips).
+    auto label = [&](const char* text) {
+        const int left = static_cast<int>((5865 - pb.TextWidth(text)) / 2 / 15);
+        return std::make_pair(left, left + static_cast<int>(pb.TextWidth(text) / 15));
+    };
+
+    DrawProgress(pb, 50, kProgressForeColor, kProgressBackColor);
+    const auto [labelLeft, labelRight] = label("50%");
+    EXPECT_EQ(pb.Pixel(100, 0), back) << "the border row stays clear";
+    // The bar covers the columns whose left edge lies before half of the inner width; not the border.
+    for (int x = 0; x < 393; ++x) {
+        if (x >= labelLeft - 1 && x <= labelRight + 1) continue;
+        EXPECT_EQ(pb.Pixel(x, 2) == fore, x >= 1 && x * 15 < 5865 / 2.0) << "column " << x;
+    }
+    // Inside the label the text shows on both sides of the bar's end (column 195): under the bar
+    // as pixels that are not the bar's colour, beyond it as pixels that are not the background.
+    // (Wine smooths the glyphs, so their edges are blends of the two colours.)
+    int strokesUnderBar = 0, strokesBeyond = 0;
+    for (int y = 1; y < 15; ++y) {
+        for (int x = labelLeft; x <= labelRight; ++x) {
+            if (x <= 195 && pb.Pixel(x, y) != fore) ++strokesUnderBar;
+            if (x > 195 && pb.Pixel(x, y) != back) ++strokesBeyond;
+        }
+    }
+    EXPECT_GT(strokesUnderBar, 5);
+    EXPECT_GT(strokesBeyond, 5);
+
+    // 0 percent: nothing in the highlight colour outside the label.
+    DrawProgress(pb, 0, kProgressForeColor, kProgressBackColor);
+    const auto [zeroLeft, zeroRight] = label("0%");
+    int outside = 0;
+    for (int y = 0; y < 17; ++y)
+        for (int x = 0; x < 393; ++x)
+            if ((x < zeroLeft - 1 || x > zeroRight + 1) && pb.Pixel(x, y) != back) ++outside;
+    EXPECT_EQ(outside, 0);
 }
 
 }  // namespace
