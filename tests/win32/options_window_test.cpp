@@ -1,14 +1,15 @@
 // The options window on the real registry and Wine's Task Scheduler: its load step on an empty
 // registry, its boxes clicked with the real pointer (SendInput, hit-tested by the system) writing the
 // settings Windows and Internet Explorer read, and the modal loop ending on "&Close"; checking "Boot
-// when Windows boots" registers the logon task "Vantorel" with Wine's scheduler, unchecking removes
-// it. Then the window at other DPIs and on the keyboard. The values and the task it touches are
-// removed afterwards.
+// when Windows boots" registers the logon task "Vantorel" with Wine's scheduler (read back from the
+// file the scheduler keeps it in), unchecking removes it. Then the window at other DPIs and on the
+// keyboard. The values and the task it touches are removed afterwards.
 #include <windows.h>
-#include <taskschd.h>
 
 #include <gtest/gtest.h>
 
+#include <fstream>
+#include <sstream>
 #include <vector>
 
 #include "app/options_window.h"
@@ -22,28 +23,16 @@ namespace {
 using platform::kHkeyCurrentUser;
 using platform::kHkeyLocalMachine;
 
-// The task "Vantorel" as the scheduler keeps it, its XML ("" when there is none); removes it first when asked.
-std::wstring StoredTask(bool remove = false) {
-    HRESULT com = ::CoInitializeEx(nullptr, COINIT_APARTMENTTHREADED);
-    ITaskService* service = nullptr;
-    ITaskFolder* folder = nullptr;
-    IRegisteredTask* task = nullptr;
-    VARIANT none;
-    ::VariantInit(&none);
-    BSTR root = ::SysAllocString(L"\\"), name = ::SysAllocString(L"Vantorel"), xml = nullptr;
-    if (SUCCEEDED(::CoCreateInstance(CLSID_TaskScheduler, nullptr, CLSCTX_INPROC_SERVER, IID_ITaskService,
-                                     reinterpret_cast<void**>(&service))) &&
-        SUCCEEDED(service->Connect(none, none, none, none)) && SUCCEEDED(service->GetFolder(root, &folder))) {
-        if (remove) folder->DeleteTask(name, 0);
-        if (SUCCEEDED(folder->GetTask(name, &task))) task->get_Xml(&xml);
-    }
-    std::wstring text = xml != nullptr ? xml : L"";
-    for (IUnknown* object :
-         {static_cast<IUnknown*>(task), static_cast<IUnknown*>(folder), static_cast<IUnknown*>(service)})
-        if (object != nullptr) object->Release();
-    for (BSTR b : {root, name, xml}) ::SysFreeString(b);
-    if (SUCCEEDED(com)) ::CoUninitialize();
-    return text;
+// The task "Vantorel" as the Task Scheduler stores it, the XML file in its tasks folder ("" when there
+// is none); removed first when asked.
+std::string StoredTask(bool remove = false) {
+    char system[MAX_PATH];
+    ::GetSystemDirectoryA(system, MAX_PATH);
+    const std::string file = std::string(system) + "\\Tasks\\Vantorel";
+    if (remove) ::DeleteFileA(file.c_str());
+    std::stringstream content;
+    content << std::ifstream(file, std::ios::binary).rdbuf();
+    return content.str();
 }
 
 // Presses `keys` (with Alt where marked) one a tick while `window` shows modally, noting which control
@@ -103,7 +92,7 @@ TEST_F(OptionsWindowTest, PointerClicksStoreTheBoxesAndBootWhenWindowsBootsRegis
     // it, toggles the other two boxes and closes the window: each click waits for the last one's change.
     const int order[] = {0, 0, 1, 2};
     std::string refusal;
-    std::wstring task;
+    std::string task;
     Variant run, start;
     std::size_t step = 0;
     bool before = false, clicked = false;
@@ -135,14 +124,14 @@ TEST_F(OptionsWindowTest, PointerClicksStoreTheBoxesAndBootWhenWindowsBootsRegis
     // <Principal> and an <Exec/> without <Command>, and its definition answers E_NOTIMPL for the trigger and action
     // collections and the principal; the logon trigger, the run level and the command line stay unproven here, and
     // IgnoreNew and Enabled are Wine's defaults too. The settings below differ from its defaults.
-    for (const wchar_t* setting :
-         {L"<ExecutionTimeLimit>PT0S<", L"<DisallowStartIfOnBatteries>false<", L"<StopIfGoingOnBatteries>false<"})
-        EXPECT_NE(task.find(setting), std::wstring::npos) << "checking registered the task with " << setting;
+    for (const char* setting :
+         {"<ExecutionTimeLimit>PT0S<", "<DisallowStartIfOnBatteries>false<", "<StopIfGoingOnBatteries>false<"})
+        EXPECT_NE(task.find(setting), std::string::npos) << "checking registered the task with " << setting;
     EXPECT_EQ(run, Variant("\"" + exe + "\""));
     EXPECT_EQ(start, Variant(std::string("1")));
 
     EXPECT_EQ(window.hwnd(), nullptr) << "the pointer click on \"&Close\" closed the window";
-    EXPECT_EQ(StoredTask(), L"") << "unchecking removes the task";
+    EXPECT_EQ(StoredTask(), "") << "unchecking removes the task";
     EXPECT_TRUE(IsEmpty(Read(kHkeyLocalMachine, kRunKey, "Vantorel"))) << "unchecking removes the Run value";
     EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Start"), Variant(std::string("0")));
     EXPECT_EQ(Read(kHkeyLocalMachine, kSettingsKey, "Tray"), Variant(std::string("1")));
