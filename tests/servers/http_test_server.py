@@ -3,7 +3,7 @@
 
 Bodies are a fixed pattern (byte i is (7 i + i // 251) mod 256). Paths: /body/N, /range/N (206 only for
 "Range: bytes=0-"), /status/CODE, /auth/N (Basic vt / secret), /cut/N/SENT, /nolength/N, /length/TEXT/N,
-/slow/N/MS[/PIECE], /stall/MS, /noanswer, /trickle/N/MS, /endless, /twolengths/A/B, /vt/NAME (an update
+/slow/N/MS[/PIECE], /noanswer, /trickle/N/MS, /endless, /twolengths/A/B, /vt/NAME (an update
 server) and /do/KIND,ARG,.../NAME/vt/FILE (the update server answering FILE NAME as /KIND/ARG/... would).
 With --tls CERT KEY it speaks https. The port, chosen by the system, is written to --port-file.
 """
@@ -62,9 +62,6 @@ class Handler(BaseHTTPRequestHandler):
                 for start in range(0, n, size):
                     time.sleep(pause / 1000.0)
                     self.wfile.write(piece(start, min(size, n - start)))
-            elif kind == "stall":
-                time.sleep(int(args[0]) / 1000.0)
-                self.answer(200, body(10))
             elif kind == "vt":
                 files = {"defver": b"99\n", "mainver": b"0\n", "sw2.def": b"-939524086\r\n33554559\r\n"}
                 self.answer(200 if args[0] in files else 404, files.get(args[0], b"not found"))
