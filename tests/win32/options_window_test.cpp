@@ -91,8 +91,7 @@ TEST_F(OptionsWindowTest, PointerClicksStoreTheBoxesAndBootWhenWindowsBootsRegis
     // The user checks "Boot when Windows boots" (what it stored is read while it shows checked), unchecks
     // it, toggles the other two boxes and closes the window: each click waits for the last one's change.
     const int order[] = {0, 0, 1, 2};
-    std::string refusal;
-    std::string task;
+    std::string refusal, task;
     Variant run, start;
     std::size_t step = 0;
     bool before = false, clicked = false;
