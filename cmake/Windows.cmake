@@ -138,9 +138,9 @@ target_link_libraries(download_bench_win32 PRIVATE vantorel_win32)
 
 # The update check against nginx serving the update files with the configuration in deploy/.
 set(VANTOREL_NGINX_DIR ${CMAKE_BINARY_DIR}/nginx)
-add_test(NAME nginx_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh start ${VANTOREL_NGINX_DIR})
+add_test(NAME nginx_start COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh start ${VANTOREL_NGINX_DIR} nginx)
 set_tests_properties(nginx_start PROPERTIES FIXTURES_SETUP nginx)
-add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/nginx_fixture.sh stop ${VANTOREL_NGINX_DIR})
+add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh stop ${VANTOREL_NGINX_DIR})
 set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
 
 # The real options window's updates panel against nginx.
