@@ -18,7 +18,6 @@ add_executable(vantorel_tests
     tests/file_downloader_test.cpp
     tests/http_header_test.cpp
     tests/leading_number_test.cpp
-    tests/sweep_test.cpp
     tests/frm_main_test.cpp
 )
 target_link_libraries(vantorel_tests PRIVATE vantorel_fakes vantorel_native GTest::gtest_main)

@@ -1,13 +1,15 @@
-// The main window and the guard behind it, against fakes, for what the real window and program under
-// Wine (tests/win32/, tests/e2e/) cannot stage: malformed settings, the missing-definitions flow
-// before the tray icon, the unload order, the light's blink, sweeps that never nest and a modal
-// window opened in the middle of a sweep.
+// The main window, the guard and the connection sweep behind them, against fakes, for what the real
+// window, table and program (tests/win32/, tests/linux/, tests/e2e/) cannot stage: malformed
+// settings, the missing-definitions flow before the tray icon, the unload order, the light's blink,
+// sweeps that never nest, a modal window opened in the middle of a sweep, rows already being
+// deleted, a listed key 0, a quit mid-sweep, and fetches that fail, overstate their count or never fit.
 #include "ui/main/frm_main.h"
 
 #include <gtest/gtest.h>
 
 #include <functional>
 #include <string>
+#include <tuple>
 #include <vector>
 
 #include "fakes/fake_file_system.h"
@@ -22,6 +24,7 @@ namespace {
 using namespace vantorel::testing;
 using platform::kHkeyCurrentUser;
 using platform::kHkeyLocalMachine;
+using platform::kTcpStateEstablished;
 using Icons = std::vector<platform::IconHandle>;
 
 const std::string kFolder = "C:\\Vantorel";
@@ -229,6 +232,39 @@ TEST(StatusDisplay, TheLightBlinksFromBrightHoldsThePadlockWhileOnAndTheTipFollo
     EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel - 1 attempts intercepted");
     rig.form.TimerTick();
     EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel -  1 attempts intercepted");
+}
+
+TEST(SweepConnections, FetchesThatOverstateFailOrNeverFitRowsBeingDeletedAndAQuit) {
+    MainRig rig;
+    rig.Start();
+    ConnectionSweep& sweep = rig.form.guard().Sweep();
+    const SweepResult& last = sweep.LastSweep();
+    const platform::TcpRow listed = Row(kTcpStateEstablished, Ipv4(10, 0, 0, 200));  // a negative key
+    rig.table.rows = {listed};
+    rig.table.overstateCount = 1'000'000;  // only the buffer's rows are read
+    sweep.SweepConnections();
+    EXPECT_EQ(std::make_pair(last.rows, rig.table.entries.size()), std::make_pair(1001u, std::size_t{1}));
+
+    rig.table.failWith = 87;
+    sweep.SweepConnections();
+    EXPECT_FALSE(last.fetched);
+
+    // A table that doubles before every fetch: given up after four.
+    rig.table.failWith = platform::kNoError;
+    rig.table.rows.assign(1000, listed);
+    rig.table.beforeFetch = [&] { rig.table.rows.resize(rig.table.rows.size() * 2, listed); };
+    sweep.SweepConnections();
+    EXPECT_EQ(std::make_tuple(last.fetched, last.fetchCalls, rig.table.entries.size()),
+              std::make_tuple(false, 4, std::size_t{1}));
+
+    rig.table.beforeFetch = nullptr;
+    rig.table.overstateCount = 0;
+    rig.table.rows = {Row(platform::kTcpStateDeleteTcb, listed.remoteAddr), listed};  // the first already going
+    sweep.SweepConnections();
+    EXPECT_EQ(rig.table.entries.size(), 2u) << "the listed row torn down, the one already going skipped";
+    rig.pump.onPump = [&] { rig.pump.quitting = true; };  // asked to quit while the first row waits
+    sweep.SweepConnections();
+    EXPECT_EQ(rig.table.entries.size(), 2u);
 }
 
 }  // namespace

@@ -3,7 +3,6 @@
 // switch, timers and the instance test.
 #pragma once
 
-#include <algorithm>
 #include <cstring>
 #include <functional>
 #include <string>
@@ -23,16 +22,6 @@ namespace vantorel::testing {
 // 1.2.3.4 -> the row's address field (network order read little-endian).
 constexpr std::uint32_t Ipv4(std::uint8_t a, std::uint8_t b, std::uint8_t c, std::uint8_t d) {
     return a | b << 8 | c << 16 | static_cast<std::uint32_t>(d) << 24;  // d << 24 would overflow an int
-}
-
-// A sorted definitions list holding the given address fields.
-inline DefinitionList ListOf(std::vector<std::uint32_t> addresses) {
-    std::vector<std::string> keys;
-    for (auto a : addresses) keys.push_back(std::to_string(static_cast<std::int32_t>(a)));
-    std::sort(keys.begin(), keys.end());
-    std::string text;
-    for (const auto& k : keys) text += k + "\r\n";
-    return DefinitionList::FromText(text);
 }
 
 inline platform::TcpRow Row(std::uint32_t state, std::uint32_t remote, std::uint32_t remotePort = 0x5000) {
