@@ -94,45 +94,32 @@ struct MainRig {
         btnOnOff.SetValue(!btnOnOff.Value());  // the button flips itself first
         form.BtnOnOffClick();
     }
-    std::string Switch() const {
-        return btnOnOff.caption + " " + std::to_string(btnOnOff.backColor) + " " + std::to_string(btnOnOff.backOver) +
-               (tmr.enabled ? " sweeping" : " idle");
-    }
     // The window's icon after each of `n` status ticks, as the tray icon shows it.
     Icons Ticks(int n) {
         Icons shown;
         for (int i = 0; i < n; ++i) {
             form.TimerTick();
-            shown.push_back(tray.calls.back().data.icon);
+            shown.push_back(tray.calls.back().icon);
         }
         return shown;
     }
 };
 
-TEST(FrmMain, FirstStartCentresAndAddsTheIconHelpExitAndMinimising) {
+TEST(FrmMain, HelpOpensTheServersPageMinimisingDropsTheSizeCommandAndExitUnloadsOnce) {
     MainRig rig;
+    rig.Put(kHkeyLocalMachine, "Server", "http://127.0.0.1:8080");
     rig.Start();
-    EXPECT_EQ(std::make_pair(rig.frm.left, rig.frm.top), std::make_pair((1024 - 616) / 2, (768 - 320) / 2));
-    EXPECT_EQ(std::make_pair(rig.tmr.interval, rig.timer.interval), std::make_pair(55u, 1000u));
-    const auto& added = rig.tray.calls.at(0).data;
-    EXPECT_EQ(std::make_tuple(added.window, added.id, added.flags, added.callbackMessage, added.icon),
-              std::make_tuple(rig.frm.handle, 1u, 7u, 512u, rig.frm.icon));
     rig.frm.state = platform::WindowState::Minimized;
     rig.form.Resize();
-    EXPECT_EQ(std::make_tuple(rig.tray.calls.back().data.tip, rig.frm.visible, rig.windows.deletedCommand),
-              std::make_tuple("Vantorel", false, platform::kScSize));
+    EXPECT_EQ(std::make_pair(rig.frm.visible, rig.windows.deletedCommand), std::make_pair(false, platform::kScSize));
 
     rig.desktop.events.clear();
     rig.btnO[kBtnHelp].UserClick();
-    rig.Put(kHkeyLocalMachine, "Server", "http://127.0.0.1:8080");
-    rig.btnO[kBtnHelp].UserClick();
     rig.btnO[kBtnExit].UserClick();
     rig.form.QueryUnload();  // the window's destruction, which the end brings, unloads nothing again
-    rig.form.Unload();
-    const std::string owner = " " + std::to_string(rig.frm.handle);
     EXPECT_EQ(rig.desktop.events,
-              (std::vector<std::string>{"open http://www.vantorel.com/vt/help.php 1" + owner,
-                                        "open http://127.0.0.1:8080/vt/help.php 1" + owner, "Tray 2", "End"}));
+              (std::vector<std::string>{"open http://127.0.0.1:8080/vt/help.php 1 " + std::to_string(rig.frm.handle),
+                                        "Tray 2", "End"}));
     EXPECT_FALSE(rig.tmr.enabled || rig.timer.enabled) << "both timers stopped";
 }
 
@@ -162,26 +149,17 @@ TEST(Guard, SweepsNeverNestAndAModalWindowOpenedInTheMiddleOfASweepNeverPausesTh
     EXPECT_FALSE(rig.form.guard().Sweeping());
 }
 
-TEST(StartUp, StoredSettingsAndSettingsThatAreNotNumbers) {
-    struct Case {
-        const char *state, *attempts, *tray, *switchState, *caption;
-        bool visible;
-        const char* stateWritten;
-    } cases[] = {
-        {"7", "-4", "1", "ON 65280 65280 sweeping", "Vantorel - -4 attempts intercepted", false, "1"},
-        {"99999999999", "many", "yes", "OFF 192 192 idle", "Vantorel -  0 attempts intercepted", true, "0"},
-    };
-    for (const Case& c : cases) {
-        MainRig rig;
-        rig.Put(kHkeyCurrentUser, "State", c.state);
-        rig.Put(kHkeyCurrentUser, "Attempts", c.attempts);
-        rig.Put(kHkeyLocalMachine, "Tray", c.tray);
-        rig.Start();
-        EXPECT_EQ(rig.Switch(), c.switchState) << c.state;
-        EXPECT_EQ(rig.frm.caption, c.caption);
-        EXPECT_EQ(rig.frm.visible, c.visible) << c.tray;
-        EXPECT_EQ(StoredSetting(rig.registry, kHkeyCurrentUser, "State"), c.stateWritten) << c.state;
-    }
+TEST(StartUp, StoredSettingsThatAreNotNumbersReadAsZeroAndTheStoredCountIsShown) {
+    MainRig rig;
+    rig.Put(kHkeyCurrentUser, "State", "99999999999");
+    rig.Put(kHkeyCurrentUser, "Attempts", "-4");
+    rig.Put(kHkeyLocalMachine, "Tray", "yes");
+    rig.Start();
+    EXPECT_EQ(std::make_tuple(rig.btnOnOff.caption, rig.btnOnOff.backColor, rig.btnOnOff.backOver, rig.tmr.enabled,
+                              rig.frm.visible),
+              std::make_tuple("OFF", 192u, 192u, false, true));
+    EXPECT_EQ(rig.frm.caption, "Vantorel - -4 attempts intercepted");
+    EXPECT_EQ(StoredSetting(rig.registry, kHkeyCurrentUser, "State"), "0");
 }
 
 TEST(StartUp, MissingDefinitionsAreReportedAndTheUpdatesWindowOpensBeforeTheTrayIcon) {
@@ -221,17 +199,16 @@ TEST(StatusDisplay, TheLightBlinksFromBrightHoldsThePadlockWhileOnAndTheTipFollo
     rig.Start();
     EXPECT_EQ(rig.Ticks(3), (Icons{kBright, kDark, kBright}));
     rig.ClickSwitch();
+    EXPECT_EQ(std::make_tuple(rig.btnOnOff.caption, rig.btnOnOff.backColor, rig.btnOnOff.backOver),
+              std::make_tuple("ON", 0xFF00u, 0xFF00u));
     EXPECT_EQ(rig.Ticks(2), (Icons{kPadlock, kPadlock}));
-    rig.ClickSwitch();  // off again: the stored bright phase is followed by dark
-    EXPECT_EQ(rig.Ticks(2), (Icons{kDark, kBright}));
 
     // A teardown writes the count without the blank; the next tick puts it back.
-    rig.ClickSwitch();
-    rig.table.rows = {Row(platform::kTcpStateEstablished, Ipv4(1, 2, 3, 4))};
+    rig.table.rows = {Row(kTcpStateEstablished, Ipv4(1, 2, 3, 4))};
     rig.form.TmrTick();
-    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel - 1 attempts intercepted");
+    EXPECT_EQ(rig.tray.calls.back().tip, "Vantorel - 1 attempts intercepted");
     rig.form.TimerTick();
-    EXPECT_EQ(rig.tray.calls.back().data.tip, "Vantorel -  1 attempts intercepted");
+    EXPECT_EQ(rig.tray.calls.back().tip, "Vantorel -  1 attempts intercepted");
 }
 
 TEST(SweepConnections, FetchesThatOverstateFailOrNeverFitRowsBeingDeletedAndAQuit) {

@@ -6,7 +6,6 @@
 #include <cstring>
 #include <functional>
 #include <string>
-#include <tuple>
 #include <vector>
 
 #include "fakes/fake_message_pump.h"
@@ -71,16 +70,12 @@ public:
 
 class FakeNotifyArea final : public platform::NotifyArea {
 public:
-    struct Call {
-        std::uint32_t message;
-        platform::NotifyIconData data;
-    };
     bool ShellNotifyIcon(std::uint32_t message, const platform::NotifyIconData& data) override {
-        calls.push_back({message, data});
+        calls.push_back(data);
         if (events != nullptr) events->push_back("Tray " + std::to_string(message));
         return true;
     }
-    std::vector<Call> calls;
+    std::vector<platform::NotifyIconData> calls;
     std::vector<std::string>* events = nullptr;  // when set, each call is noted there too
 };
 
@@ -95,16 +90,15 @@ public:
     void SetVisible(bool v) override { visible = v; }
     platform::WindowState State() const override { return state; }
     void SetState(platform::WindowState s) override { state = s; }
-    std::int32_t Width() const override { return width; }
-    std::int32_t Height() const override { return height; }
-    void Move(std::int32_t l, std::int32_t t) override { std::tie(left, top) = std::tie(l, t); }
+    std::int32_t Width() const override { return 616; }
+    std::int32_t Height() const override { return 320; }
+    void Move(std::int32_t, std::int32_t) override {}
 
     platform::WindowHandle handle = 0x1234;
     platform::IconHandle icon = 0x777;
     std::string caption = "FrmMain";
     bool visible = false;
     platform::WindowState state = platform::WindowState::Normal;
-    std::int32_t width = 616, height = 320, left = 0, top = 0;
 };
 
 class FakeSwitch final : public platform::Switch {
