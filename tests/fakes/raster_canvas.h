@@ -4,7 +4,9 @@
 // only tests and the native benchmark draw on it: the product draws through GDI.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
+#include <cstdlib>
 #include <string>
 #include <vector>
 
@@ -12,9 +14,11 @@
 
 namespace vantorel::testing {
 
+using platform::Box;
+using platform::Rgb;
+
 // Stores `c` at (col, row) of a bottom-up 24-bit DIB with the given stride.
-inline void PutDibPixel(std::vector<std::uint8_t>& dib, std::int32_t stride, std::int32_t row, std::int32_t col,
-                        platform::Rgb c) {
+inline void PutDibPixel(std::vector<std::uint8_t>& dib, int stride, int row, int col, Rgb c) {
     std::uint8_t* p = dib.data() + static_cast<std::size_t>(row) * stride + col * 3;
     p[0] = static_cast<std::uint8_t>(c >> 16);
     p[1] = static_cast<std::uint8_t>(c >> 8);
@@ -24,52 +28,95 @@ inline void PutDibPixel(std::vector<std::uint8_t>& dib, std::int32_t stride, std
 class RasterCanvas final : public platform::Canvas {
 public:
     struct TextCall {
-        platform::Box box;
-        platform::Rgb colour;
+        Box box;
+        Rgb colour;
         platform::FontDesc font;
     };
-    struct OvalCall {
-        platform::Rgb pen, brush;
-    };
 
-    void Resize(std::int32_t w, std::int32_t h) override;
-    void Clear() override;
-    void FillBox(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h, platform::Rgb c) override;
-    void FrameBox(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h, platform::Rgb c) override;
-    void DrawLine(std::int32_t x1, std::int32_t y1, std::int32_t x2, std::int32_t y2, platform::Rgb c) override;
-    void PutPixel(std::int32_t x, std::int32_t y, platform::Rgb c) override { Set(x, y, c); }
-    void DrawOval(std::int32_t, std::int32_t, std::int32_t, std::int32_t, platform::Rgb pen,
-                  platform::Rgb brush) override {
-        ovals.push_back({pen, brush});
+    void Resize(int w, int h) override {
+        w_ = std::max(w, 0);
+        h_ = std::max(h, 0);
+        pixels_.assign(static_cast<std::size_t>(w_) * h_, 0);
     }
-    void DrawText(const std::string&, const platform::Box& box, platform::Rgb colour,
-                  const platform::FontDesc& font) override {
+    // Also empties the records.
+    void Clear() override {
+        std::fill(pixels_.begin(), pixels_.end(), 0);
+        texts.clear();
+        ovals.clear();
+        focusRects.clear();
+    }
+    void FillBox(int x, int y, int w, int h, Rgb c) override {
+        for (int j = y; j < y + h; ++j)
+            for (int i = x; i < x + w; ++i) Set(i, j, c);
+    }
+    void FrameBox(int x, int y, int w, int h, Rgb c) override {
+        if (w <= 0 || h <= 0) return;
+        FillBox(x, y, w, 1, c);
+        FillBox(x, y + h - 1, w, 1, c);
+        FillBox(x, y, 1, h, c);
+        FillBox(x + w - 1, y, 1, h, c);
+    }
+    // Bresenham's line as GDI draws it with a one-pixel cosmetic pen: the major axis steps every
+    // pixel, the minor axis steps when the error passes the half, and at exactly the half only when
+    // the minor axis runs toward negative coordinates; the last point is left out.
+    void DrawLine(int x1, int y1, int x2, int y2, Rgb c) override {
+        // a runs along the major axis (y when steep), b along the minor one.
+        const bool steep = std::abs(y2 - y1) > std::abs(x2 - x1);
+        int a = steep ? y1 : x1, b = steep ? x1 : y1;
+        const int da = std::abs(steep ? y2 - y1 : x2 - x1), db = std::abs(steep ? x2 - x1 : y2 - y1);
+        const int sa = (steep ? y2 >= y1 : x2 >= x1) ? 1 : -1, sb = (steep ? x2 >= x1 : y2 >= y1) ? 1 : -1;
+        for (int n = 0, err = 2 * db - da; n < da; ++n, a += sa) {
+            Set(steep ? b : a, steep ? a : b, c);
+            if (err > 0 || (err == 0 && sb < 0)) {
+                b += sb;
+                err -= 2 * da;
+            }
+            err += 2 * db;
+        }
+    }
+    void PutPixel(int x, int y, Rgb c) override { Set(x, y, c); }
+    void DrawOval(int, int, int, int, Rgb pen, Rgb brush) override { ovals.push_back({pen, brush}); }
+    void DrawText(const std::string&, const Box& box, Rgb colour, const platform::FontDesc& font) override {
         texts.push_back({box, colour, font});
     }
-    // One line of 7 × 13 pixels per visible character ("&" marks the access key, "&&" shows one).
-    platform::Box MeasureText(const std::string& text, const platform::Box& box,
-                              const platform::FontDesc& font) override;
-    void DrawFocusRect(const platform::Box& box, platform::Rgb) override { focusRects.push_back(box); }
-    void ReadPixels(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h,
-                    std::vector<std::uint8_t>& pixels) override;
-    void WritePixels(std::int32_t x, std::int32_t y, std::int32_t w, std::int32_t h,
-                     const std::vector<std::uint8_t>& pixels) override;
-
-    platform::Rgb At(std::int32_t x, std::int32_t y) const { return pixels_[static_cast<std::size_t>(y) * w_ + x]; }
-
-    // The records are emptied by Clear.
-    std::vector<TextCall> texts;
-    std::vector<OvalCall> ovals;
-    std::vector<platform::Box> focusRects;
-
-private:
-    void Set(std::int32_t x, std::int32_t y, platform::Rgb c) {
-        if (x >= 0 && y >= 0 && x < w_ && y < h_) pixels_[static_cast<std::size_t>(y) * w_ + x] = c;
+    // One line of 7 × 13 pixels per character; "&" marks take no room.
+    Box MeasureText(const std::string& text, const Box& box, const platform::FontDesc&) override {
+        const int n = static_cast<int>(std::count_if(text.begin(), text.end(), [](char c) { return c != '&'; }));
+        return {box.left, box.top, box.left + n * 7, box.top + (n > 0 ? 13 : 0)};
+    }
+    void DrawFocusRect(const Box& box, Rgb) override { focusRects.push_back(box); }
+    void ReadPixels(int x, int y, int w, int h, std::vector<std::uint8_t>& pixels) override {
+        pixels.assign(static_cast<std::size_t>(platform::DibStride(w)) * h, 0);
+        for (int row = 0; row < h; ++row)
+            for (int col = 0; col < w; ++col)
+                if (Inside(x + col, y + h - 1 - row))
+                    PutDibPixel(pixels, platform::DibStride(w), row, col, At(x + col, y + h - 1 - row));
+    }
+    void WritePixels(int x, int y, int w, int h, const std::vector<std::uint8_t>& pixels) override {
+        const std::size_t stride = platform::DibStride(w);
+        if (pixels.size() < stride * h) return;
+        for (int row = 0; row < h; ++row)
+            for (int col = 0; col < w; ++col) {
+                const std::uint8_t* p = &pixels[row * stride + col * 3];
+                Set(x + col, y + h - 1 - row, p[2] | (p[1] << 8) | (p[0] << 16));
+            }
     }
 
-    std::int32_t w_ = 0;
-    std::int32_t h_ = 0;
-    std::vector<platform::Rgb> pixels_;
+    Rgb At(int x, int y) const { return pixels_[static_cast<std::size_t>(y) * w_ + x]; }
+
+    std::vector<TextCall> texts;
+    std::vector<std::pair<Rgb, Rgb>> ovals;  // pen, brush
+    std::vector<Box> focusRects;
+
+private:
+    bool Inside(int x, int y) const { return x >= 0 && y >= 0 && x < w_ && y < h_; }
+    void Set(int x, int y, Rgb c) {
+        if (Inside(x, y)) pixels_[static_cast<std::size_t>(y) * w_ + x] = c;
+    }
+
+    int w_ = 0;
+    int h_ = 0;
+    std::vector<Rgb> pixels_;
 };
 
 }  // namespace vantorel::testing

@@ -7,60 +7,30 @@
 
 #include <gtest/gtest.h>
 
-#include <memory>
+#include <map>
 #include <sstream>
 #include <string>
 #include <tuple>
 #include <vector>
 
-#include "controls/xpbutton/kirel_xp_button.h"
+#include "controls/xpbutton/xpbutton_window_win32.h"
 #include "fakes/fake_button_host.h"
-#include "fakes/raster_canvas.h"
 #include "platform/win32/gdi_canvas.h"
 #include "platform/win32/gdi_picture.h"
-#include "controls/xpbutton/xpbutton_window_win32.h"
 #include "platform/win32/shell_win32.h"
 
 namespace vantorel {
 namespace {
 
-using testing::FakeButtonHost;
-using testing::MemoryPicture;
-using testing::RasterCanvas;
-using xpbutton::KirelXPButton;
 using xpbutton::Rgb;
 using Log = std::vector<std::string>;
 
-// Draws the same button on the raster canvas and on GDI in one state (0 up, 1 hovered, 2 pressed,
-// 3 disabled, 4 default) and describes the first differing pixels; for the oval look only the
-// corners outside the ellipse (the ellipse's pixels are the platform's).
-std::string Compare(int type, int scheme, int state, const platform::PicturePtr& picture) {
-    FakeButtonHost hosts[2];
-    RasterCanvas raster;
-    win32::GdiCanvas gdi;
-    KirelXPButton buttons[2] = {{hosts[0], raster}, {hosts[1], gdi}};
-    for (int i = 0; i < 2; ++i) {
-        FakeButtonHost& host = hosts[i];
-        KirelXPButton& k = buttons[i];
-        host.width = 37;
-        host.height = 23;
-        host.name = "";
-        host.isDefault = state == 4;
-        host.pointerOver = state == 1;
-        k.InitNewControl();
-        k.OnResize();
-        k.SetColorScheme(scheme);
-        k.SetBackColor(0x3080C0);
-        k.SetBackOver(0x30C080);
-        k.OnShow();
-        k.SetButtonType(type);
-        if (picture) k.SetPictureNormal(picture);
-        if (picture) k.SetSpecialEffect(1);
-        if (state == 1) k.OnMouseMove(0, 0, 1, 1);
-        if (state == 2) k.OnMouseDown(1, 0, 1, 1);
-        if (state == 3) k.SetEnabled(false);
-        if (state == 0 || state == 4) k.Paint(0, true);
-    }
+// The first pixels that differ when the raster canvas and GDI draw one look after the same steps.
+std::string Compare(int type, int scheme, const std::string& steps) {
+    testing::Look<testing::RasterCanvas> raster(type, 37, 23, scheme);
+    testing::Look<win32::GdiCanvas> gdi(type, 37, 23, scheme);
+    raster.Play("n" + steps);
+    gdi.Play("n" + steps);
     std::ostringstream out;
     for (int y = 0; y < 23; ++y)
         for (int x = 0; x < 37; ++x)
@@ -72,15 +42,10 @@ std::string Compare(int type, int scheme, int state, const platform::PicturePtr&
 }
 
 TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
-    auto picture = std::make_shared<MemoryPicture>(
-        platform::PictureKind::kBitmap, 3, 3,
-        std::vector<Rgb>{0xC0C0C0, 0x000000, 0x0000FF, 0x404040, 0xFFFFFF, 0x00FF00, 0x808081, 0x123456, 0xC0C0C0});
     for (int scheme : {2, 3})
         for (int type = 1; type <= 14; ++type)
-            for (int state = 0; state < 5; ++state)
-                for (const platform::PicturePtr& p : {platform::PicturePtr(), platform::PicturePtr(picture)})
-                    EXPECT_EQ(Compare(type, scheme, state, p), "")
-                        << "type " << type << " scheme " << scheme << " state " << state << (p ? " with picture" : "");
+            for (const char* steps : {"", "h", "p", "d", "D", "P1", "P1h", "P1p", "P1d", "P1D"})
+                EXPECT_EQ(Compare(type, scheme, steps), "") << type << " " << scheme << " \"" << steps << "\"";
 }
 
 // A parent that paints vertical stripes whose red channel is the column number, so copied pixels
@@ -117,23 +82,15 @@ struct Hosted {
                                  nullptr, nullptr, wc.hInstance, nullptr);
         ::UpdateWindow(parent);
         if (!parent || !button.Create(parent, 1, 20, 20, 120, 40, "BtnOnOff")) return;
-        button.events().Click = [this] { log.push_back(button.button().Value() ? "Click on" : "Click"); };
-        auto mouse = [this](const char* name) {
-            return [this, name](std::int16_t& b, std::int16_t&, float&, float&) {
-                log.push_back(name + std::to_string(b));
-            };
-        };
-        button.events().MouseDown = mouse("MouseDown ");
-        button.events().MouseUp = mouse("MouseUp ");
-        auto key = [this](const char* name) {
-            return [this, name](std::int16_t& code, std::int16_t& shift) {
-                log.push_back(name + std::to_string(code) + " " + std::to_string(shift));
-            };
-        };
-        button.events().KeyDown = key("KeyDown ");
-        button.events().KeyUp = key("KeyUp ");
-        button.events().MouseOver = [this] { log.push_back("MouseOver"); };
-        button.events().MOUSEOUT = [this] { log.push_back("MOUSEOUT"); };
+        auto& e = button.events();
+        auto note = [this](const std::string& what, int a) { log.push_back(what + std::to_string(a)); };
+        e.Click = [this] { log.push_back(button.button().Value() ? "Click on" : "Click"); };
+        e.MouseDown = [note](std::int16_t& b, auto&...) { note("MouseDown ", b); };
+        e.MouseUp = [note](std::int16_t& b, auto&...) { note("MouseUp ", b); };
+        e.KeyDown = [note](std::int16_t& k, std::int16_t& shift) { note("KeyDown " + std::to_string(k) + " ", shift); };
+        e.KeyUp = [note](std::int16_t& k, std::int16_t& shift) { note("KeyUp " + std::to_string(k) + " ", shift); };
+        e.MouseOver = [this] { log.push_back("MouseOver"); };
+        e.MOUSEOUT = [this] { log.push_back("MOUSEOUT"); };
         button.Show();
         Pump();
     }
@@ -149,90 +106,108 @@ struct Hosted {
             while (::PeekMessageA(&msg, nullptr, 0, 0, PM_REMOVE)) win32::DispatchQueuedMessage(msg);
         }
     }
-    void Send(UINT message, WPARAM wParam = 0, LPARAM lParam = MAKELPARAM(10, 10)) {
-        ::SendMessageA(button.hwnd(), message, wParam, lParam);
+    // Posts a message per letter, then handles them: L/l left press/release at (10, 10), o a left
+    // release outside, 2 a left double click; R/r/T right press/release/double click; M/m/N the
+    // same for the middle button; S/s space down/up, A the A key down, Q/q Alt+Q down/up; B the
+    // access key's BM_CLICK; C/D Alt+C/Alt+D to the parent.
+    void Post(const std::string& letters) {
+        const LPARAM in = MAKELPARAM(10, 10), alt = 1 << 29;
+        const std::map<char, std::tuple<UINT, WPARAM, LPARAM>> messages = {
+            {'L', {WM_LBUTTONDOWN, MK_LBUTTON, in}},
+            {'l', {WM_LBUTTONUP, 0, in}},
+            {'o', {WM_LBUTTONUP, 0, MAKELPARAM(500, 10)}},
+            {'2', {WM_LBUTTONDBLCLK, MK_LBUTTON, in}},
+            {'R', {WM_RBUTTONDOWN, MK_RBUTTON, in}},
+            {'r', {WM_RBUTTONUP, 0, in}},
+            {'T', {WM_RBUTTONDBLCLK, MK_RBUTTON, in}},
+            {'M', {WM_MBUTTONDOWN, MK_MBUTTON, in}},
+            {'m', {WM_MBUTTONUP, 0, in}},
+            {'N', {WM_MBUTTONDBLCLK, MK_MBUTTON, in}},
+            {'S', {WM_KEYDOWN, VK_SPACE, 0}},
+            {'s', {WM_KEYUP, VK_SPACE, 0}},
+            {'A', {WM_KEYDOWN, 'A', 0}},
+            {'Q', {WM_SYSKEYDOWN, 'Q', alt}},
+            {'q', {WM_SYSKEYUP, 'Q', alt}},
+            {'B', {BM_CLICK, 0, 0}},
+            {'C', {WM_SYSCHAR, 'c', alt}},
+            {'D', {WM_SYSCHAR, 'd', alt}}};
+        log.clear();
+        for (char letter : letters) {
+            const auto [message, wParam, lParam] = messages.at(letter);
+            ::PostMessageA(message == WM_SYSCHAR ? parent : button.hwnd(), message, wParam, lParam);
+        }
+        Pump();
+        ::ReleaseCapture();
     }
 };
 
-// Posted mouse and key messages through the program's own message handling: only a press and a
-// release on the control click, a double click clicks once, a quick second right or middle press
-// is a press, Alt reaches the key events, and the access key follows the control's rule (only the
-// first "&&" is skipped).
+// Only a press and a release on the control click, a double click clicks once, a quick second
+// right or middle press is a press, Alt reaches the key events, and the access key follows the
+// control's rule (only the first "&&" is skipped).
 TEST(XPButtonWindow, PostedInputClicksOnlyAsTheControlSays) {
     Hosted h;
     ASSERT_NE(h.button.hwnd(), nullptr) << "no display";
-    HRGN region = ::CreateRectRgn(0, 0, 0, 0);  // the new control's rounded corners: (0, 0) out, (2, 0) in
-    ASSERT_NE(::GetWindowRgn(h.button.hwnd(), region), ERROR);
-    EXPECT_EQ(std::make_pair(::PtInRegion(region, 0, 0), ::PtInRegion(region, 2, 0)), std::make_pair(FALSE, TRUE));
-    ::DeleteObject(region);
-    using Posted = std::vector<std::tuple<UINT, WPARAM, LPARAM>>;
-    const LPARAM in = MAKELPARAM(10, 10), out = MAKELPARAM(500, 10), alt = 1 << 29;
-    struct Case {
-        const char* caption;
-        bool toParent;
-        Posted posted;
-        Log log;
-    } cases[] = {
-        {"OFF", false, {{WM_LBUTTONDOWN, MK_LBUTTON, in}, {WM_LBUTTONUP, 0, out}}, {"MouseDown 1", "MouseUp 1"}},
-        {"OFF",
-         false,
-         {{WM_LBUTTONDOWN, MK_LBUTTON, in},
-          {WM_LBUTTONUP, 0, in},
-          {WM_LBUTTONDBLCLK, MK_LBUTTON, in},
-          {WM_LBUTTONUP, 0, in}},
-         {"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}},
-        {"OFF", false, {{WM_LBUTTONUP, 0, in}}, {"MouseUp 1"}},  // pressed on the form, released here
-        {"OFF",
-         false,
-         {{WM_RBUTTONDOWN, MK_RBUTTON, in},
-          {WM_RBUTTONUP, 0, in},
-          {WM_RBUTTONDBLCLK, MK_RBUTTON, in},
-          {WM_RBUTTONUP, 0, in}},
-         {"MouseDown 2", "MouseUp 2", "MouseDown 2", "MouseUp 2"}},
-        {"OFF",
-         false,
-         {{WM_MBUTTONDOWN, MK_MBUTTON, in}, {WM_MBUTTONUP, 0, in}, {WM_MBUTTONDBLCLK, MK_MBUTTON, in}},
-         {"MouseDown 4", "MouseUp 4", "MouseDown 4"}},
-        {"OFF",
-         false,
-         {{WM_KEYDOWN, VK_SPACE, 0}, {WM_KEYDOWN, 'A', 0}, {WM_KEYUP, VK_SPACE, 0}},  // no click
-         {"KeyDown 32 0", "KeyDown 65 0", "KeyUp 32 0"}},
-        {"OFF", false, {{WM_SYSKEYDOWN, 'Q', alt}, {WM_SYSKEYUP, 'Q', alt}}, {"KeyDown 81 4", "KeyUp 81 4"}},
-        {"A&&B &C", true, {{WM_SYSCHAR, 'c', alt}}, {"Click"}},
-        {"A&&B &&C &D", true, {{WM_SYSCHAR, 'd', alt}}, {}},
+    const std::tuple<const char*, const char*, Log> cases[] = {
+        {"OFF", "Lo", {"MouseDown 1", "MouseUp 1"}},
+        {"OFF", "Ll2l", {"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}},
+        {"OFF", "l", {"MouseUp 1"}},  // pressed on the form, released here
+        {"OFF", "RrTr", {"MouseDown 2", "MouseUp 2", "MouseDown 2", "MouseUp 2"}},
+        {"OFF", "SAs", {"KeyDown 32 0", "KeyDown 65 0", "KeyUp 32 0"}},  // another key between: no click
+        {"OFF", "Qq", {"KeyDown 81 4", "KeyUp 81 4"}},
+        {"A&&B &C", "C", {"Click"}},
+        {"A&&B &&C &D", "D", {}},
     };
-    for (const Case& c : cases) {
-        h.button.button().SetCaption(c.caption);
-        h.log.clear();
-        for (const auto& [message, wParam, lParam] : c.posted)
-            ::PostMessageA(c.toParent ? h.parent : h.button.hwnd(), message, wParam, lParam);
-        Hosted::Pump();
-        EXPECT_EQ(h.log, c.log) << c.caption << " " << std::get<0>(c.posted[0]);
-        if (std::get<0>(c.posted.back()) == WM_MBUTTONDBLCLK) {
-            EXPECT_EQ(h.button.button().lastState(), 2) << "the second middle press looks pressed";
-        }
-        ::ReleaseCapture();
+    for (const auto& [caption, letters, log] : cases) {
+        h.button.button().SetCaption(caption);
+        h.Post(letters);
+        EXPECT_EQ(h.log, log) << caption << " " << letters;
     }
+    h.Post("MmN");  // the second middle press is a press, drawn pressed
+    EXPECT_EQ(std::make_pair(h.log, h.button.button().lastState()),
+              std::make_pair(Log{"MouseDown 4", "MouseUp 4", "MouseDown 4"}, 2));
 
-    // The two-state switch: space toggles Value before Click; BM_CLICK is the access key path.
+    // The two-state switch: space toggles Value before Click; so does the access key's path.
     h.button.button().SetCheckBoxBehaviour(true);
-    h.log.clear();
-    h.Send(WM_KEYDOWN, VK_SPACE);
-    h.Send(WM_KEYUP, VK_SPACE);
-    h.Send(BM_CLICK);
+    h.Post("SsB");
     EXPECT_EQ(h.log, (Log{"KeyDown 32 0", "KeyUp 32 0", "Click on", "Click"}));
-    h.button.button().SetCaption("&On");  // the caption becomes the window text (for IsDialogMessage)
-    char text[32] = {};
-    ::GetWindowTextA(h.button.hwnd(), text, sizeof text);
-    EXPECT_STREQ(text, "&On");
     // Disabled: the window is disabled and a press and release or the access key click nothing.
     h.button.button().SetEnabled(false);
     EXPECT_FALSE(::IsWindowEnabled(h.button.hwnd()));
-    h.log.clear();
-    h.Send(WM_LBUTTONDOWN, MK_LBUTTON);
-    h.Send(WM_LBUTTONUP);
-    h.Send(BM_CLICK);
+    h.Post("LlB");
     EXPECT_EQ(h.log, (Log{"MouseDown 1", "MouseUp 1"}));
+
+    // Handlers that change their arguments: a left press made a right one is neither drawn pressed
+    // nor clicks, a key made 0 is not the control's.
+    h.button.button().SetEnabled(true);
+    h.button.button().SetCheckBoxBehaviour(false);
+    h.button.events().MouseDown = [](std::int16_t& b, auto&...) { b = 2; };
+    h.button.events().KeyDown = [](std::int16_t& k, auto&...) { k = 0; };
+    h.Post("L");
+    EXPECT_EQ(h.button.button().lastState(), 0);
+    h.Post("LlSs");
+    EXPECT_EQ(h.log, (Log{"MouseUp 1", "KeyUp 32 0"}));
+}
+
+TEST(XPButtonWindow, ShapeAndPointerPicture) {
+    Hosted h;
+    ASSERT_NE(h.button.hwnd(), nullptr);
+    // Per look: a pixel the window's region leaves out and one beside it that stays.
+    const std::tuple<int, POINT, POINT> corners[] = {
+        {1, {119, 39}, {118, 39}}, {14, {0, 39}, {1, 39}}, {3, {1, 0}, {2, 0}},  {4, {0, 38}, {0, 37}},
+        {5, {119, 0}, {0, 0}},     {13, {0, 0}, {60, 20}}, {2, {120, 0}, {0, 0}}};
+    for (const auto& [type, out, in] : corners) {
+        h.button.button().SetButtonType(type);
+        HRGN region = ::CreateRectRgn(0, 0, 0, 0);
+        ASSERT_NE(::GetWindowRgn(h.button.hwnd(), region), ERROR);
+        EXPECT_EQ(std::make_pair(::PtInRegion(region, out.x, out.y), ::PtInRegion(region, in.x, in.y)),
+                  std::make_pair(FALSE, TRUE))
+            << type;
+        ::DeleteObject(region);
+    }
+    // The window takes only pictures it can show as the pointer.
+    h.button.button().SetMouseIcon(
+        std::make_shared<testing::MemoryPicture>(platform::PictureKind::kIcon, 1, 1, std::vector<Rgb>{0}));
+    EXPECT_EQ(h.button.button().MouseIcon(), nullptr);
 }
 
 TEST(XPButtonWindow, HoverFollowsTheRealPointer) {
@@ -241,8 +216,8 @@ TEST(XPButtonWindow, HoverFollowsTheRealPointer) {
     RECT r;
     ::GetWindowRect(h.button.hwnd(), &r);
     ::SetCursorPos(r.left + 30, r.top + 20);
-    h.Send(WM_MOUSEMOVE, 0, MAKELPARAM(30, 20));
-    h.Send(WM_MOUSEMOVE, 0, MAKELPARAM(31, 20));  // already hovering: nothing more
+    ::SendMessageA(h.button.hwnd(), WM_MOUSEMOVE, 0, MAKELPARAM(30, 20));
+    ::SendMessageA(h.button.hwnd(), WM_MOUSEMOVE, 0, MAKELPARAM(31, 20));  // already hovering: nothing more
     EXPECT_TRUE(h.button.button().hovering());
     // Pointer elsewhere: the hover timer (3 ms) notices without any message from the platform.
     ::SetCursorPos(r.right + 200, r.bottom + 100);
@@ -262,7 +237,7 @@ TEST(XPButtonWindow, ArrowKeysMoveTheFocusThroughInjectedTabs) {
     ASSERT_EQ(::GetFocus(), h.button.hwnd());
     // Right arrow: KeyDown first, then Tab is queued and moves the focus to the next control.
     h.log.clear();
-    h.Send(WM_KEYDOWN, VK_RIGHT);
+    ::SendMessageA(h.button.hwnd(), WM_KEYDOWN, VK_RIGHT, 0);
     EXPECT_EQ(h.log, Log{"KeyDown 39 0"});
     EXPECT_EQ(::GetFocus(), h.button.hwnd());  // the injected keys wait in the queue
     Hosted::Pump(50);
@@ -288,17 +263,8 @@ TEST(XPButtonWindow, TransparentLookCopiesTheParentAtTheControlsPixelPosition) {
 }
 
 TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
-    // A 2 × 1 bitmap: red, then green.
-    HDC screen = ::GetDC(nullptr);
-    HBITMAP bitmap = ::CreateCompatibleBitmap(screen, 2, 1);
-    HDC dc = ::CreateCompatibleDC(screen);
-    HGDIOBJ old = ::SelectObject(dc, bitmap);
-    ::SetPixelV(dc, 0, 0, RGB(255, 0, 0));
-    ::SetPixelV(dc, 1, 0, RGB(0, 255, 0));
-    ::SelectObject(dc, old);
-    ::DeleteDC(dc);
-    ::ReleaseDC(nullptr, screen);
-    auto picture = win32::GdiPicture::FromBitmap(bitmap);
+    const std::uint32_t redThenGreen[] = {0xFF0000, 0x00FF00};  // 32-bit pixels, 0x00RRGGBB
+    auto picture = win32::GdiPicture::FromBitmap(::CreateBitmap(2, 1, 1, 32, redThenGreen));
     ASSERT_NE(picture, nullptr);
     EXPECT_EQ(picture->Kind(), platform::PictureKind::kBitmap);
     std::vector<std::uint8_t> px;
@@ -308,12 +274,11 @@ TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
     // A 32 × 32 icon whose mask leaves the left half transparent: those pixels take the fill.
     std::vector<std::uint8_t> andMask(32 * 4, 0), xorMask(32 * 4, 0);
     for (int row = 0; row < 32; ++row) andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
-    HICON icon = ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data());
-    auto iconPicture = win32::GdiPicture::FromIcon(icon);
-    ASSERT_NE(iconPicture, nullptr);
-    EXPECT_EQ(iconPicture->Kind(), platform::PictureKind::kIcon);
-    EXPECT_EQ(iconPicture->HimetricWidth(), 847);  // 32 pixels at 96 dpi
-    ASSERT_TRUE(iconPicture->Render(32, 32, 0x00FF00FF, px));
+    auto icon = win32::GdiPicture::FromIcon(
+        ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data()));
+    ASSERT_NE(icon, nullptr);
+    EXPECT_EQ(std::make_pair(icon->Kind(), icon->HimetricWidth()), std::make_pair(platform::PictureKind::kIcon, 847));
+    ASSERT_TRUE(icon->Render(32, 32, 0x00FF00FF, px));
     const std::size_t stride = platform::DibStride(32);
     EXPECT_EQ((std::vector<int>{px[0], px[1], px[2]}), (std::vector<int>{0xFF, 0x00, 0xFF}));  // transparent
     const std::uint8_t* right = px.data() + 5 * stride + 20 * 3;
