@@ -13,7 +13,6 @@ add_executable(vantorel_tests
     tests/definitions_test.cpp
     tests/frm_options_test.cpp
     tests/registry_routines_test.cpp
-    tests/xpbutton_input_test.cpp
     tests/xpbutton_render_test.cpp
     tests/file_downloader_test.cpp
     tests/http_header_test.cpp

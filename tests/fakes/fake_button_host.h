@@ -135,7 +135,7 @@ struct Look {
     // Plays the steps in order: f focus, h hover, p press, d disable, D paint as the default button,
     // c checked two-state, s SoftBevel, n no caption; P the row above as PictureNormal, I a 2 × 1
     // icon with its left pixel transparent instead, O a blue PictureOver, g greyscale, m no mask
-    // colour, 1 to 3 that special effect, 4 the picture behind the caption.
+    // colour, 1 to 3 that special effect, R/V/X the picture right of, below or behind the caption.
     void Play(const std::string& steps) {
         using platform::PictureKind;
         for (char step : steps) {
@@ -163,7 +163,9 @@ struct Look {
             if (step == 'g') button.SetUseGreyscale(true);
             if (step == 'm') button.SetUseMaskColor(false);
             if (step >= '1' && step <= '3') button.SetSpecialEffect(step - '0');
-            if (step == '4') button.SetPicturePosition(4);
+            if (step == 'R') button.SetPicturePosition(1);
+            if (step == 'V') button.SetPicturePosition(3);
+            if (step == 'X') button.SetPicturePosition(4);
         }
     }
 };

@@ -48,35 +48,18 @@ TEST(XPButtonGdi, GdiAndRasterDrawTheSameSolidParts) {
                 EXPECT_EQ(Compare(type, scheme, steps), "") << type << " " << scheme << " \"" << steps << "\"";
 }
 
-// A parent that paints vertical stripes whose red channel is the column number, so copied pixels
-// tell where they were copied from.
-LRESULT CALLBACK StripesProc(HWND hwnd, UINT message, WPARAM wParam, LPARAM lParam) {
-    if (message == WM_ERASEBKGND) return 1;
-    if (message != WM_PAINT) return ::DefWindowProcA(hwnd, message, wParam, lParam);
-    PAINTSTRUCT ps;
-    HDC dc = ::BeginPaint(hwnd, &ps);
-    for (int x = 0; x < 256; ++x) {
-        HBRUSH brush = ::CreateSolidBrush(RGB(x, 0x40, 0x80));
-        RECT column{x, 0, x + 1, 200};
-        ::FillRect(dc, &column, brush);
-        ::DeleteObject(brush);
-    }
-    ::EndPaint(hwnd, &ps);
-    return 0;
-}
-
-// A top-level window holding one button, on the private display; plain or painted by `proc`.
+// A top-level window holding one button, on the private display; its background plain or `brush`.
 struct Hosted {
     HWND parent = nullptr;
     win32::XPButtonWindow button;
     Log log;
 
-    explicit Hosted(WNDPROC proc = ::DefWindowProcA) {
+    explicit Hosted(HBRUSH brush = nullptr) {
         WNDCLASSA wc{};
-        wc.lpfnWndProc = proc;
+        wc.lpfnWndProc = ::DefWindowProcA;
         wc.hInstance = ::GetModuleHandleA(nullptr);
-        wc.lpszClassName = proc == ::DefWindowProcA ? "XPButtonTestParent" : "XPButtonStripes";
-        wc.hbrBackground = reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
+        wc.lpszClassName = brush ? "XPButtonTestStripes" : "XPButtonTestParent";
+        wc.hbrBackground = brush ? brush : reinterpret_cast<HBRUSH>(COLOR_BTNFACE + 1);
         ::RegisterClassA(&wc);
         parent = ::CreateWindowA(wc.lpszClassName, "XPButton test", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 10, 10, 300, 200,
                                  nullptr, nullptr, wc.hInstance, nullptr);
@@ -251,7 +234,9 @@ TEST(XPButtonWindow, ArrowKeysMoveTheFocusThroughInjectedTabs) {
 }
 
 TEST(XPButtonWindow, TransparentLookCopiesTheParentAtTheControlsPixelPosition) {
-    Hosted h(StripesProc);
+    std::uint32_t stripes[256];  // a parent in vertical stripes whose red is the column number
+    for (std::uint32_t x = 0; x < 256; ++x) stripes[x] = x << 16 | 0x4080;
+    Hosted h(::CreatePatternBrush(::CreateBitmap(256, 1, 1, 32, stripes)));
     ASSERT_NE(h.button.hwnd(), nullptr);
     h.button.button().SetButtonType(11);
     Hosted::Pump();
