@@ -130,6 +130,7 @@ struct Hosted {
 TEST(XPButtonWindow, PostedInputClicksOnlyAsTheControlSays) {
     Hosted h;
     ASSERT_NE(h.button.hwnd(), nullptr) << "no display";
+    EXPECT_EQ(h.button.button().Caption(), "BtnOnOff") << "a new control is captioned with its name";
     const std::tuple<const char*, const char*, Log> cases[] = {
         {"OFF", "Lo", {"MouseDown 1", "MouseUp 1"}},
         {"OFF", "Ll2l", {"MouseDown 1", "MouseUp 1", "Click", "MouseDown 1", "MouseUp 1"}},
@@ -256,18 +257,13 @@ TEST(XPButtonGdiPicture, BitmapsAndIconsRenderOnTheMaskColour) {
     ASSERT_TRUE(picture->Render(2, 1, 0xC0C0C0, px));
     EXPECT_EQ(px, (std::vector<std::uint8_t>{0, 0, 255, 0, 255, 0, 0, 0}));
 
-    // A 32 × 32 icon whose mask leaves the left half transparent: those pixels take the fill.
-    std::vector<std::uint8_t> andMask(32 * 4, 0), xorMask(32 * 4, 0);
-    for (int row = 0; row < 32; ++row) andMask[row * 4] = andMask[row * 4 + 1] = 0xFF;
-    auto icon = win32::GdiPicture::FromIcon(
-        ::CreateIcon(::GetModuleHandleA(nullptr), 32, 32, 1, 1, andMask.data(), xorMask.data()));
+    // An 8 × 1 icon, black where its mask does not leave it transparent (the left half): there the fill.
+    const BYTE andMask[] = {0xF0, 0}, xorMask[] = {0, 0};
+    auto icon = win32::GdiPicture::FromIcon(::CreateIcon(::GetModuleHandleA(nullptr), 8, 1, 1, 1, andMask, xorMask));
     ASSERT_NE(icon, nullptr);
-    EXPECT_EQ(std::make_pair(icon->Kind(), icon->HimetricWidth()), std::make_pair(platform::PictureKind::kIcon, 847));
-    ASSERT_TRUE(icon->Render(32, 32, 0x00FF00FF, px));
-    const std::size_t stride = platform::DibStride(32);
-    EXPECT_EQ((std::vector<int>{px[0], px[1], px[2]}), (std::vector<int>{0xFF, 0x00, 0xFF}));  // transparent
-    const std::uint8_t* right = px.data() + 5 * stride + 20 * 3;
-    EXPECT_EQ((std::vector<int>{right[0], right[1], right[2]}), (std::vector<int>{0, 0, 0}));  // black
+    EXPECT_EQ(std::make_pair(icon->Kind(), icon->HimetricWidth()), std::make_pair(platform::PictureKind::kIcon, 212));
+    ASSERT_TRUE(icon->Render(8, 1, 0x00FF00FF, px));
+    EXPECT_EQ(std::vector<int>(px.begin() + 9, px.begin() + 15), (std::vector<int>{0xFF, 0, 0xFF, 0, 0, 0}));
 }
 
 }  // namespace
