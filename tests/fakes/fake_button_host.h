@@ -1,5 +1,5 @@
 // A scripted window and container for the push button: it records what the control asks of it
-// (notifications, shapes, the hover timer) and answers from settable fields; a picture held in
+// (notifications, the window's state) and answers from settable fields; a picture held in
 // memory; and a control on the fake host, played through states by letters.
 #pragma once
 
@@ -25,19 +25,19 @@ public:
         mouseIcon = picture;
         return true;
     }
-    void SetShape(const platform::WindowShape& value) override { shape = value; }
-    void ReleaseShape() override { shape = {}; }
+    void SetShape(const platform::WindowShape&) override {}
+    void ReleaseShape() override {}
     bool PointerOverSelf() const override { return pointerOver; }
-    void StartOverTimer(int) override { timerRunning = true; }
-    void StopOverTimer() override { timerRunning = false; }
+    void StartOverTimer(int) override {}
+    void StopOverTimer() override {}
     void SendKeys(const std::string&) override {}
     void CaptureMouse() override {}
     void Present() override {}
     void SetAccessKey(char) override {}
     int ScreenDpi() const override { return dpi; }
-    bool DesignMode() const override { return designMode; }
+    bool DesignMode() const override { return false; }
     bool IsDefault() const override { return isDefault; }
-    std::string ContainerName() const override { return name; }
+    std::string ContainerName() const override { return "KirelXPButton1"; }
     void PropertyChanged(const std::string& key) override { notified.push_back(key); }
     Rgb ParentBackColour() const override { return parentBack; }
     Rgb ParentTextColour() const override { return parentText; }
@@ -58,13 +58,9 @@ public:
     platform::FontDesc windowFont;
     int pointer = 0;
     platform::PicturePtr mouseIcon;
-    platform::WindowShape shape;
     bool pointerOver = false;
-    bool timerRunning = false;
     int dpi = 96;
-    bool designMode = false;
     bool isDefault = false;
-    std::string name = "KirelXPButton1";
     std::vector<std::string> notified;
     Rgb parentBack = 0x00FFEEDD;
     Rgb parentText = 0x00112233;
@@ -133,7 +129,7 @@ struct Look {
     const xpbutton::Palette& p() const { return button.palette(); }
     Rgb At(int x, int y) const { return canvas.At(x, y); }
     // Plays the steps in order: f focus, h hover, p press, d disable, D paint as the default button,
-    // c checked two-state, s SoftBevel, n no caption; P the row above as PictureNormal, I a 2 × 1
+    // c two states, v Value on, s SoftBevel, n no caption; P the row above as PictureNormal, I a 2 × 1
     // icon with its left pixel transparent instead, O a blue PictureOver, g greyscale, m no mask
     // colour, 1 to 3 that special effect, R/V/X the picture right of, below or behind the caption.
     void Play(const std::string& steps) {
@@ -147,10 +143,8 @@ struct Look {
                 host.isDefault = true;
                 button.Paint(0, true);
             }
-            if (step == 'c') {
-                button.SetCheckBoxBehaviour(true);
-                button.SetValue(true);
-            }
+            if (step == 'c') button.SetCheckBoxBehaviour(true);
+            if (step == 'v') button.SetValue(true);
             if (step == 's') button.SetSoftBevel(true);
             if (step == 'n') button.SetCaption("");
             if (step == 'P') button.SetPictureNormal(std::make_shared<MemoryPicture>(PictureKind::kBitmap, 4, 1, kRow));

@@ -38,9 +38,8 @@ public:
         h_ = std::max(h, 0);
         pixels_.assign(static_cast<std::size_t>(w_) * h_, 0);
     }
-    // Also empties the records.
+    // Empties the records (every paint fills the whole surface first).
     void Clear() override {
-        std::fill(pixels_.begin(), pixels_.end(), 0);
         texts.clear();
         ovals.clear();
         focusRects.clear();
@@ -89,8 +88,7 @@ public:
         pixels.assign(static_cast<std::size_t>(platform::DibStride(w)) * h, 0);
         for (int row = 0; row < h; ++row)
             for (int col = 0; col < w; ++col)
-                if (Inside(x + col, y + h - 1 - row))
-                    PutDibPixel(pixels, platform::DibStride(w), row, col, At(x + col, y + h - 1 - row));
+                PutDibPixel(pixels, platform::DibStride(w), row, col, At(x + col, y + h - 1 - row));
     }
     void WritePixels(int x, int y, int w, int h, const std::vector<std::uint8_t>& pixels) override {
         const std::size_t stride = platform::DibStride(w);
@@ -102,7 +100,8 @@ public:
             }
     }
 
-    Rgb At(int x, int y) const { return pixels_[static_cast<std::size_t>(y) * w_ + x]; }
+    // 0 outside the surface.
+    Rgb At(int x, int y) const { return Inside(x, y) ? pixels_[static_cast<std::size_t>(y) * w_ + x] : 0; }
 
     std::vector<TextCall> texts;
     std::vector<std::pair<Rgb, Rgb>> ovals;  // pen, brush

@@ -78,7 +78,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     host.width = in.ConsumeIntegralInRange(0, 256);
     host.height = in.ConsumeIntegralInRange(0, 256);
     host.dpi = in.ConsumeIntegralInRange(48, 480);
-    host.designMode = in.ConsumeBool();
+    in.ConsumeBool();  // once the design mode, which the run-time host never is
     host.isDefault = in.ConsumeBool();
     host.pointerOver = in.ConsumeBool();
     PropertyBag stored;
