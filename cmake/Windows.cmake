@@ -74,10 +74,7 @@ endfunction()
 vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
 vantorel_wine_test(options_window_tests tests/win32/options_window_test.cpp)
 
-vantorel_wine_test(registry_win32_tests
-    tests/contract/registry_contract.cpp
-    tests/win32/registry_win32_test.cpp
-)
+vantorel_wine_test(registry_win32_tests tests/win32/registry_win32_test.cpp)
 
 # The push button: the GDI canvas and window class.
 target_sources(vantorel_win32 PRIVATE
