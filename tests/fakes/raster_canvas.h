@@ -27,12 +27,6 @@ inline void PutDibPixel(std::vector<std::uint8_t>& dib, int stride, int row, int
 
 class RasterCanvas final : public platform::Canvas {
 public:
-    struct TextCall {
-        Box box;
-        Rgb colour;
-        platform::FontDesc font;
-    };
-
     void Resize(int w, int h) override {
         w_ = std::max(w, 0);
         h_ = std::max(h, 0);
@@ -75,8 +69,8 @@ public:
     }
     void PutPixel(int x, int y, Rgb c) override { Set(x, y, c); }
     void DrawOval(int, int, int, int, Rgb pen, Rgb brush) override { ovals.push_back({pen, brush}); }
-    void DrawText(const std::string&, const Box& box, Rgb colour, const platform::FontDesc& font) override {
-        texts.push_back({box, colour, font});
+    void DrawText(const std::string&, const Box&, Rgb colour, const platform::FontDesc&) override {
+        texts.push_back(colour);
     }
     // One line of 7 × 13 pixels per character; "&" marks take no room.
     Box MeasureText(const std::string& text, const Box& box, const platform::FontDesc&) override {
@@ -103,7 +97,7 @@ public:
     // 0 outside the surface.
     Rgb At(int x, int y) const { return Inside(x, y) ? pixels_[static_cast<std::size_t>(y) * w_ + x] : 0; }
 
-    std::vector<TextCall> texts;
+    std::vector<Rgb> texts;                  // the colour of each caption drawn
     std::vector<std::pair<Rgb, Rgb>> ovals;  // pen, brush
     std::vector<Box> focusRects;
 
