@@ -72,7 +72,6 @@ function(vantorel_wine_test name)
 endfunction()
 
 vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
-vantorel_wine_test(options_window_tests tests/win32/options_window_test.cpp)
 
 vantorel_wine_test(registry_win32_tests tests/win32/registry_win32_test.cpp)
 
@@ -140,7 +139,7 @@ set_tests_properties(nginx_start PROPERTIES FIXTURES_SETUP nginx)
 add_test(NAME nginx_stop COMMAND ${CMAKE_SOURCE_DIR}/tests/servers/server_fixture.sh stop ${VANTOREL_NGINX_DIR})
 set_tests_properties(nginx_stop PROPERTIES FIXTURES_CLEANUP nginx)
 
-# The real options window's updates panel against nginx.
+# The real options window, and its updates panel against nginx.
 vantorel_wine_test(options_updates_win32_tests tests/win32/options_updates_win32_test.cpp)
 set_tests_properties(options_updates_win32_tests PROPERTIES FIXTURES_REQUIRED "wine;nginx"
     ENVIRONMENT "VANTOREL_NGINX_DIR=${VANTOREL_NGINX_DIR};http_proxy=;https_proxy=;no_proxy=127.0.0.1"

@@ -1,6 +1,6 @@
 // The options window's logic where the real window cannot go: stored texts that are not exactly "1"
 // or "yes", and a Task Scheduler that refuses the logon task. The real window on the real registry
-// and Wine's scheduler, with real clicks, is tests/win32/options_window_test.cpp.
+// and Wine's scheduler, with real clicks, is tests/win32/options_updates_win32_test.cpp.
 #include "ui/options/frm_options.h"
 
 #include <gtest/gtest.h>
