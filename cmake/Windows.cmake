@@ -71,8 +71,6 @@ function(vantorel_wine_test name)
     set_tests_properties(${name} PROPERTIES FIXTURES_REQUIRED wine TIMEOUT 300)
 endfunction()
 
-vantorel_wine_test(files_win32_tests tests/win32/files_win32_test.cpp)
-
 vantorel_wine_test(registry_win32_tests tests/win32/registry_win32_test.cpp)
 
 # The push button: the GDI canvas and window class.

@@ -2,17 +2,15 @@
 """A scriptable HTTP server for the download tests, on 127.0.0.1 only; the path says what to answer.
 
 Bodies are a fixed pattern (byte i is (7 i + i // 251) mod 256). Paths: /body/N, /range/N (206 only for
-"Range: bytes=0-"), /status/CODE, /auth/N (Basic vt / secret), /cut/N/SENT, /nolength/N, /length/TEXT/N,
+"Range: bytes=0-"), /status/CODE (401 asks for Basic credentials), /cut/N/SENT, /nolength/N, /length/TEXT/N,
 /slow/N/MS[/PIECE], /noanswer, /trickle/N/MS, /endless, /twolengths/A/B, /vt/NAME (an update
 server) and /do/KIND,ARG,.../NAME/vt/FILE (the update server answering FILE NAME as /KIND/ARG/... would).
 With --tls CERT KEY it speaks https. The port, chosen by the system, is written to --port-file.
 """
 import argparse
-import base64
 import functools
 import os
 import socket
-import sys
 import time
 from http.server import BaseHTTPRequestHandler, ThreadingHTTPServer
 
@@ -32,9 +30,6 @@ def body(size):
 
 class Handler(BaseHTTPRequestHandler):
     protocol_version = "HTTP/1.1"
-
-    def log_message(self, fmt, *args):
-        sys.stderr.write("%s %s\n" % (self.requestline, fmt % args))
 
     def answer(self, status, data, lengths=None, extra=()):
         """`data` with a Content-Length of each of `lengths` (its own size by default, none for [])."""
@@ -75,12 +70,8 @@ class Handler(BaseHTTPRequestHandler):
                     self.answer(400, b"expected Range: bytes=0-")
             elif kind == "status":
                 code = int(args[0])
-                self.answer(code, b"" if code == 204 else b"status %d" % code, [] if code == 204 else None)
-            elif kind == "auth":
-                if self.headers.get("Authorization") == "Basic " + base64.b64encode(b"vt:secret").decode():
-                    self.answer(200, body(int(args[0])))
-                else:
-                    self.answer(401, b"who are you?", extra=[("WWW-Authenticate", 'Basic realm="vt"')])
+                challenge = [("WWW-Authenticate", 'Basic realm="vt"')] if code == 401 else []
+                self.answer(code, b"" if code == 204 else b"status %d" % code, [] if code == 204 else None, challenge)
             elif kind in ("cut", "length"):  # announces N (or TEXT), sends SENT (or N) bytes and closes
                 self.answer(200, body(int(args[1])), [args[0]])
                 self.close_connection = True
