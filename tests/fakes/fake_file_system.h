@@ -19,7 +19,6 @@ public:
     std::set<std::string> unreadable;
     std::set<std::string> folders{"C:", "C:\\Vantorel"};
     std::uint32_t freeClusters = 1000000;  // of 4096 bytes
-    std::string lastFreeSpaceRoot;
     std::optional<platform::FileError> createFolderFails, createFails, writeFails, closeFails, replaceFails;
     std::size_t writeFailsAt = 0;  // a write fails once the file would grow beyond this size
 
@@ -57,9 +56,7 @@ public:
         return true;
     }
     bool Delete(const std::string& path) override { return files.erase(path) != 0; }
-    bool QueryDiskFreeSpace(const std::string& root, std::uint32_t& bps, std::uint32_t& spc,
-                            std::uint32_t& free) override {
-        lastFreeSpaceRoot = root;
+    bool QueryDiskFreeSpace(const std::string&, std::uint32_t& bps, std::uint32_t& spc, std::uint32_t& free) override {
         bps = 512;
         spc = 8;
         free = freeClusters;
