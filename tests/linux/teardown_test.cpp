@@ -14,6 +14,7 @@
 #include <tuple>
 
 #include "fakes/fake_guard_platform.h"
+#include "fakes/fake_message_pump.h"
 #include "fakes/fake_registry.h"
 #include "guard/sweep.h"
 #include "linux/loopback.h"
