@@ -49,6 +49,7 @@ FakeRegistry::Node* FakeRegistry::Walk(Node* from, const std::string& path, bool
             }
             auto child = std::make_unique<Node>();
             child->name = name;
+            child->parent = node;
             it = node->subkeys.emplace(Lower(name), std::move(child)).first;
         }
         node = it->second.get();
@@ -89,20 +90,14 @@ std::int32_t FakeRegistry::CloseKey(RegKey key) {
 std::int32_t FakeRegistry::DeleteKey(RegKey parent, const std::string& path) {
     Node* from = NodeOf(parent);
     if (from == nullptr) return 6;
-    std::string trimmed = path;
-    while (!trimmed.empty() && trimmed.back() == '\\') trimmed.pop_back();
-    std::size_t cut = trimmed.rfind('\\');
-    std::string parentPath = cut == std::string::npos ? std::string() : trimmed.substr(0, cut);
-    std::string leaf = cut == std::string::npos ? trimmed : trimmed.substr(cut + 1);
     std::int32_t status = kErrorSuccess;
-    Node* owner = Walk(from, parentPath, false, status);
-    if (owner == nullptr) return status;
-    auto it = owner->subkeys.find(Lower(leaf));
-    if (leaf.empty() || it == owner->subkeys.end()) return kErrorFileNotFound;
-    if (!it->second->subkeys.empty()) return kErrorAccessDenied;  // RegDeleteKey leaves keys with subkeys
-    it->second->deleted = true;
+    Node* node = Walk(from, path, false, status);
+    if (node == nullptr || node == from) return kErrorFileNotFound;
+    if (!node->subkeys.empty()) return kErrorAccessDenied;  // RegDeleteKey leaves keys with subkeys
+    auto it = node->parent->subkeys.find(Lower(node->name));
+    node->deleted = true;
     removed_.push_back(std::move(it->second));
-    owner->subkeys.erase(it);
+    node->parent->subkeys.erase(it);
     return kErrorSuccess;
 }
 

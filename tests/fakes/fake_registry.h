@@ -49,6 +49,7 @@ private:
     };
     struct Node {
         std::string name;
+        Node* parent = nullptr;
         std::map<std::string, std::unique_ptr<Node>> subkeys;  // by lower-case name
         std::map<std::string, Value> values;                   // by lower-case name
         bool deleted = false;
