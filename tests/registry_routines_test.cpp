@@ -5,6 +5,7 @@
 #include <gtest/gtest.h>
 
 #include "fakes/fake_registry.h"
+#include "settings/settings.h"
 
 namespace vantorel {
 namespace {
@@ -12,16 +13,9 @@ namespace {
 using platform::kHkeyCurrentUser;
 using testing::FakeRegistry;
 
-RegistryRoutines Vantorel(FakeRegistry& registry) {
-    RegistryRoutines reg(registry);
-    reg.hkey(kHkeyCurrentUser);
-    reg.KeyRoot("SOFTWARE\\Vantorel\\");
-    return reg;
-}
-
 TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
     FakeRegistry registry;
-    const std::string key = "SOFTWARE\\Vantorel";
+    const std::string key = kSettingsKey;
     registry.PutRaw(kHkeyCurrentUser, key, "ShortDword", 4, {0x01, 0x02});
     registry.PutRaw(kHkeyCurrentUser, key, "EmptyDword", 4, {});
     registry.PutRaw(kHkeyCurrentUser, key, "EmptyText", 1, {});
@@ -31,7 +25,7 @@ TEST(RegistryRoutines, OddStoredDataNeverReadsOutOfBounds) {
     registry.PutRaw(kHkeyCurrentUser, key, "EmptyBinary", 3, {});
     registry.PutRaw(kHkeyCurrentUser, key, "None", 0, {1, 2});
 
-    RegistryRoutines reg = Vantorel(registry);
+    RegistryRoutines reg = OpenSettings(registry, kHkeyCurrentUser);
     const Variant fallback = std::string("default");
     EXPECT_EQ(reg.GetRegistryValue("ShortDword", fallback), Variant(std::int32_t{0x0201}));
     EXPECT_EQ(reg.GetRegistryValue("EmptyDword", fallback), Variant(std::int32_t{0}));
